@@ -1,0 +1,21 @@
+// Side-by-side workloads: every workload is registered twice, as
+// "<workload>/zor" and "<workload>/peer", and the report pairs them up.
+#pragma once
+
+#include <benchmark/benchmark.h>
+
+#include <string>
+
+namespace zb {
+
+struct PairRegistrar {
+    PairRegistrar(const std::string& workload, void (*zor)(benchmark::State&),
+                  void (*peer)(benchmark::State&), const std::string& peerName,
+                  double target);
+};
+
+}  // namespace zb
+
+// ZB_PAIR(Id, "workload", zorFn, peerFn, "peer description", target ratio)
+#define ZB_PAIR(id, workload, zorFn, peerFn, peerName, target) \
+    static const ::zb::PairRegistrar zb_pair_##id(workload, zorFn, peerFn, peerName, target)

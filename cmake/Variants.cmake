@@ -1,0 +1,45 @@
+# Code variants: every family source is compiled once per variant, with that
+# variant's instruction-set flags and -DZOR_VARIANT=k, into namespace zor::vK.
+
+if(CMAKE_SYSTEM_PROCESSOR MATCHES "^(i.86|x86)$" OR CMAKE_SIZEOF_VOID_P EQUAL 4)
+  set(ZOR_32BIT ON)
+else()
+  set(ZOR_32BIT OFF)
+endif()
+
+if(ZOR_32BIT)
+  # Everything outside the SIMD variants must run on any i686.  The Windows
+  # stack is only 4-byte aligned on entry: let the compiler realign where
+  # SIMD spills need it.
+  set(ZOR_BASE_FLAGS -march=i686 -mno-sse -mfpmath=387 -mincoming-stack-boundary=2)
+  set(ZOR_VARIANT_FLAGS_0 -march=i686 -mno-sse -mfpmath=387)
+  set(ZOR_VARIANT_FLAGS_1 -march=i686 -msse -mfpmath=387)
+  set(ZOR_VARIANT_FLAGS_2 -march=i686 -msse2 -mfpmath=sse)
+  set(ZOR_VARIANT_FLAGS_3 -march=i686 -msse3 -mfpmath=sse)
+  set(ZOR_VARIANT_FLAGS_4 -march=i686 -mssse3 -mfpmath=sse)
+else()
+  set(ZOR_BASE_FLAGS)
+  # x86-64 always has SSE2; the generic variant stays scalar by convention
+  # (no intrinsics) and by flags (no auto-vectorisation).
+  set(ZOR_VARIANT_FLAGS_0 -mno-sse3 -mno-ssse3 -fno-tree-vectorize -fno-tree-slp-vectorize)
+  set(ZOR_VARIANT_FLAGS_1 -mno-sse3 -mno-ssse3)
+  set(ZOR_VARIANT_FLAGS_2 -mno-sse3 -mno-ssse3)
+  set(ZOR_VARIANT_FLAGS_3 -msse3 -mno-ssse3)
+  set(ZOR_VARIANT_FLAGS_4 -mssse3)
+endif()
+
+add_compile_options(${ZOR_BASE_FLAGS})
+
+
+# zor_add_family(<source>): compile <source> once per variant.
+function(zor_add_family src)
+  string(REGEX REPLACE "[/.-]" "_" base "${src}")
+  foreach(k RANGE 0 4)
+    set(t zf_${base}_v${k})
+    add_library(${t} OBJECT ${src})
+    target_include_directories(${t} PRIVATE ${CMAKE_SOURCE_DIR}/include ${CMAKE_SOURCE_DIR})
+    target_compile_definitions(${t} PRIVATE ZOR_VARIANT=${k})
+    target_compile_options(${t} PRIVATE ${ZOR_VARIANT_FLAGS_${k}})
+    set_property(GLOBAL APPEND PROPERTY ZOR_FAMILY_OBJECTS $<TARGET_OBJECTS:${t}>)
+  endforeach()
+endfunction()

@@ -1,0 +1,228 @@
+// Variant selection, slot filling and the waterfall, with injected tables
+// and processors, and the library's own table as bound at load.
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "frame/attach.h"
+#include "frame/dispatch.h"
+#include "tests/support/variants.h"
+
+using namespace zor::dispatch;
+using zor::cpu::Regs;
+
+namespace {
+
+// ---- an injectable processor ------------------------------------------------
+int gCodes[2];
+int gCalls;
+Regs gLeaf1;
+int fakeType() { return gCodes[gCalls++ % 2]; }
+Regs fakeLeaf1() { return gLeaf1; }
+
+int select(int first, int second, uint32_t edx = 0, uint32_t ecx = 0) {
+    gCodes[0] = first;
+    gCodes[1] = second;
+    gCalls = 0;
+    gLeaf1 = Regs{};
+    gLeaf1.edx = edx;
+    gLeaf1.ecx = ecx;
+    return selectVariant(Selector{fakeType, fakeLeaf1});
+}
+
+constexpr uint32_t kX87 = 1u << 0, kSse = 1u << 25, kSse2 = 1u << 26;
+constexpr uint32_t kSse3 = 1u << 0, kSsse3 = 1u << 9;
+
+// ---- an injectable table: entries are distinguishable dummies ------------------
+template <int Row, int Col>
+void dummy() {}
+
+struct FakeTable {
+    static constexpr int kRowsN = 3;
+    Entry slots[kRowsN] = {};
+    Row rows[kRowsN];
+    FakeTable() {
+        const Entry e[kRowsN][5] = {
+            {dummy<0, 0>, dummy<0, 1>, dummy<0, 2>, dummy<0, 3>, dummy<0, 4>},
+            {dummy<1, 0>, dummy<1, 1>, dummy<1, 2>, dummy<1, 3>, dummy<1, 4>},
+            {dummy<2, 0>, dummy<2, 1>, dummy<2, 2>, dummy<2, 3>, dummy<2, 4>},
+        };
+        for (int i = 0; i < kRowsN; ++i) {
+            rows[i].slot = &slots[i];
+            std::memcpy(rows[i].entry, e[i], sizeof e[i]);
+        }
+    }
+    Table table(int count = kRowsN) const { return Table{rows, count}; }
+    // The column whose entries all slots hold, or -1.
+    int boundColumn() const {
+        for (int k = 0; k < 5; ++k) {
+            bool all = true;
+            for (int i = 0; i < kRowsN; ++i) all = all && slots[i] == rows[i].entry[k];
+            if (all) return k;
+        }
+        return -1;
+    }
+};
+
+std::vector<std::string> gReports;
+void recordReport(const char* text, const char* caption) {
+    gReports.push_back(std::string(caption) + "|" + text);
+}
+
+}  // namespace
+
+TEST(SelectVariant, CodeTable) {
+    const std::vector<std::pair<std::vector<int>, int>> rows = {
+        {{1, 2, 3, 4}, 0}, {{5, 16, 17, 64}, 1}, {{6, 7, 9, 65}, 2}, {{8, 10, 32, 66}, 3}, {{33}, 4}};
+    for (const auto& row : rows)
+        for (int code : row.first) {
+            EXPECT_EQ(variantForCode(code), row.second) << "code " << code;
+            // A listed code decides alone, whatever the processor's flags say.
+            EXPECT_EQ(select(0, code, kX87 | kSse | kSse2, kSse3 | kSsse3), row.second);
+        }
+    for (int code : {0, 11, 12, 15, 18, 31, 34, 63, 67, 68, -1})
+        EXPECT_EQ(variantForCode(code), -1) << "code " << code;
+}
+
+TEST(SelectVariant, OnlyTheSecondAnswerCounts) {
+    EXPECT_EQ(select(33, 1), 0);
+    EXPECT_EQ(gCalls, 2);
+    EXPECT_EQ(select(1, 33), 4);
+}
+
+TEST(SelectVariant, FamilyCodesWinOverFeatures) {
+    // Codes 1..4 select the generic variant even on a processor with SSE2.
+    for (int code : {1, 2, 3, 4}) EXPECT_EQ(select(code, code, kX87 | kSse | kSse2), 0);
+}
+
+TEST(SelectVariant, CpuidFallbackForUnlistedCodes) {
+    for (int code : {0, 11, 34, 67}) {
+        SCOPED_TRACE(code);
+        EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, kSse3 | kSsse3), 4);
+        // The x87 flag, not SSE3, gives variant 3: with or without SSE3.
+        EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, kSse3), 3);
+        EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, 0), 3);
+        EXPECT_EQ(select(code, code, kX87, 0), 3);
+        EXPECT_EQ(select(code, code, kSse | kSse2, kSse3), 2);
+        EXPECT_EQ(select(code, code, kSse, 0), 1);
+        EXPECT_EQ(select(code, code, 0, 0), 0);
+    }
+}
+
+TEST(Waterfall, PreferenceRows) {
+    const int32_t expected[5][6] = {{0, 5}, {1, 0, 5}, {2, 1, 0, 5}, {3, 2, 1, 0, 5}, {4, 3, 2, 1, 0, 5}};
+    for (int v = 0; v < 5; ++v)
+        for (int i = 0; i < 6; ++i) EXPECT_EQ(kPreference[v][i], expected[v][i]) << v << "," << i;
+}
+
+TEST(Waterfall, BindsTheSelectedColumn) {
+    for (int code : {1, 5, 6, 8, 33}) {
+        FakeTable t;
+        char msg[256];
+        int bound = -1;
+        gReports.clear();
+        select(code, code);
+        gCalls = 0;
+        ASSERT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 1);
+        EXPECT_EQ(bound, variantForCode(code));
+        EXPECT_EQ(t.boundColumn(), bound);
+        EXPECT_TRUE(gReports.empty());
+        EXPECT_EQ(msg[0], '\0');
+    }
+}
+
+TEST(Waterfall, MissingEntryFallsBackForEveryExport) {
+    FakeTable t;
+    t.rows[1].entry[4] = nullptr;  // a gap in the middle of column 4
+    char msg[256];
+    int bound = -1;
+    select(33, 33);
+    gCalls = 0;
+    ASSERT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 1);
+    EXPECT_EQ(bound, 3);
+    // Row 0 was written from column 4 before the gap, then overwritten.
+    EXPECT_EQ(t.boundColumn(), 3);
+}
+
+TEST(Waterfall, FillSlotsKeepsWhatItWroteBeforeAGap) {
+    FakeTable t;
+    t.rows[2].entry[2] = nullptr;
+    EXPECT_FALSE(fillSlots(t.table(), 2));
+    EXPECT_EQ(t.slots[0], t.rows[0].entry[2]);
+    EXPECT_EQ(t.slots[1], t.rows[1].entry[2]);
+    EXPECT_EQ(t.slots[2], nullptr);
+    EXPECT_TRUE(fillSlots(t.table(0), 2));  // no rows: nothing to do, success
+}
+
+TEST(Waterfall, GenericColumnIsTheLastResort) {
+    FakeTable t;
+    for (int k = 1; k < 5; ++k) t.rows[0].entry[k] = nullptr;
+    char msg[256];
+    int bound = -1;
+    select(33, 33);
+    gCalls = 0;
+    ASSERT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 1);
+    EXPECT_EQ(bound, 0);
+    EXPECT_EQ(t.boundColumn(), 0);
+}
+
+TEST(Waterfall, NoCandidateShowsTheMessage) {
+    FakeTable t;
+    t.rows[0].entry[0] = nullptr;
+    t.rows[2].entry[1] = nullptr;
+    char msg[256];
+    std::memset(msg, 'x', sizeof msg);
+    gReports.clear();
+    select(5, 5);  // variant 1: tries 1, then 0
+    gCalls = 0;
+    int bound = -1;
+    EXPECT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 0);
+    EXPECT_EQ(bound, -1);
+    ASSERT_EQ(gReports.size(), 1u);
+    EXPECT_EQ(gReports[0],
+              "Set zor library error| No zor matching to CPU was found during the Waterfall");
+    EXPECT_STREQ(msg, " No zor matching to CPU was found during the Waterfall");
+    // The rest of the buffer was cleared before selection.
+    for (size_t i = std::strlen(msg); i < sizeof msg; ++i) ASSERT_EQ(msg[i], '\0');
+}
+
+TEST(Waterfall, EmptyTableTakesTheFailurePath) {
+    FakeTable t;
+    char msg[256];
+    gReports.clear();
+    select(33, 33);
+    gCalls = 0;
+    EXPECT_EQ(initDispatch(t.table(0), Selector{fakeType, fakeLeaf1}, recordReport, msg, nullptr), 0);
+    EXPECT_EQ(gReports.size(), 1u);
+    EXPECT_EQ(t.boundColumn(), -1);  // nothing written
+}
+
+TEST(LibraryTable, EveryRowHasFiveEntries) {
+    const Table t = libraryTable();
+    ASSERT_EQ(t.count, kExportCount);
+    for (int i = 0; i < t.count; ++i) {
+        EXPECT_NE(t.rows[i].slot, nullptr);
+        for (int k = 0; k < 5; ++k) EXPECT_NE(t.rows[i].entry[k], nullptr) << "row " << i << " col " << k;
+    }
+}
+
+TEST(LibraryTable, BoundToTheSelectedVariant) {
+    const int v = selectVariant(liveSelector());
+    EXPECT_EQ(zor::frame::boundVariant, v);
+    const Table t = libraryTable();
+    for (int i = 0; i < t.count; ++i) EXPECT_EQ(*t.rows[i].slot, t.rows[i].entry[v]) << "row " << i;
+    // The export answers with the bound variant's record.
+    static const char* const tags[5] = {"g0", "s1", "s2", "s3", "s4"};
+    EXPECT_STREQ(zorsGetLibVersion()->cpuTag, tags[v]);
+    EXPECT_STREQ(zoriGetLibVersion()->cpuTag, tags[v]);
+    // and the bound variant is one the processor can run.
+    EXPECT_TRUE(zt::variantSupported(v));
+}
+
+TEST(ProductTable, HoldsEveryProduct) {
+    for (int j = 0; j < 256; ++j)
+        for (int i = 0; i < 256; ++i)
+            ASSERT_EQ(zor::frame::productTable[j * 256 + i], i * j) << i << " x " << j;
+}

@@ -1,0 +1,52 @@
+#include "tests/support/variants.h"
+
+#include "frame/cpu.h"
+#include "frame/dispatch.h"
+
+namespace zt {
+
+namespace {
+Api buildApi(int k) {
+    const zor::dispatch::Table t = zor::dispatch::libraryTable();
+    Api a{};
+#define ZOR_FN(map, ret, name, params) \
+    a.name = reinterpret_cast<decltype(a.name)>(t.rows[zor::dispatch::Idx_##name].entry[k]);
+#include "zor_manifest.h"
+#undef ZOR_FN
+    return a;
+}
+}  // namespace
+
+const Api& api(int variant) {
+    static const Api apis[5] = {buildApi(0), buildApi(1), buildApi(2), buildApi(3), buildApi(4)};
+    return apis[variant];
+}
+
+bool variantSupported(int variant) {
+    const zor::cpu::Regs l1 = zor::cpu::cpuid(1, 0);
+    switch (variant) {
+    case 0: return true;
+    case 1: return (l1.edx >> 25) & 1;
+    case 2: return (l1.edx >> 26) & 1;
+    case 3: return l1.ecx & 1;
+    case 4: return (l1.ecx >> 9) & 1;
+    default: return false;
+    }
+}
+
+const std::vector<int>& supportedVariants() {
+    static const std::vector<int> v = [] {
+        std::vector<int> r;
+        for (int k = 0; k < 5; ++k)
+            if (variantSupported(k)) r.push_back(k);
+        return r;
+    }();
+    return v;
+}
+
+std::string variantName(const ::testing::TestParamInfo<int>& info) {
+    static const char* const names[5] = {"g0", "s1", "s2", "s3", "s4"};
+    return names[info.param];
+}
+
+}  // namespace zt

@@ -1,0 +1,45 @@
+// Running a test body on every code variant the processor supports.
+//
+// api(k) is the whole library as variant k's entries, typed exactly like the
+// exports, taken straight from column k of the dispatch table: calling
+// api(k).zoriFoo(...) runs variant k whatever the load-time binding chose.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "zor.h"
+
+namespace zt {
+
+struct Api {
+#define ZOR_FN(map, ret, name, params) ret(ZOR_CALL* name) params;
+#include "zor_manifest.h"
+#undef ZOR_FN
+};
+
+const Api& api(int variant);
+
+// Variants whose instruction set the running processor has, lowest first.
+const std::vector<int>& supportedVariants();
+bool variantSupported(int variant);
+
+std::string variantName(const ::testing::TestParamInfo<int>& info);
+
+// A test fixture parameterised by variant:
+//   class CopyTest : public zt::VariantTest {};
+//   TEST_P(CopyTest, Rows) { z().zoriCopy_8u_C1R(...); }
+//   ZT_ALL_VARIANTS(CopyTest);
+class VariantTest : public ::testing::TestWithParam<int> {
+protected:
+    int variant() const { return GetParam(); }
+    const Api& z() const { return api(GetParam()); }
+};
+
+}  // namespace zt
+
+#define ZT_ALL_VARIANTS(Suite)                                                          \
+    INSTANTIATE_TEST_SUITE_P(Variants, Suite, ::testing::ValuesIn(zt::supportedVariants()), \
+                             zt::variantName)
