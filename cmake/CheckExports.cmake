@@ -13,8 +13,9 @@ if(MODE STREQUAL "elf")
   endforeach()
 else()
   execute_process(COMMAND ${TOOL} -p ${LIB} OUTPUT_VARIABLE out RESULT_VARIABLE rc)
-  # Export table rows look like "\t[   3] +base[   4]  0004 zorsFree"
-  string(REGEX MATCHALL "\\[ *[0-9]+\\] \\+base\\[ *[0-9]+\\] +[0-9a-f]+ [A-Za-z0-9_@]+" rows "${out}")
+  # The name table follows "[Ordinal/Name Pointer] Table", one "\t[   3] name" a row.
+  string(REGEX REPLACE ".*\\[Ordinal/Name Pointer\\] Table\n" "" names "${out}")
+  string(REGEX MATCHALL "\t\\[ *[0-9]+\\] [A-Za-z0-9_@]+" rows "${names}")
   set(found "")
   foreach(r IN LISTS rows)
     string(REGEX REPLACE "^.* " "" n "${r}")

@@ -41,5 +41,16 @@ function(zor_add_family src)
     target_compile_definitions(${t} PRIVATE ZOR_VARIANT=${k})
     target_compile_options(${t} PRIVATE ${ZOR_VARIANT_FLAGS_${k}})
     set_property(GLOBAL APPEND PROPERTY ZOR_FAMILY_OBJECTS $<TARGET_OBJECTS:${t}>)
+    set_property(GLOBAL APPEND PROPERTY ZOR_VARIANT_OBJECTS_${k} "$<JOIN:$<TARGET_OBJECTS:${t}>,\n>")
+  endforeach()
+endfunction()
+
+# Writes generated/variant<k>.objects: the object files of variant k, one a
+# line, for the isolation check.
+function(zor_write_variant_object_lists dir)
+  foreach(k RANGE 0 4)
+    get_property(objs GLOBAL PROPERTY ZOR_VARIANT_OBJECTS_${k})
+    list(JOIN objs "\n" content)
+    file(GENERATE OUTPUT ${dir}/variant${k}.objects CONTENT "${content}\n")
   endforeach()
 endfunction()

@@ -10,13 +10,15 @@
 //         return s;
 #pragma once
 
+#include "frame/abi.h"
+
 #include <cstdint>
 #include <limits>
 #include <type_traits>
 
 #include "zor.h"
 
-namespace zor {
+namespace zor { inline namespace ZOR_INLINE_NS {
 
 // ---- checks --------------------------------------------------------------
 
@@ -108,4 +110,4 @@ inline T saturateRound(double x) {
     return static_cast<T>(static_cast<int64_t>(r));
 }
 
-}  // namespace zor
+}}  // namespace zor::ZOR_INLINE_NS

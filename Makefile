@@ -1,0 +1,49 @@
+# Entry points: `make demo`, `make test`, `make bench`.
+# Three build trees: build/ (native), build-asan/ (native under the
+# AddressSanitizer and UndefinedBehaviorSanitizer), build-win/ (32-bit
+# Windows, run under wine).
+
+JOBS ?= $(shell nproc 2>/dev/null || echo 2)
+CMAKE ?= cmake
+
+.PHONY: all setup native asan win demo test test-native test-asan test-win bench clean
+
+all: native
+
+setup:
+	@bash scripts/setup.sh
+
+build/CMakeCache.txt:
+	$(CMAKE) -S . -B build -DCMAKE_BUILD_TYPE=Release
+build-asan/CMakeCache.txt:
+	$(CMAKE) -S . -B build-asan -DCMAKE_BUILD_TYPE=RelWithDebInfo -DZOR_SANITIZE=ON
+build-win/CMakeCache.txt:
+	$(CMAKE) -S . -B build-win -DCMAKE_BUILD_TYPE=Release \
+	    -DCMAKE_TOOLCHAIN_FILE=cmake/toolchain-mingw32.cmake
+
+native: setup build/CMakeCache.txt
+	$(CMAKE) --build build -j $(JOBS)
+asan: setup build-asan/CMakeCache.txt
+	$(CMAKE) --build build-asan -j $(JOBS)
+win: setup build-win/CMakeCache.txt
+	$(CMAKE) --build build-win -j $(JOBS)
+
+demo: native
+	./build/zor_demo
+
+test-native: native
+	cd build && ctest --output-on-failure
+test-asan: asan
+	cd build-asan && ASAN_OPTIONS=detect_leaks=1 UBSAN_OPTIONS=print_stacktrace=1 \
+	    ctest --output-on-failure
+test-win: win
+	cd build-win && ctest --output-on-failure
+
+test: test-native test-asan test-win
+	@echo "all suites passed: native, sanitizers, wine"
+
+bench: native
+	./build/bench/zor_bench $(BENCH_ARGS)
+
+clean:
+	rm -rf build build-asan build-win
