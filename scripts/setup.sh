@@ -3,7 +3,7 @@
 # Idempotent: when every package is already present it only checks and exits.
 set -euo pipefail
 
-native_pkgs=(cmake make g++ libgtest-dev googletest libbenchmark-dev
+native_pkgs=(cmake make g++ ccache libgtest-dev googletest libbenchmark-dev
              libopencv-dev libfftw3-dev)
 cross_pkgs=(g++-mingw-w64-i686)
 wine_pkgs=(wine wine32:i386)
