@@ -50,8 +50,11 @@ public:
             const Pair& p = pairs()[w];
             if (p.zorNs < 0 || p.peerNs < 0) continue;
             const double ratio = p.zorNs / p.peerNs;
-            std::printf("%-44s %12.0f %12.0f %7.3f %7.2f  %s%s\n", w.c_str(), p.zorNs, p.peerNs,
-                        ratio, p.target, p.peerName.c_str(), ratio <= p.target ? "" : "  (above target)");
+            char target[16] = "-";
+            if (p.target > 0) std::snprintf(target, sizeof target, "%.2f", p.target);
+            const bool missed = p.target > 0 && ratio > p.target;
+            std::printf("%-44s %12.0f %12.0f %7.3f %7s  %s%s\n", w.c_str(), p.zorNs, p.peerNs,
+                        ratio, target, p.peerName.c_str(), missed ? "  (above target)" : "");
         }
     }
 };

@@ -17,5 +17,6 @@ struct PairRegistrar {
 }  // namespace zb
 
 // ZB_PAIR(Id, "workload", zorFn, peerFn, "peer description", target ratio)
+// A target of 0 reports the ratio without a target.
 #define ZB_PAIR(id, workload, zorFn, peerFn, peerName, target) \
     static const ::zb::PairRegistrar zb_pair_##id(workload, zorFn, peerFn, peerName, target)
