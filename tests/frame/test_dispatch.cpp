@@ -226,3 +226,13 @@ TEST(ProductTable, HoldsEveryProduct) {
         for (int i = 0; i < 256; ++i)
             ASSERT_EQ(zor::frame::productTable[j * 256 + i], i * j) << i << " x " << j;
 }
+
+#if !defined(_WIN32)
+// On Linux the load cannot be refused: the message goes to standard error and
+// the process stops.
+TEST(LoadFailureDeathTest, ReportsAndAborts) {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    EXPECT_DEATH(zor::frame::reportLoadFailure(kFailureText, kFailureCaption),
+                 "Set zor library error: No zor matching to CPU was found during the Waterfall");
+}
+#endif
