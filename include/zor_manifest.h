@@ -48,3 +48,133 @@ ZOR_FN(ZOR_GENERIC, void,      zoriFree,          (void* ptr))
 
 ZOR_FN(ZOR_ALL, const LibraryVersion*, zorsGetLibVersion, (void))
 ZOR_FN(ZOR_ALL, const LibraryVersion*, zoriGetLibVersion, (void))
+
+/* ---- image/pixel/copy ---- */
+
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C1R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_32f_C1R,
+       (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_32f_C3R,
+       (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C4R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C4R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3MR,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
+        const uint8_t* pMask, int maskStep))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C3C1R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C4C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C4C1R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C1C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C1C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C1C4R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C1C4R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3AC4R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C3AC4R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_AC4C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_AC4C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3P3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C3P3R,
+       (const int16_t* pSrc, int srcStep, int16_t* const pDst[3], int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C4P4R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[4], int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C4P4R,
+       (const int16_t* pSrc, int srcStep, int16_t* const pDst[4], int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_P3C3R,
+       (const uint8_t* const pSrc[3], int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_P3C3R,
+       (const int16_t* const pSrc[3], int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_P4C4R,
+       (const uint8_t* const pSrc[4], int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriDup_8u_C1C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C1R,  (uint8_t value, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_16s_C1R, (int16_t value, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_32s_C1R, (int32_t value, int32_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_32f_C1R, (float value, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C3R,
+       (const uint8_t value[3], uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_16s_C3R,
+       (const int16_t value[3], int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C3MR,
+       (const uint8_t value[3], uint8_t* pDst, int dstStep, ImageSize roiSize,
+        const uint8_t* pMask, int maskStep))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
+        const int dstOrder[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_16u_C3R,
+       (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize,
+        const int dstOrder[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_AC4R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
+        const int dstOrder[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_16u_AC4R,
+       (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize,
+        const int dstOrder[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_C3IR,
+       (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, const int dstOrder[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopyReplicateBorder_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst, int dstStep,
+        ImageSize dstRoiSize, int topBorderHeight, int leftBorderWidth))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopyReplicateBorder_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst, int dstStep,
+        ImageSize dstRoiSize, int topBorderHeight, int leftBorderWidth))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCopyReplicateBorder_16s_C1R,
+       (const int16_t* pSrc, int srcStep, ImageSize srcRoiSize, int16_t* pDst, int dstStep,
+        ImageSize dstRoiSize, int topBorderHeight, int leftBorderWidth))
+
+/* ---- image/pixel/convert ---- */
+
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u16u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u16u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u16u_C4R,
+       (const uint8_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u32f_C1R,
+       (const uint8_t* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_16s32f_C1R,
+       (const int16_t* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_32f8u_C1R,
+       (const float* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, int roundMode))
+ZOR_FN(ZOR_SSE2UP, Status, zoriLShiftC_16u_C1IR,
+       (uint32_t value, uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriLShiftC_16u_C3IR,
+       (const uint32_t value[3], uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriLShiftC_16u_AC4IR,
+       (const uint32_t value[3], uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize))
+
+/* ---- image/geometry/mirror ---- */
+
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_32s_C3R,
+       (const int32_t* pSrc, int srcStep, int32_t* pDst, int dstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_8u_C1IR,   (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_8u_C3IR,   (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_8u_AC4IR,  (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_16u_C1IR,  (uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_16u_C3IR,  (uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_16u_AC4IR, (uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))

@@ -1,0 +1,786 @@
+// Pixel movers that keep values: plain, masked and channel-layout copies,
+// constant fills, channel reordering and the copy with replicated borders.
+//
+// Every element is moved as an unsigned word of its width (floats too, so
+// that no bit pattern is altered on its way through a register).  Copies,
+// fills and duplicates check pointers and sizes only: their steps are used
+// as given, so a zero step repeats a row and a negative one walks upwards.
+// Swap channels and the replicated-border copy also reject steps below 1.
+//
+// All of it is integer work: the SSE variant shares the generic entries.
+#include "frame/variant.h"
+#include "frame/status.h"
+#include "image/pixel/rows.h"
+
+#include <cstring>
+
+#if ZOR_VARIANT != 1
+
+namespace zor { namespace ZOR_NS {
+namespace {
+
+template <int Bytes> struct WordOf;
+template <> struct WordOf<1> { using type = uint8_t; };
+template <> struct WordOf<2> { using type = uint16_t; };
+template <> struct WordOf<4> { using type = uint32_t; };
+template <class T> using Word = typename WordOf<sizeof(T)>::type;
+
+template <class T> inline const Word<T>* words(const T* p) { return reinterpret_cast<const Word<T>*>(p); }
+template <class T> inline Word<T>* words(T* p) { return reinterpret_cast<Word<T>*>(p); }
+
+template <class F>
+inline void eachRow(int rows, F&& f) {
+    for (int y = 0; y < rows; ++y) f(y);
+}
+
+// ---- generic row kernels ------------------------------------------------------
+
+// Takes N consecutive elements of every source pixel (stride SC) into every
+// destination pixel (stride DC); the destination's other elements stay.
+template <class E, int SC, int DC, int N>
+void pickRow(const E* s, E* d, ptrdiff_t n) {
+    for (ptrdiff_t x = 0; x < n; ++x, s += SC, d += DC)
+        for (int k = 0; k < N; ++k) d[k] = s[k];
+}
+
+template <class E, int C>
+void splitRow(const E* s, E* const* planes, ptrdiff_t n) {
+    for (int k = 0; k < C; ++k) {
+        E* d = planes[k];
+        const E* p = s + k;
+        for (ptrdiff_t x = 0; x < n; ++x, p += C) d[x] = *p;
+    }
+}
+
+template <class E, int C>
+void mergeRow(const E* const* planes, E* d, ptrdiff_t n) {
+    for (int k = 0; k < C; ++k) {
+        const E* s = planes[k];
+        E* p = d + k;
+        for (ptrdiff_t x = 0; x < n; ++x, p += C) *p = s[x];
+    }
+}
+
+template <class E>
+void fillRow(E* d, ptrdiff_t n, E v) {
+    for (ptrdiff_t x = 0; x < n; ++x) d[x] = v;
+}
+
+template <class E>
+void fill3Row(E* d, ptrdiff_t n, const E (&v)[3]) {
+    for (ptrdiff_t x = 0; x < n; ++x, d += 3) {
+        d[0] = v[0];
+        d[1] = v[1];
+        d[2] = v[2];
+    }
+}
+
+template <class E>
+void swapRow(const E* s, E* d, ptrdiff_t n, int C, const int (&o)[3]) {
+    for (ptrdiff_t x = 0; x < n; ++x, s += C, d += C) {
+        // all three read before any is written: the in-place form relies on it
+        const E a = s[o[0]], b = s[o[1]], c = s[o[2]];
+        d[0] = a;
+        d[1] = b;
+        d[2] = c;
+    }
+}
+
+// ---- SIMD row kernels ---------------------------------------------------------
+
+#if ZOR_SIMD >= 2
+// Repeats the 48-byte pattern p (16 pixels of 8-bit or 8 of 16-bit
+// elements) from d while a whole block fits before end; returns where it stopped.
+inline uint8_t* fill48(uint8_t* d, uint8_t* end, const __m128i (&p)[3]) {
+    for (; end - d >= 48; d += 48) {
+        store16(d, p[0]);
+        store16(d + 16, p[1]);
+        store16(d + 32, p[2]);
+    }
+    return d;
+}
+
+template <class E>
+ptrdiff_t fillRowSimd(E* d, ptrdiff_t n, E v) {
+    __m128i p;
+    if constexpr (sizeof(E) == 1) p = _mm_set1_epi8(static_cast<char>(v));
+    else if constexpr (sizeof(E) == 2) p = _mm_set1_epi16(static_cast<short>(v));
+    else p = _mm_set1_epi32(static_cast<int>(v));
+    constexpr ptrdiff_t lanes = 16 / sizeof(E);
+    ptrdiff_t x = 0;
+    for (; x + 2 * lanes <= n; x += 2 * lanes) {
+        store16(d + x, p);
+        store16(d + x + lanes, p);
+    }
+    for (; x + lanes <= n; x += lanes) store16(d + x, p);
+    return x;
+}
+#endif
+
+#if ZOR_SIMD >= 4
+// Interleaved three channels <-> three planes, 48 bytes at a time.
+template <int E>
+struct SplitMap {  // output register k = plane k
+    static constexpr int src(int j) {
+        const int plane = j / 16, elem = (j % 16) / E, byte = j % E;
+        return (elem * 3 + plane) * E + byte;
+    }
+};
+template <int E>
+struct MergeMap {
+    static constexpr int src(int j) {
+        const int elem = j / E, byte = j % E, pixel = elem / 3, plane = elem % 3;
+        return plane * 16 + pixel * E + byte;
+    }
+};
+
+template <class E>
+ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    E* p0 = planes[0];
+    E* p1 = planes[1];
+    E* p2 = planes[2];
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per) {
+        __m128i in[3], out[3];
+        // a little ahead of the hardware prefetcher on the one input stream
+        _mm_prefetch(reinterpret_cast<const char*>(s + 3 * x) + 512, _MM_HINT_T0);
+        load48(s + 3 * x, in);
+        Shuffle48<SplitMap<sizeof(E)>>::apply(in, out);
+        store16(p0 + x, out[0]);
+        store16(p1 + x, out[1]);
+        store16(p2 + x, out[2]);
+    }
+    return x;
+}
+
+template <class E>
+ptrdiff_t merge3Simd(const E* const* planes, E* d, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const E* p0 = planes[0];
+    const E* p1 = planes[1];
+    const E* p2 = planes[2];
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per) {
+        _mm_prefetch(reinterpret_cast<const char*>(p0 + x) + 256, _MM_HINT_T0);
+        _mm_prefetch(reinterpret_cast<const char*>(p1 + x) + 256, _MM_HINT_T0);
+        _mm_prefetch(reinterpret_cast<const char*>(p2 + x) + 256, _MM_HINT_T0);
+        __m128i in[3] = {load16(p0 + x), load16(p1 + x), load16(p2 + x)}, out[3];
+        Shuffle48<MergeMap<sizeof(E)>>::apply(in, out);
+        store48(d + 3 * x, out);
+    }
+    return x;
+}
+
+// Four channels <-> four planes, 64 bytes at a time: one shuffle per
+// register groups each channel's elements into one 32-bit lane, then a 4 x 4
+// transpose of those lanes across the registers (its own inverse).
+inline void transpose4x4(__m128i (&v)[4]) {
+    const __m128i t0 = _mm_unpacklo_epi32(v[0], v[1]), t1 = _mm_unpackhi_epi32(v[0], v[1]);
+    const __m128i t2 = _mm_unpacklo_epi32(v[2], v[3]), t3 = _mm_unpackhi_epi32(v[2], v[3]);
+    v[0] = _mm_unpacklo_epi64(t0, t2);
+    v[1] = _mm_unpackhi_epi64(t0, t2);
+    v[2] = _mm_unpacklo_epi64(t1, t3);
+    v[3] = _mm_unpackhi_epi64(t1, t3);
+}
+// Lane k of the result holds channel k of the register's pixels.
+template <int E>
+inline __m128i groupChannels() {
+    if constexpr (E == 1) return _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
+    else return _mm_setr_epi8(0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15);
+}
+template <int E>
+inline __m128i spreadChannels() {  // the inverse of groupChannels
+    if constexpr (E == 1) return _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
+    else return _mm_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, 2, 3, 6, 7, 10, 11, 14, 15);
+}
+
+template <class E>
+ptrdiff_t split4Simd(const E* s, E* const* planes, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const __m128i g = groupChannels<sizeof(E)>();
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per) {
+        __m128i v[4];
+        for (int k = 0; k < 4; ++k) v[k] = _mm_shuffle_epi8(load16(s + 4 * x + k * per), g);
+        transpose4x4(v);
+        for (int k = 0; k < 4; ++k) store16(planes[k] + x, v[k]);
+    }
+    return x;
+}
+
+template <class E>
+ptrdiff_t merge4Simd(const E* const* planes, E* d, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const __m128i sp = spreadChannels<sizeof(E)>();
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per) {
+        __m128i v[4];
+        for (int k = 0; k < 4; ++k) v[k] = load16(planes[k] + x);
+        transpose4x4(v);
+        for (int k = 0; k < 4; ++k) store16(d + 4 * x + k * per, _mm_shuffle_epi8(v[k], sp));
+    }
+    return x;
+}
+
+// One element of every SC-element pixel (SC = 3 or 4) into a plain row.
+// The loads never reach past the last chosen element: the pointer may
+// address the pixel's last channel, with nothing of the row after it.
+template <class E, int SC>
+struct PickMap {
+    static constexpr int src(int j) { return (j / static_cast<int>(sizeof(E))) * SC * sizeof(E) + j % sizeof(E); }
+};
+template <class E, int SC>
+ptrdiff_t pickOneSimd(const E* s, E* d, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    // masks for register r of the SC-register block: output lane j takes
+    // byte src(j) - 16 r when it falls into register r
+    alignas(16) static constexpr auto masks = [] {
+        struct { uint8_t m[SC][16]; } t{};
+        for (int r = 0; r < SC; ++r)
+            for (int j = 0; j < 16; ++j) {
+                const int b = PickMap<E, SC>::src(j);
+                t.m[r][j] = b / 16 == r ? static_cast<uint8_t>(b % 16) : uint8_t(0x80);
+            }
+        return t;
+    }();
+    ptrdiff_t x = 0;
+    // last chosen element at (n-1)*SC: the block [x*SC, x*SC + per*SC) must end by it
+    for (; (x + per) * SC <= (n - 1) * SC + 1; x += per) {
+        const uint8_t* b = reinterpret_cast<const uint8_t*>(s + x * SC);
+        __m128i acc = _mm_shuffle_epi8(load16(b), _mm_load_si128(reinterpret_cast<const __m128i*>(masks.m[0])));
+        for (int r = 1; r < SC; ++r)
+            acc = _mm_or_si128(acc, _mm_shuffle_epi8(load16(b + 16 * r),
+                                                     _mm_load_si128(reinterpret_cast<const __m128i*>(masks.m[r]))));
+        store16(d + x, acc);
+    }
+    return x;
+}
+
+// Four-element pixels with alpha <-> three-element pixels, 64 <-> 48 bytes:
+// within a register the colour elements are packed into its first 12 bytes
+// (or spread from them), and byte shifts move the 12-byte groups between
+// registers.  E is the element size; the masks only differ by it.
+template <int E>
+inline __m128i packColour() {  // 16 bytes of 4-element pixels -> 12 bytes of colour, 4 zero
+    if constexpr (E == 1) return _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, -1, -1, -1, -1);
+    else return _mm_setr_epi8(0, 1, 2, 3, 4, 5, 8, 9, 10, 11, 12, 13, -1, -1, -1, -1);
+}
+template <int E>
+inline __m128i spreadColour() {  // 12 bytes of colour -> 16 bytes of pixels, alpha zero
+    if constexpr (E == 1) return _mm_setr_epi8(0, 1, 2, -1, 3, 4, 5, -1, 6, 7, 8, -1, 9, 10, 11, -1);
+    else return _mm_setr_epi8(0, 1, 2, 3, 4, 5, -1, -1, 6, 7, 8, 9, 10, 11, -1, -1);
+}
+
+template <class E>
+ptrdiff_t dropAlphaSimd(const E* s, E* d, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);  // pixels per 64 source bytes
+    const __m128i m = packColour<sizeof(E)>();
+    const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
+    uint8_t* db = reinterpret_cast<uint8_t*>(d);
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per, sb += 64, db += 48) {
+        const __m128i a = _mm_shuffle_epi8(load16(sb), m), b = _mm_shuffle_epi8(load16(sb + 16), m);
+        const __m128i c = _mm_shuffle_epi8(load16(sb + 32), m), e = _mm_shuffle_epi8(load16(sb + 48), m);
+        store16(db, _mm_or_si128(a, _mm_slli_si128(b, 12)));
+        store16(db + 16, _mm_or_si128(_mm_srli_si128(b, 4), _mm_slli_si128(c, 8)));
+        store16(db + 32, _mm_or_si128(_mm_srli_si128(c, 8), _mm_slli_si128(e, 4)));
+    }
+    return x;
+}
+
+template <class E>
+ptrdiff_t keepAlphaSimd(const E* s, E* d, ptrdiff_t n) {
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const __m128i m = spreadColour<sizeof(E)>(), alpha = alphaBytes<sizeof(E)>();
+    const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
+    uint8_t* db = reinterpret_cast<uint8_t*>(d);
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per, sb += 48, db += 64) {
+        const __m128i i0 = load16(sb), i1 = load16(sb + 16), i2 = load16(sb + 32);
+        const __m128i g[4] = {i0, _mm_alignr_epi8(i1, i0, 12), _mm_alignr_epi8(i2, i1, 8), _mm_srli_si128(i2, 4)};
+        for (int k = 0; k < 4; ++k)  // the destination's alpha is carried over as it is
+            store16(db + 16 * k, blend16(_mm_shuffle_epi8(g[k], m), load16(db + 16 * k), alpha));
+    }
+    return x;
+}
+
+struct DupMap {  // one plane into all three channels
+    static constexpr int src(int j) { return j / 3; }
+};
+
+// Sixteen three-channel 8-bit pixels under a mask: where the mask byte is
+// non-zero the pixel takes `fresh`, elsewhere it keeps what it holds.
+inline void maskedStore48(uint8_t* d, const uint8_t* m, const __m128i (&fresh)[3]) {
+    const __m128i stays = _mm_cmpeq_epi8(load16(m), _mm_setzero_si128());
+    const __m128i in[3] = {stays, stays, stays};
+    __m128i keep[3];
+    Shuffle48<DupMap>::apply(in, keep);
+    for (int k = 0; k < 3; ++k) store16(d + 16 * k, blend16(fresh[k], load16(d + 16 * k), keep[k]));
+}
+
+// Channel order applied to 48-byte blocks of three-element pixels: output
+// register k draws on input registers k-1..k+1 only (a pixel never moves
+// further than its own bytes).
+struct SwapShuffle {
+    __m128i m[3][3];
+    SwapShuffle(const int (&o)[3], int elemBytes) {
+        alignas(16) uint8_t t[3][3][16];
+        for (int j = 0; j < 48; ++j) {
+            const int elem = j / elemBytes, byte = j % elemBytes;
+            const int s = ((elem / 3) * 3 + o[elem % 3]) * elemBytes + byte;
+            for (int r = 0; r < 3; ++r)
+                t[j / 16][r][j % 16] = s / 16 == r ? static_cast<uint8_t>(s % 16) : uint8_t(0x80);
+        }
+        for (int a = 0; a < 3; ++a)
+            for (int r = 0; r < 3; ++r) m[a][r] = _mm_load_si128(reinterpret_cast<const __m128i*>(t[a][r]));
+    }
+    void apply(const __m128i (&in)[3], __m128i (&out)[3]) const {
+        out[0] = _mm_or_si128(_mm_shuffle_epi8(in[0], m[0][0]), _mm_shuffle_epi8(in[1], m[0][1]));
+        out[1] = _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(in[0], m[1][0]), _mm_shuffle_epi8(in[1], m[1][1])),
+                              _mm_shuffle_epi8(in[2], m[1][2]));
+        out[2] = _mm_or_si128(_mm_shuffle_epi8(in[1], m[2][1]), _mm_shuffle_epi8(in[2], m[2][2]));
+    }
+};
+
+// Returns the bytes done (whole 48-byte blocks).
+ptrdiff_t swap3Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle& sh) {
+    ptrdiff_t i = 0;
+    for (; i + 48 <= bytes; i += 48) {
+        __m128i in[3], out[3];
+        load48(s + i, in);
+        sh.apply(in, out);
+        store48(d + i, out);
+    }
+    return i;
+}
+
+// Four-element pixels: the order picks colour elements inside 16 bytes; the
+// destination's alpha is carried over unchanged.
+struct SwapShuffle4 {
+    __m128i m, alpha;
+    SwapShuffle4(const int (&o)[3], int elemBytes) {
+        alignas(16) uint8_t t[16], a[16];
+        for (int j = 0; j < 16; ++j) {
+            const int elem = j / elemBytes, byte = j % elemBytes, pixel = elem / 4, k = elem % 4;
+            t[j] = k == 3 ? uint8_t(0x80) : static_cast<uint8_t>((pixel * 4 + o[k]) * elemBytes + byte);
+            a[j] = k == 3 ? 0xFF : 0;
+        }
+        m = _mm_load_si128(reinterpret_cast<const __m128i*>(t));
+        alpha = _mm_load_si128(reinterpret_cast<const __m128i*>(a));
+    }
+};
+
+ptrdiff_t swap4Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle4& sh) {
+    ptrdiff_t i = 0;
+    for (; i + 16 <= bytes; i += 16)
+        store16(d + i, blend16(_mm_shuffle_epi8(load16(s + i), sh.m), load16(d + i), sh.alpha));
+    return i;
+}
+#endif
+
+// ---- the forms ------------------------------------------------------------------
+
+// Plain copy of width * C elements per row.
+template <class T, int C>
+Status copyPlain(const T* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roi) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst), badRoi(roi))) return s;
+    const bool contiguous = packed(srcStep, roi, C * sizeof(T)) && srcStep == dstStep;
+    const Rows r = rowsOf(roi, C, contiguous);
+    const size_t bytes = static_cast<size_t>(r.elems) * sizeof(T);
+    eachRow(r.count, [&](int y) { std::memcpy(rowAt(pDst, dstStep, y), rowAt(pSrc, srcStep, y), bytes); });
+    return StatusOk;
+}
+
+// Copies between layouts of SC- and DC-element pixels, N elements each.
+// The single-channel side (or either side of an AC4 conversion) decides
+// whether rows can be merged: its step must be the row length and the other
+// side's step the channel factor times it.
+template <class T, int SC, int DC, int N>
+Status copyPick(const T* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roi) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst), badRoi(roi))) return s;
+    bool contiguous = false;
+    if constexpr (SC == 1 || DC == 1)
+        contiguous = packed(srcStep, roi, SC * sizeof(T)) && packed(dstStep, roi, DC * sizeof(T));
+    const Rows r = rowsOf(roi, 1, contiguous);
+    using E = Word<T>;
+    eachRow(r.count, [&](int y) {
+        const E* s = words(rowAt(pSrc, srcStep, y));
+        E* d = words(rowAt(pDst, dstStep, y));
+        ptrdiff_t x = 0;
+#if ZOR_SIMD >= 4
+        if constexpr (DC == 1) x = pickOneSimd<E, SC>(s, d, r.elems);
+        else if constexpr (SC == 4 && DC == 3) x = dropAlphaSimd<E>(s, d, r.elems);
+        else if constexpr (SC == 3 && DC == 4) x = keepAlphaSimd<E>(s, d, r.elems);
+#endif
+        pickRow<E, SC, DC, N>(s + x * SC, d + x * DC, r.elems - x);
+    });
+    return StatusOk;
+}
+
+template <class T, int C>
+Status copySplit(const T* pSrc, int srcStep, T* const* pDst, int dstStep, ImageSize roi) {
+    if (pSrc == nullptr || pDst == nullptr) return StatusNullPointer;
+    for (int k = 0; k < C; ++k)
+        if (pDst[k] == nullptr) return StatusNullPointer;
+    if (Status s = badRoi(roi)) return s;
+    // 8-bit images merge rows only while the interleaved image is small
+    // (below 160000 bytes): larger ones stream better row by row.
+    bool contiguous = packed(dstStep, roi, sizeof(T)) && packed(srcStep, roi, C * sizeof(T));
+    if (sizeof(T) == 1) contiguous = contiguous && int64_t(srcStep) * roi.height < 160000;
+    const Rows r = rowsOf(roi, 1, contiguous);
+    using E = Word<T>;
+    eachRow(r.count, [&](int y) {
+        const E* s = words(rowAt(pSrc, srcStep, y));
+        E* planes[C];
+        for (int k = 0; k < C; ++k) planes[k] = words(rowAt(pDst[k], dstStep, y));
+        ptrdiff_t x = 0;
+#if ZOR_SIMD >= 4
+        if constexpr (C == 3) x = split3Simd<E>(s, planes, r.elems);
+        else x = split4Simd<E>(s, planes, r.elems);
+#endif
+        for (int k = 0; k < C; ++k) planes[k] += x;
+        splitRow<E, C>(s + C * x, planes, r.elems - x);
+    });
+    return StatusOk;
+}
+
+template <class T, int C>
+Status copyMerge(const T* const* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roi) {
+    if (pSrc == nullptr || pDst == nullptr) return StatusNullPointer;
+    for (int k = 0; k < C; ++k)
+        if (pSrc[k] == nullptr) return StatusNullPointer;
+    if (Status s = badRoi(roi)) return s;
+    const bool contiguous = packed(srcStep, roi, sizeof(T)) && packed(dstStep, roi, C * sizeof(T));
+    const Rows r = rowsOf(roi, 1, contiguous);
+    using E = Word<T>;
+    eachRow(r.count, [&](int y) {
+        const E* planes[C];
+        for (int k = 0; k < C; ++k) planes[k] = words(rowAt(pSrc[k], srcStep, y));
+        E* d = words(rowAt(pDst, dstStep, y));
+        ptrdiff_t x = 0;
+#if ZOR_SIMD >= 4
+        if constexpr (C == 3) x = merge3Simd<E>(planes, d, r.elems);
+        else x = merge4Simd<E>(planes, d, r.elems);
+#endif
+        for (int k = 0; k < C; ++k) planes[k] += x;
+        mergeRow<E, C>(planes, d + C * x, r.elems - x);
+    });
+    return StatusOk;
+}
+
+template <class T>
+Status setC1(T value, T* pDst, int dstStep, ImageSize roi) {
+    if (Status s = checkFirst(anyNull(pDst), badRoi(roi))) return s;
+    using E = Word<T>;
+    E v;
+    std::memcpy(&v, &value, sizeof v);  // the bits as given, whatever the type
+    const Rows r = rowsOf(roi, 1, packed(dstStep, roi, sizeof(T)));
+    eachRow(r.count, [&](int y) {
+        E* d = words(rowAt(pDst, dstStep, y));
+        if constexpr (sizeof(E) == 1) {
+            std::memset(d, v, static_cast<size_t>(r.elems));
+        } else {
+            ptrdiff_t x = 0;
+#if ZOR_SIMD >= 2
+            x = fillRowSimd<E>(d, r.elems, v);
+#endif
+            fillRow<E>(d + x, r.elems - x, v);
+        }
+    });
+    return StatusOk;
+}
+
+template <class T>
+Status setC3(const T* value, T* pDst, int dstStep, ImageSize roi) {
+    if (Status s = checkFirst(anyNull(value, pDst), badRoi(roi))) return s;
+    using E = Word<T>;
+    const E v[3] = {Word<T>(value[0]), Word<T>(value[1]), Word<T>(value[2])};
+    const Rows r = rowsOf(roi, 1, packed(dstStep, roi, 3 * sizeof(T)));
+#if ZOR_SIMD >= 2
+    alignas(16) E pattern[48 / sizeof(E)];
+    for (size_t i = 0; i < 48 / sizeof(E); ++i) pattern[i] = v[i % 3];
+    const __m128i p[3] = {_mm_load_si128(reinterpret_cast<const __m128i*>(pattern)),
+                          _mm_load_si128(reinterpret_cast<const __m128i*>(pattern) + 1),
+                          _mm_load_si128(reinterpret_cast<const __m128i*>(pattern) + 2)};
+#endif
+    eachRow(r.count, [&](int y) {
+        E* d = words(rowAt(pDst, dstStep, y));
+        ptrdiff_t x = 0;
+#if ZOR_SIMD >= 2
+        uint8_t* b = reinterpret_cast<uint8_t*>(d);
+        x = (fill48(b, b + r.elems * 3 * sizeof(E), p) - b) / (3 * sizeof(E));
+#endif
+        fill3Row<E>(d + 3 * x, r.elems - x, v);
+    });
+    return StatusOk;
+}
+
+// Channel order: checks, then rows, collapsed when both images are packed.
+template <class T, int C>
+Status swapChannels(const T* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roi, const int* order) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst, order), badRoi(roi), badSteps(srcStep, dstStep)))
+        return s;
+    const int o[3] = {order[0], order[1], order[2]};
+    for (int k = 0; k < 3; ++k)
+        if (o[k] < 0 || o[k] > 2) return StatusChannelOrder;
+    const bool contiguous = packed(srcStep, roi, C * sizeof(T)) && srcStep == dstStep;
+    const Rows r = rowsOf(roi, 1, contiguous);
+    using E = Word<T>;
+#if ZOR_SIMD >= 4
+    using Shuffle = std::conditional_t<C == 3, SwapShuffle, SwapShuffle4>;
+    const Shuffle sh(o, sizeof(T));
+#endif
+    eachRow(r.count, [&](int y) {
+        const E* s = words(rowAt(pSrc, srcStep, y));
+        E* d = words(rowAt(pDst, dstStep, y));
+        ptrdiff_t x = 0;
+#if ZOR_SIMD >= 4
+        const auto* sb = reinterpret_cast<const uint8_t*>(s);
+        auto* db = reinterpret_cast<uint8_t*>(d);
+        const ptrdiff_t bytes = r.elems * C * sizeof(E);
+        if constexpr (C == 3) x = swap3Simd(sb, db, bytes, sh) / (C * sizeof(E));
+        else x = swap4Simd(sb, db, bytes, sh) / (C * sizeof(E));
+#endif
+        swapRow<E>(s + C * x, d + C * x, r.elems - x, C, o);
+    });
+    return StatusOk;
+}
+
+template <class T, int C>
+Status replicateBorder(const T* pSrc, int srcStep, ImageSize srcRoi, T* pDst, int dstStep, ImageSize dstRoi,
+                       int top, int left) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst), badSteps(srcStep, dstStep))) return s;
+    if (srcRoi.width < 1 || srcRoi.height < 1 || dstRoi.width < 1 || dstRoi.height < 1 || top < 0 ||
+        left < 0 || int64_t(dstRoi.width) < int64_t(left) + srcRoi.width ||
+        int64_t(dstRoi.height) < int64_t(top) + srcRoi.height)
+        return StatusBadSize;
+    using E = Word<T>;
+    const ptrdiff_t right = dstRoi.width - left - srcRoi.width;
+    const size_t srcBytes = static_cast<size_t>(srcRoi.width) * C * sizeof(E);
+    const size_t dstBytes = static_cast<size_t>(dstRoi.width) * C * sizeof(E);
+    for (int y = 0; y < srcRoi.height; ++y) {
+        const E* s = words(rowAt(pSrc, srcStep, y));
+        E* d = words(rowAt(pDst, dstStep, top + y));
+        for (ptrdiff_t x = 0; x < left; ++x)
+            for (int k = 0; k < C; ++k) d[x * C + k] = s[k];
+        std::memcpy(d + left * C, s, srcBytes);
+        E* tail = d + (left + srcRoi.width) * C;
+        const E* last = s + (srcRoi.width - 1) * C;
+        for (ptrdiff_t x = 0; x < right; ++x)
+            for (int k = 0; k < C; ++k) tail[x * C + k] = last[k];
+    }
+    // Rows below repeat the last filled row, rows above the first; a step
+    // shorter than a row makes them overlap, hence memmove.
+    const T* lastRow = rowAt(pDst, dstStep, top + srcRoi.height - 1);
+    for (int y = top + srcRoi.height; y < dstRoi.height; ++y) std::memmove(rowAt(pDst, dstStep, y), lastRow, dstBytes);
+    const T* firstRow = rowAt(pDst, dstStep, top);
+    for (int y = 0; y < top; ++y) std::memmove(rowAt(pDst, dstStep, y), firstRow, dstBytes);
+    return StatusOk;
+}
+
+}  // namespace
+
+// ---- exports --------------------------------------------------------------------
+
+#define ZOR_COPY_PLAIN(name, T, C)                                                                  \
+    Status ZOR_CALL name(const T* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roiSize) {     \
+        return copyPlain<T, C>(pSrc, srcStep, pDst, dstStep, roiSize);                              \
+    }
+ZOR_COPY_PLAIN(zoriCopy_8u_C1R, uint8_t, 1)
+ZOR_COPY_PLAIN(zoriCopy_16s_C1R, int16_t, 1)
+ZOR_COPY_PLAIN(zoriCopy_32f_C1R, float, 1)
+ZOR_COPY_PLAIN(zoriCopy_8u_C3R, uint8_t, 3)
+ZOR_COPY_PLAIN(zoriCopy_16s_C3R, int16_t, 3)
+ZOR_COPY_PLAIN(zoriCopy_32f_C3R, float, 3)
+ZOR_COPY_PLAIN(zoriCopy_8u_C4R, uint8_t, 4)
+ZOR_COPY_PLAIN(zoriCopy_16s_C4R, int16_t, 4)
+#undef ZOR_COPY_PLAIN
+
+#define ZOR_COPY_PICK(name, T, SC, DC, N)                                                           \
+    Status ZOR_CALL name(const T* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roiSize) {     \
+        return copyPick<T, SC, DC, N>(pSrc, srcStep, pDst, dstStep, roiSize);                       \
+    }
+ZOR_COPY_PICK(zoriCopy_8u_C3C1R, uint8_t, 3, 1, 1)
+ZOR_COPY_PICK(zoriCopy_16s_C3C1R, int16_t, 3, 1, 1)
+ZOR_COPY_PICK(zoriCopy_8u_C4C1R, uint8_t, 4, 1, 1)
+ZOR_COPY_PICK(zoriCopy_16s_C4C1R, int16_t, 4, 1, 1)
+ZOR_COPY_PICK(zoriCopy_8u_C1C3R, uint8_t, 1, 3, 1)
+ZOR_COPY_PICK(zoriCopy_16s_C1C3R, int16_t, 1, 3, 1)
+ZOR_COPY_PICK(zoriCopy_8u_C1C4R, uint8_t, 1, 4, 1)
+ZOR_COPY_PICK(zoriCopy_16s_C1C4R, int16_t, 1, 4, 1)
+ZOR_COPY_PICK(zoriCopy_8u_C3AC4R, uint8_t, 3, 4, 3)
+ZOR_COPY_PICK(zoriCopy_16s_C3AC4R, int16_t, 3, 4, 3)
+ZOR_COPY_PICK(zoriCopy_8u_AC4C3R, uint8_t, 4, 3, 3)
+ZOR_COPY_PICK(zoriCopy_16s_AC4C3R, int16_t, 4, 3, 3)
+#undef ZOR_COPY_PICK
+
+Status ZOR_CALL zoriCopy_8u_C3MR(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
+                                 const uint8_t* pMask, int maskStep) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst, pMask), badRoi(roiSize))) return s;
+    for (int y = 0; y < roiSize.height; ++y) {
+        const uint8_t* s = rowAt(pSrc, srcStep, y);
+        uint8_t* d = rowAt(pDst, dstStep, y);
+        const uint8_t* m = rowAt(pMask, maskStep, y);
+        int x = 0;
+#if ZOR_SIMD >= 4
+        for (; x + 16 <= roiSize.width; x += 16) {
+            __m128i fresh[3];
+            load48(s + 3 * x, fresh);
+            maskedStore48(d + 3 * x, m + x, fresh);
+        }
+#endif
+        for (; x < roiSize.width; ++x)
+            if (m[x]) {
+                d[3 * x] = s[3 * x];
+                d[3 * x + 1] = s[3 * x + 1];
+                d[3 * x + 2] = s[3 * x + 2];
+            }
+    }
+    return StatusOk;
+}
+
+Status ZOR_CALL zoriCopy_8u_C3P3R(const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], int dstStep,
+                                  ImageSize roiSize) {
+    return copySplit<uint8_t, 3>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriCopy_16s_C3P3R(const int16_t* pSrc, int srcStep, int16_t* const pDst[3], int dstStep,
+                                   ImageSize roiSize) {
+    return copySplit<int16_t, 3>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriCopy_8u_C4P4R(const uint8_t* pSrc, int srcStep, uint8_t* const pDst[4], int dstStep,
+                                  ImageSize roiSize) {
+    return copySplit<uint8_t, 4>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriCopy_16s_C4P4R(const int16_t* pSrc, int srcStep, int16_t* const pDst[4], int dstStep,
+                                   ImageSize roiSize) {
+    return copySplit<int16_t, 4>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriCopy_8u_P3C3R(const uint8_t* const pSrc[3], int srcStep, uint8_t* pDst, int dstStep,
+                                  ImageSize roiSize) {
+    return copyMerge<uint8_t, 3>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriCopy_16s_P3C3R(const int16_t* const pSrc[3], int srcStep, int16_t* pDst, int dstStep,
+                                   ImageSize roiSize) {
+    return copyMerge<int16_t, 3>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriCopy_8u_P4C4R(const uint8_t* const pSrc[4], int srcStep, uint8_t* pDst, int dstStep,
+                                  ImageSize roiSize) {
+    return copyMerge<uint8_t, 4>(pSrc, srcStep, pDst, dstStep, roiSize);
+}
+
+Status ZOR_CALL zoriDup_8u_C1C3R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst), badRoi(roiSize))) return s;
+    const bool contiguous = packed(srcStep, roiSize, 1) && packed(dstStep, roiSize, 3);
+    const Rows r = rowsOf(roiSize, 1, contiguous);
+    eachRow(r.count, [&](int y) {
+        const uint8_t* s = rowAt(pSrc, srcStep, y);
+        uint8_t* d = rowAt(pDst, dstStep, y);
+        ptrdiff_t x = 0;
+#if ZOR_SIMD >= 4
+        for (; x + 16 <= r.elems; x += 16) {
+            const __m128i v = load16(s + x);
+            const __m128i in[3] = {v, v, v};
+            __m128i out[3];
+            Shuffle48<DupMap>::apply(in, out);
+            store48(d + 3 * x, out);
+        }
+#endif
+        for (; x < r.elems; ++x) d[3 * x] = d[3 * x + 1] = d[3 * x + 2] = s[x];
+    });
+    return StatusOk;
+}
+
+Status ZOR_CALL zoriSet_8u_C1R(uint8_t value, uint8_t* pDst, int dstStep, ImageSize roiSize) {
+    return setC1<uint8_t>(value, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriSet_16s_C1R(int16_t value, int16_t* pDst, int dstStep, ImageSize roiSize) {
+    return setC1<int16_t>(value, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriSet_32s_C1R(int32_t value, int32_t* pDst, int dstStep, ImageSize roiSize) {
+    return setC1<int32_t>(value, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriSet_32f_C1R(float value, float* pDst, int dstStep, ImageSize roiSize) {
+    // the same operation as the 32s form: the word is taken straight from the
+    // argument, never through a floating-point register
+    uint32_t bits;
+    std::memcpy(&bits, &value, sizeof bits);
+    return setC1<uint32_t>(bits, reinterpret_cast<uint32_t*>(pDst), dstStep, roiSize);
+}
+Status ZOR_CALL zoriSet_8u_C3R(const uint8_t* value, uint8_t* pDst, int dstStep, ImageSize roiSize) {
+    return setC3<uint8_t>(value, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriSet_16s_C3R(const int16_t* value, int16_t* pDst, int dstStep, ImageSize roiSize) {
+    return setC3<int16_t>(value, pDst, dstStep, roiSize);
+}
+Status ZOR_CALL zoriSet_8u_C3MR(const uint8_t* value, uint8_t* pDst, int dstStep, ImageSize roiSize,
+                                const uint8_t* pMask, int maskStep) {
+    if (Status s = checkFirst(anyNull(value, pDst, pMask), badRoi(roiSize))) return s;
+    const uint8_t v0 = value[0], v1 = value[1], v2 = value[2];
+#if ZOR_SIMD >= 4
+    alignas(16) uint8_t pattern[48];
+    for (int i = 0; i < 48; ++i) pattern[i] = value[i % 3];
+    __m128i fresh[3];
+    load48(pattern, fresh);
+#endif
+    for (int y = 0; y < roiSize.height; ++y) {
+        uint8_t* d = rowAt(pDst, dstStep, y);
+        const uint8_t* m = rowAt(pMask, maskStep, y);
+        int x = 0;
+#if ZOR_SIMD >= 4
+        for (; x + 16 <= roiSize.width; x += 16) maskedStore48(d + 3 * x, m + x, fresh);
+#endif
+        for (; x < roiSize.width; ++x)
+            if (m[x]) {
+                d[3 * x] = v0;
+                d[3 * x + 1] = v1;
+                d[3 * x + 2] = v2;
+            }
+    }
+    return StatusOk;
+}
+
+Status ZOR_CALL zoriSwapChannels_8u_C3R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
+                                        ImageSize roiSize, const int* dstOrder) {
+    return swapChannels<uint8_t, 3>(pSrc, srcStep, pDst, dstStep, roiSize, dstOrder);
+}
+Status ZOR_CALL zoriSwapChannels_16u_C3R(const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep,
+                                         ImageSize roiSize, const int* dstOrder) {
+    return swapChannels<uint16_t, 3>(pSrc, srcStep, pDst, dstStep, roiSize, dstOrder);
+}
+Status ZOR_CALL zoriSwapChannels_8u_AC4R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
+                                         ImageSize roiSize, const int* dstOrder) {
+    return swapChannels<uint8_t, 4>(pSrc, srcStep, pDst, dstStep, roiSize, dstOrder);
+}
+Status ZOR_CALL zoriSwapChannels_16u_AC4R(const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep,
+                                          ImageSize roiSize, const int* dstOrder) {
+    return swapChannels<uint16_t, 4>(pSrc, srcStep, pDst, dstStep, roiSize, dstOrder);
+}
+Status ZOR_CALL zoriSwapChannels_8u_C3IR(uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, const int* dstOrder) {
+    // one image as source and destination: every 48-byte block (and every
+    // pixel of the tail) is read whole before it is written
+    return swapChannels<uint8_t, 3>(pSrcDst, srcDstStep, pSrcDst, srcDstStep, roiSize, dstOrder);
+}
+
+Status ZOR_CALL zoriCopyReplicateBorder_8u_C1R(const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst,
+                                               int dstStep, ImageSize dstRoiSize, int topBorderHeight,
+                                               int leftBorderWidth) {
+    return replicateBorder<uint8_t, 1>(pSrc, srcStep, srcRoiSize, pDst, dstStep, dstRoiSize, topBorderHeight,
+                                       leftBorderWidth);
+}
+Status ZOR_CALL zoriCopyReplicateBorder_8u_C3R(const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst,
+                                               int dstStep, ImageSize dstRoiSize, int topBorderHeight,
+                                               int leftBorderWidth) {
+    return replicateBorder<uint8_t, 3>(pSrc, srcStep, srcRoiSize, pDst, dstStep, dstRoiSize, topBorderHeight,
+                                       leftBorderWidth);
+}
+Status ZOR_CALL zoriCopyReplicateBorder_16s_C1R(const int16_t* pSrc, int srcStep, ImageSize srcRoiSize, int16_t* pDst,
+                                                int dstStep, ImageSize dstRoiSize, int topBorderHeight,
+                                                int leftBorderWidth) {
+    return replicateBorder<int16_t, 1>(pSrc, srcStep, srcRoiSize, pDst, dstStep, dstRoiSize, topBorderHeight,
+                                       leftBorderWidth);
+}
+
+}}  // namespace zor::ZOR_NS
+
+#endif  // ZOR_VARIANT != 1

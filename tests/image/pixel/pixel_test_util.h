@@ -1,0 +1,70 @@
+// Shared helpers of the pixel-mover tests: random guarded images in several
+// shapes (odd widths around the 16- and 48-byte blocks, packed and padded
+// rows, aligned and unaligned first pixels).
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <cstring>
+#include <memory>
+#include <random>
+#include <vector>
+
+#include "tests/support/guarded.h"
+#include "zor.h"
+
+namespace zpt {
+
+// ROI sizes in pixels: widths around every block boundary the kernels use.
+inline const std::vector<ImageSize>& shapes() {
+    static const std::vector<ImageSize> s = {{1, 1},  {2, 3},  {3, 2},  {5, 1},  {7, 3},  {15, 2}, {16, 2},
+                                             {17, 3}, {21, 1}, {31, 2}, {32, 1}, {33, 3}, {47, 2}, {48, 1},
+                                             {49, 2}, {50, 3}, {64, 1}, {65, 2}, {97, 3}, {100, 2}};
+    return s;
+}
+
+// A layout of the guarded image: row padding in elements, and whether the
+// ROI sits inside a one-pixel border (unaligned start, rows not packed) or
+// flush against the guard after the data.
+struct Layout {
+    int padElems;
+    bool bordered;
+};
+inline const std::vector<Layout>& layouts() {
+    static const std::vector<Layout> l = {{0, false}, {3, false}, {0, true}, {1, true}};
+    return l;
+}
+
+template <class T>
+std::unique_ptr<zt::GuardedImage<T>> image(ImageSize roi, int channels, Layout l, std::mt19937& rng) {
+    auto g = std::make_unique<zt::GuardedImage<T>>(roi.width * channels, roi.height, l.bordered ? 1 : 0,
+                                                   l.padElems * static_cast<int>(sizeof(T)),
+                                                   l.bordered ? zt::Guard::Before : zt::Guard::After, channels);
+    for (int y = 0; y < roi.height; ++y)
+        for (int x = 0; x < roi.width * channels; ++x) {
+            const uint32_t r = rng();
+            std::memcpy(g->at(x, y), &r, sizeof(T));
+        }
+    return g;
+}
+
+// The ROI's elements, row after row.
+template <class T>
+std::vector<T> contents(const zt::GuardedImage<T>& g) {
+    std::vector<T> v;
+    for (int y = 0; y < g.height(); ++y) v.insert(v.end(), g.at(0, y), g.at(0, y) + g.width());
+    return v;
+}
+
+// Bitwise equality (floats included).
+template <class T>
+::testing::AssertionResult sameBits(const std::vector<T>& a, const std::vector<T>& b) {
+    if (a.size() != b.size()) return ::testing::AssertionFailure() << "sizes differ";
+    for (size_t i = 0; i < a.size(); ++i)
+        if (std::memcmp(&a[i], &b[i], sizeof(T)) != 0)
+            return ::testing::AssertionFailure() << "element " << i << " differs: " << +a[i] << " vs " << +b[i];
+    return ::testing::AssertionSuccess();
+}
+
+}  // namespace zpt
