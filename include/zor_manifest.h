@@ -178,3 +178,59 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_8u_AC4IR,  (uint8_t* pSrcDst, int srcDstSt
 ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_16u_C1IR,  (uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
 ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_16u_C3IR,  (uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
 ZOR_FN(ZOR_SSE2UP, Status, zoriMirror_16u_AC4IR, (uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize, int flip))
+
+/* ---- image/filter/linear ----
+ * True convolution with the flipped kernel; the anchor is not validated.
+ * Integer divisor: 1 = no scaling; 2^k = (sum + 2^(k-1)) >> k; any other
+ * value multiplies by (float)(1.0/divisor), exactly, rounding half up; every
+ * non-positive quotient gives 0.  The divisor -2147483648 (which has no shift
+ * count) is treated like any other non-power-of-two divisor: the result is
+ * round-half-up(sum * -2^-31), i.e. 1 for sums <= -2^30 and 0 otherwise. */
+ZOR_FN(ZOR_ALL, Status, zoriFilter_8u_C1R,    (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, const int32_t* pKernel, ImageSize kernelSize, ImagePoint anchor, int divisor))
+ZOR_FN(ZOR_ALL, Status, zoriFilter_8u_C3R,    (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, const int32_t* pKernel, ImageSize kernelSize, ImagePoint anchor, int divisor))
+ZOR_FN(ZOR_ALL, Status, zoriFilter_16s_C1R,   (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize dstRoiSize, const int32_t* pKernel, ImageSize kernelSize, ImagePoint anchor, int divisor))
+ZOR_FN(ZOR_ALL, Status, zoriFilter32f_8u_C1R, (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, const float* pKernel, ImageSize kernelSize, ImagePoint anchor))
+ZOR_FN(ZOR_ALL, Status, zoriFilter32f_8u_C3R, (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, const float* pKernel, ImageSize kernelSize, ImagePoint anchor))
+ZOR_FN(ZOR_ALL, Status, zoriFilter32f_16s_C1R,(const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize dstRoiSize, const float* pKernel, ImageSize kernelSize, ImagePoint anchor))
+
+/* ---- image/filter/sobel ----
+ * Border types of the ...Border_ forms.  Only the ROI is read; the pixels
+ * outside it are synthesised in the work buffer:
+ *   0  replicate:           a a a | a b c ... x y z | z z z
+ *   1  constant:            v v v | a b c ... x y z | v v v   (v = borderValue)
+ *   2  mirror, edge not repeated:  d c b | a b c d ... (a 1-pixel side replicates)
+ *   3  mirror, edge repeated:      c b a | a b c ...
+ *   4  wrap:                x y z | a b c ... x y z | a b c
+ * borderValue is used by type 1 only.  Any other type: StatusBadArgument. */
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelHoriz_8u_C1R,      (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelHoriz_32f_C1R,     (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelVert_32f_C1R,      (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelHorizMask_32f_C1R, (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize, int mask))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelVertMask_32f_C1R,  (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize, int mask))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelHoriz_8u16s_C1R,   (const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize, int mask))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelVert_8u16s_C1R,    (const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize, int mask))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelHorizBorder_8u16s_C1R, (const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize, int mask, int borderType, uint8_t borderValue, uint8_t* pBuffer))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelVertBorder_8u16s_C1R,  (const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize, int mask, int borderType, uint8_t borderValue, uint8_t* pBuffer))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelHorizBorder_32f_C1R,   (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize, int mask, int borderType, float borderValue, uint8_t* pBuffer))
+ZOR_FN(ZOR_ALL, Status, zoriFilterSobelVertBorder_32f_C1R,    (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize, int mask, int borderType, float borderValue, uint8_t* pBuffer))
+ZOR_FN(ZOR_GENERIC, Status, zoriFilterSobelHorizGetBufferSize_8u16s_C1R, (ImageSize roiSize, int mask, int* pBufferSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriFilterSobelVertGetBufferSize_8u16s_C1R,  (ImageSize roiSize, int mask, int* pBufferSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriFilterSobelHorizGetBufferSize_32f_C1R,   (ImageSize roiSize, int mask, int* pBufferSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriFilterSobelVertGetBufferSize_32f_C1R,    (ImageSize roiSize, int mask, int* pBufferSize))
+
+/* ---- image/filter/rank ---- */
+ZOR_FN(ZOR_ALL, Status, zoriFilterMedian_8u_C1R,  (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor))
+ZOR_FN(ZOR_ALL, Status, zoriFilterMedian_16s_C1R, (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor))
+ZOR_FN(ZOR_ALL, Status, zoriFilterMax_8u_C1R,     (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor))
+ZOR_FN(ZOR_ALL, Status, zoriFilterMin_8u_C1R,     (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor))
+
+/* ---- image/filter/morphology ---- */
+ZOR_FN(ZOR_ALL, Status, zoriDilate3x3_8u_C1IR,  (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriErode3x3_8u_C1IR,   (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriErode3x3_32f_C1IR,  (float* pSrcDst, int srcDstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriDilate_8u_C1IR,     (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, const uint8_t* pMask, ImageSize maskSize, ImagePoint anchor))
+ZOR_FN(ZOR_ALL, Status, zoriErode_8u_C1IR,      (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, const uint8_t* pMask, ImageSize maskSize, ImagePoint anchor))
+
+/* ---- image/filter/canny ---- */
+ZOR_FN(ZOR_GENERIC, Status, zoriCannyGetSize,   (ImageSize roiSize, int* pBufferSize))
+ZOR_FN(ZOR_ALL, Status, zoriCanny_16s8u_C1R,    (const int16_t* pSrcDx, int srcDxStep, const int16_t* pSrcDy, int srcDyStep, uint8_t* pDstEdges, int dstEdgeStep, ImageSize roiSize, float lowThreshold, float highThreshold, uint8_t* pBuffer))

@@ -1,0 +1,469 @@
+// Sobel first-derivative filters, 3x3 and 5x5, applied separably: a row pass
+// (the weights along x) over every source row the output needs, kept in a
+// ring of rows, then a column pass (the weights along y) over the ring.
+//
+// Neighbourhood weights (dx to the right, dy downward, no flipping):
+//   Vert  3x3: x [1 0 -1],        y [1 2 1]         (positive where the left is brighter)
+//   Horiz 3x3: x [1 2 1],         y [-1 0 1]        (positive where the bottom is brighter)
+//   Vert  5x5: x [1 2 0 -2 -1],   y [1 4 6 4 1]
+//   Horiz 5x5: x [1 4 6 4 1],     y [-1 -2 0 2 1]
+// The opposite signs of the two directions are intended.
+//
+// 8u sources: integer sums, exact (the largest magnitude, 255 * 48, fits 16
+// bits, so the ring holds 16-bit row sums).  32f sources: each row-pass value
+// is its exact sum formed in double and rounded once to float; the column
+// pass sums in double and rounds once on store.  Zero weights are skipped
+// (an infinite neighbour does not turn a zero weight into NaN).
+//
+// The plain and mask forms read one (3x3) or two (5x5) pixels around the
+// ROI; the border forms read only the ROI and synthesise the rest in the
+// caller's buffer (border types documented in zor_manifest.h).
+#include "frame/variant.h"
+#include "frame/fpu.h"
+#include "frame/memory.h"
+#include "frame/status.h"
+
+#include <cstddef>
+#include <cstring>
+#include <type_traits>
+
+namespace zor { namespace ZOR_NS {
+namespace {
+
+enum class Dir { Horiz, Vert };
+
+struct SobelKernel {
+    int size;    // 3 or 5
+    int x[5];    // row pass: weights along x, left to right
+    int y[5];    // column pass: weights along y, top to bottom
+};
+
+SobelKernel sobelKernel(Dir dir, int size) {
+    if (size == 3)
+        return dir == Dir::Vert ? SobelKernel{3, {1, 0, -1}, {1, 2, 1}}
+                                : SobelKernel{3, {1, 2, 1}, {-1, 0, 1}};
+    return dir == Dir::Vert ? SobelKernel{5, {1, 2, 0, -2, -1}, {1, 4, 6, 4, 1}}
+                            : SobelKernel{5, {1, 4, 6, 4, 1}, {-1, -2, 0, 2, 1}};
+}
+
+template <class T>
+inline const T* rowAt(const T* base, int step, ptrdiff_t row) {
+    return reinterpret_cast<const T*>(reinterpret_cast<const uint8_t*>(base) + row * step);
+}
+template <class T>
+inline T* rowAt(T* base, int step, ptrdiff_t row) {
+    return reinterpret_cast<T*>(reinterpret_cast<uint8_t*>(base) + row * step);
+}
+
+// ---- row pass: s points at column 0 and is readable from -r to w - 1 + r ----------
+
+void rowPass(const uint8_t* s, int16_t* out, int w, const SobelKernel& k) {
+    const int r = k.size / 2;
+    int x = 0;
+#if ZOR_SIMD >= 2
+    const __m128i zero = _mm_setzero_si128();
+    for (; x + 8 <= w; x += 8) {
+        __m128i acc = zero;
+        for (int i = 0; i < k.size; ++i) {
+            if (k.x[i] == 0) continue;
+            const __m128i v = _mm_unpacklo_epi8(
+                _mm_loadl_epi64(reinterpret_cast<const __m128i*>(s + x - r + i)), zero);
+            acc = _mm_add_epi16(acc, _mm_mullo_epi16(v, _mm_set1_epi16(static_cast<int16_t>(k.x[i]))));
+        }
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), acc);
+    }
+#endif
+    for (; x < w; ++x) {
+        int acc = 0;
+        for (int i = 0; i < k.size; ++i) acc += k.x[i] * s[x - r + i];
+        out[x] = static_cast<int16_t>(acc);
+    }
+}
+
+void rowPass(const float* s, float* out, int w, const SobelKernel& k) {
+    const int r = k.size / 2;
+    for (int x = 0; x < w; ++x) {
+        double acc = 0.0;
+        for (int i = 0; i < k.size; ++i)
+            if (k.x[i] != 0) acc = toDouble(acc + static_cast<double>(s[x - r + i]) * k.x[i]);
+        out[x] = toFloat(acc);
+    }
+}
+
+// ---- column pass over the ring rows, top to bottom ---------------------------------
+
+template <class Out>
+void colPass(const int16_t* const* rows, Out* dst, int w, const SobelKernel& k) {
+    int x = 0;
+#if ZOR_SIMD >= 2
+    for (; x + 8 <= w; x += 8) {
+        __m128i acc = _mm_setzero_si128();
+        for (int j = 0; j < k.size; ++j) {
+            if (k.y[j] == 0) continue;
+            const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(rows[j] + x));
+            acc = _mm_add_epi16(acc, _mm_mullo_epi16(v, _mm_set1_epi16(static_cast<int16_t>(k.y[j]))));
+        }
+        if constexpr (sizeof(Out) == 1)
+            _mm_storel_epi64(reinterpret_cast<__m128i*>(dst + x), _mm_packus_epi16(acc, acc));
+        else
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + x), acc);
+    }
+#endif
+    for (; x < w; ++x) {
+        int acc = 0;
+        for (int j = 0; j < k.size; ++j) acc += k.y[j] * rows[j][x];
+        if constexpr (sizeof(Out) == 1)  // 8u output: negative responses are dropped
+            dst[x] = static_cast<Out>(acc <= 0 ? 0 : acc > 255 ? 255 : acc);
+        else
+            dst[x] = static_cast<Out>(acc);
+    }
+}
+
+void colPass(const float* const* rows, float* dst, int w, const SobelKernel& k) {
+    for (int x = 0; x < w; ++x) {
+        double acc = 0.0;
+        for (int j = 0; j < k.size; ++j)
+            if (k.y[j] != 0) acc = toDouble(acc + static_cast<double>(rows[j][x]) * k.y[j]);
+        dst[x] = toFloat(acc);
+    }
+}
+
+// ---- the ring schedule ---------------------------------------------------------------
+
+// rows.row(v) gives source row v (-r .. h - 1 + r) at column 0, readable
+// r pixels to each side.  ring holds size rows of w elements, rowStride apart.
+template <class In, class Acc, class Out, class Rows>
+void sobelRun(const SobelKernel& k, Rows& rows, Acc* ring, size_t rowStride, Out* dst,
+              int dstStep, ImageSize roi) {
+    DoublePrecisionScope precision;
+    const int m = k.size, r = m / 2;
+    auto slot = [&](ptrdiff_t v) { return ring + static_cast<size_t>(((v % m) + m) % m) * rowStride; };
+    for (ptrdiff_t v = -r; v < r; ++v) rowPass(rows.row(v), slot(v), roi.width, k);
+    const Acc* window[5];
+    for (int y = 0; y < roi.height; ++y) {
+        rowPass(rows.row(y + r), slot(y + r), roi.width, k);
+        for (int j = 0; j < m; ++j) window[j] = slot(y - r + j);
+        colPass(window, rowAt(dst, dstStep, y), roi.width, k);
+    }
+}
+
+template <class In>
+struct PlainRows {
+    const In* src;
+    int step;
+    const In* row(ptrdiff_t v) const { return rowAt(src, step, v); }
+};
+
+template <class In>
+using AccOf = std::conditional_t<sizeof(In) == 1, int16_t, float>;
+
+#if ZOR_SIMD >= 2
+// 3x3 on 8u sources in a single pass over three source rows, 16 pixels at a
+// time.  The sums are exact in 16 bits, so this equals the two passes.
+inline void widen(const uint8_t* p, __m128i& lo, __m128i& hi) {
+    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+    lo = _mm_unpacklo_epi8(v, _mm_setzero_si128());
+    hi = _mm_unpackhi_epi8(v, _mm_setzero_si128());
+}
+
+template <class Out>
+void sobel3Direct(const uint8_t* src, int srcStep, Out* dst, int dstStep, ImageSize roi, Dir dir) {
+    const int w = roi.width;
+    for (int y = 0; y < roi.height; ++y) {
+        const uint8_t* p0 = rowAt(src, srcStep, y - 1);
+        const uint8_t* p1 = rowAt(src, srcStep, y);
+        const uint8_t* p2 = rowAt(src, srcStep, y + 1);
+        Out* d = rowAt(dst, dstStep, y);
+        for (int x0 = 0; x0 < w; x0 += 16) {
+            const int x = x0 + 16 <= w ? x0 : w - 16;  // the last block overlaps
+            __m128i lo, hi;
+            if (dir == Dir::Vert) {
+                // smooth down the columns x - 1 and x + 1, then left minus right
+                __m128i s[2][2];
+                for (int k = 0; k < 2; ++k) {
+                    const int off = x - 1 + 2 * k;
+                    __m128i a0, a1, b0, b1, c0, c1;
+                    widen(p0 + off, a0, a1);
+                    widen(p1 + off, b0, b1);
+                    widen(p2 + off, c0, c1);
+                    s[k][0] = _mm_add_epi16(_mm_add_epi16(a0, c0), _mm_add_epi16(b0, b0));
+                    s[k][1] = _mm_add_epi16(_mm_add_epi16(a1, c1), _mm_add_epi16(b1, b1));
+                }
+                lo = _mm_sub_epi16(s[0][0], s[1][0]);
+                hi = _mm_sub_epi16(s[0][1], s[1][1]);
+            } else {
+                // bottom minus top in columns x - 1, x, x + 1, then smoothed along the row
+                __m128i dl[3], dh[3];
+                for (int k = 0; k < 3; ++k) {
+                    __m128i a0, a1, c0, c1;
+                    widen(p0 + x - 1 + k, a0, a1);
+                    widen(p2 + x - 1 + k, c0, c1);
+                    dl[k] = _mm_sub_epi16(c0, a0);
+                    dh[k] = _mm_sub_epi16(c1, a1);
+                }
+                lo = _mm_add_epi16(_mm_add_epi16(dl[0], dl[2]), _mm_add_epi16(dl[1], dl[1]));
+                hi = _mm_add_epi16(_mm_add_epi16(dh[0], dh[2]), _mm_add_epi16(dh[1], dh[1]));
+            }
+            if constexpr (sizeof(Out) == 1) {
+                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), _mm_packus_epi16(lo, hi));
+            } else {
+                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), lo);
+                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x + 8), hi);
+            }
+        }
+    }
+}
+#endif
+
+// Plain and mask forms: the ring comes from the allocator.
+template <class In, class Out>
+Status sobelPlain(const In* src, int srcStep, Out* dst, int dstStep, ImageSize roi, Dir dir,
+                  int size) {
+    using Acc = AccOf<In>;
+#if ZOR_SIMD >= 2
+    if constexpr (sizeof(In) == 1) {
+        if (size == 3 && roi.width >= 16) {
+            sobel3Direct(src, srcStep, dst, dstStep, roi, dir);
+            return StatusOk;
+        }
+    }
+#endif
+    const SobelKernel k = sobelKernel(dir, size);
+    const size_t stride = (static_cast<size_t>(roi.width) + 7) & ~size_t(7);
+    const uint64_t bytes = uint64_t(stride) * k.size * sizeof(Acc);
+    if (bytes > 0x7FFFFFFFu) return StatusNoMemory;
+    Acc* ring = static_cast<Acc*>(mem::alignedAlloc(static_cast<uint32_t>(bytes)));
+    if (!ring) return StatusNoMemory;
+    PlainRows<In> rows{src, srcStep};
+    sobelRun<In, Acc, Out>(k, rows, ring, stride, dst, dstStep, roi);
+    mem::alignedFree(ring);
+    return StatusOk;
+}
+
+template <class In, class Out>
+Status checkedPlain(const In* src, int srcStep, Out* dst, int dstStep, ImageSize roi, Dir dir,
+                    int size) {
+    if (Status s = checkFirst(anyNull(src, dst), badRoi(roi), badSteps(srcStep, dstStep)))
+        return s;
+    return sobelPlain(src, srcStep, dst, dstStep, roi, dir, size);
+}
+
+// ---- border forms --------------------------------------------------------------------
+
+enum BorderType { BorderReplicate = 0, BorderConstant = 1, BorderMirror = 2,
+                  BorderMirrorRepeat = 3, BorderWrap = 4 };
+
+inline ptrdiff_t modulo(ptrdiff_t i, ptrdiff_t n) { return ((i % n) + n) % n; }
+
+// The source index (0 .. n-1) that stands for index i, or -1 for the
+// constant border.  Never leaves 0 .. n-1, also for tiny n.
+ptrdiff_t borderIndex(ptrdiff_t i, ptrdiff_t n, int type) {
+    if (i >= 0 && i < n) return i;
+    switch (type) {
+    case BorderReplicate: return i < 0 ? 0 : n - 1;
+    case BorderConstant: return -1;
+    case BorderMirror: {                 // ... c b | a b c ... (edge not repeated)
+        if (n == 1) return 0;
+        const ptrdiff_t p = modulo(i, 2 * n - 2);
+        return p < n ? p : 2 * n - 2 - p;
+    }
+    case BorderMirrorRepeat: {           // ... b a | a b c ... (edge repeated)
+        const ptrdiff_t p = modulo(i, 2 * n);
+        return p < n ? p : 2 * n - 1 - p;
+    }
+    default: return modulo(i, n);         // wrap
+    }
+}
+
+// Builds each needed row, border included, in a padded row of the buffer.
+template <class In>
+struct BorderRows {
+    const In* src;
+    int step;
+    ImageSize roi;
+    int type;
+    In value;
+    int r;
+    In* padded;  // w + 2r elements; padded + r is column 0
+
+    const In* row(ptrdiff_t v) {
+        const ptrdiff_t sy = borderIndex(v, roi.height, type);
+        In* p = padded + r;
+        if (sy < 0) {
+            for (int x = -r; x < roi.width + r; ++x) p[x] = value;
+            return p;
+        }
+        const In* s = rowAt(src, step, sy);
+        std::memcpy(p, s, sizeof(In) * static_cast<size_t>(roi.width));
+        for (int x = -r; x < 0; ++x) {
+            const ptrdiff_t sx = borderIndex(x, roi.width, type);
+            p[x] = sx < 0 ? value : s[sx];
+        }
+        for (int x = roi.width; x < roi.width + r; ++x) {
+            const ptrdiff_t sx = borderIndex(x, roi.width, type);
+            p[x] = sx < 0 ? value : s[sx];
+        }
+        return p;
+    }
+};
+
+inline uint8_t* alignUp(uint8_t* p, size_t a) {
+    return reinterpret_cast<uint8_t*>((reinterpret_cast<uintptr_t>(p) + a - 1) & ~(uintptr_t(a) - 1));
+}
+
+// Buffer layout: [align to 16] ring (size rows, stride rounded to 8
+// elements) [align to 16] padded row.  Fits the reported size with room to
+// spare for every width.
+template <class In, class Out>
+Status sobelBorder(const In* src, int srcStep, Out* dst, int dstStep, ImageSize roi, int mask,
+                   int borderType, In borderValue, uint8_t* buffer, Dir dir) {
+    if (Status s = checkFirst(anyNull(src, dst, buffer), badRoi(roi)))
+        return s;
+    const int64_t rowBytes = static_cast<int64_t>(roi.width) * sizeof(In);
+    if (srcStep < rowBytes || dstStep < static_cast<int64_t>(roi.width) * static_cast<int64_t>(sizeof(Out)))
+        return StatusBadStep;
+    if (sizeof(In) == 1 ? (dstStep & 1) != 0 : (srcStep % 4 != 0 || dstStep % 4 != 0))
+        return StatusNotEvenStep;
+    if (borderType < 0 || borderType > 4) return StatusBadArgument;
+    if (mask != MaskSize3x3 && mask != MaskSize5x5) return StatusBadMaskSize;
+    using Acc = AccOf<In>;
+    const SobelKernel k = sobelKernel(dir, mask == MaskSize3x3 ? 3 : 5);
+    const size_t stride = (static_cast<size_t>(roi.width) + 7) & ~size_t(7);
+    Acc* ring = reinterpret_cast<Acc*>(alignUp(buffer, 16));
+    In* padded = reinterpret_cast<In*>(
+        alignUp(reinterpret_cast<uint8_t*>(ring + stride * k.size), 16));
+    BorderRows<In> rows{src, srcStep, roi, borderType, borderValue, k.size / 2, padded};
+    sobelRun<In, Acc, Out>(k, rows, ring, stride, dst, dstStep, roi);
+    return StatusOk;
+}
+
+// Work buffer size; R is the padded row storage of one row.
+[[maybe_unused]] Status sobelBufferSize(ImageSize roi, int mask, int* size, bool is32f) {
+    if (!size) return StatusNullPointer;
+    if (Status s = badRoi(roi)) return s;
+    if (mask != MaskSize3x3 && mask != MaskSize5x5) return StatusBadMaskSize;
+    const int64_t w = roi.width;
+    const bool m3 = mask == MaskSize3x3;
+    int64_t bytes;
+    if (is32f) {
+        const int64_t R = ((w + 3) >> 2) * 16;
+        bytes = R * (m3 ? 21 : 25) + (m3 ? 364 : 420);
+    } else {
+        const int64_t R = ((w + 15) >> 4) * 32;
+        bytes = R * (m3 ? 21 : 25) + (m3 ? 372 : 412);
+    }
+    if (bytes > 0x7FFFFFFF) return StatusBadSize;  // not expressible as an int
+    *size = static_cast<int>(bytes);
+    return StatusOk;
+}
+
+int maskOf32f(int mask) { return mask == MaskSize3x3 ? 3 : 5; }  // anything else is 5x5
+
+}  // namespace
+
+// ---- plain forms --------------------------------------------------------------------
+
+Status ZOR_CALL zoriFilterSobelHoriz_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst,
+                                            int dstStep, ImageSize roiSize) {
+    return checkedPlain(pSrc, srcStep, pDst, dstStep, roiSize, Dir::Horiz, 3);
+}
+
+Status ZOR_CALL zoriFilterSobelHoriz_32f_C1R(const float* pSrc, int srcStep, float* pDst,
+                                             int dstStep, ImageSize roiSize) {
+    return checkedPlain(pSrc, srcStep, pDst, dstStep, roiSize, Dir::Horiz, 3);
+}
+
+Status ZOR_CALL zoriFilterSobelVert_32f_C1R(const float* pSrc, int srcStep, float* pDst,
+                                            int dstStep, ImageSize roiSize) {
+    return checkedPlain(pSrc, srcStep, pDst, dstStep, roiSize, Dir::Vert, 3);
+}
+
+// ---- mask forms ---------------------------------------------------------------------
+
+// 33 selects 3x3 and every other value 5x5: these two never report a bad mask.
+Status ZOR_CALL zoriFilterSobelHorizMask_32f_C1R(const float* pSrc, int srcStep, float* pDst,
+                                                 int dstStep, ImageSize roiSize, int mask) {
+    return checkedPlain(pSrc, srcStep, pDst, dstStep, roiSize, Dir::Horiz, maskOf32f(mask));
+}
+
+Status ZOR_CALL zoriFilterSobelVertMask_32f_C1R(const float* pSrc, int srcStep, float* pDst,
+                                                int dstStep, ImageSize roiSize, int mask) {
+    return checkedPlain(pSrc, srcStep, pDst, dstStep, roiSize, Dir::Vert, maskOf32f(mask));
+}
+
+namespace {
+Status sobel8u16s(const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roi,
+                  int mask, Dir dir) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst), badRoi(roi), badSteps(srcStep, dstStep)))
+        return s;
+    if (mask != MaskSize3x3 && mask != MaskSize5x5) return StatusBadMaskSize;
+    return sobelPlain(pSrc, srcStep, pDst, dstStep, roi, dir, mask == MaskSize3x3 ? 3 : 5);
+}
+}  // namespace
+
+Status ZOR_CALL zoriFilterSobelHoriz_8u16s_C1R(const uint8_t* pSrc, int srcStep, int16_t* pDst,
+                                               int dstStep, ImageSize roiSize, int mask) {
+    return sobel8u16s(pSrc, srcStep, pDst, dstStep, roiSize, mask, Dir::Horiz);
+}
+
+Status ZOR_CALL zoriFilterSobelVert_8u16s_C1R(const uint8_t* pSrc, int srcStep, int16_t* pDst,
+                                              int dstStep, ImageSize roiSize, int mask) {
+    return sobel8u16s(pSrc, srcStep, pDst, dstStep, roiSize, mask, Dir::Vert);
+}
+
+// ---- border forms ---------------------------------------------------------------------
+
+Status ZOR_CALL zoriFilterSobelHorizBorder_8u16s_C1R(const uint8_t* pSrc, int srcStep,
+                                                     int16_t* pDst, int dstStep,
+                                                     ImageSize roiSize, int mask, int borderType,
+                                                     uint8_t borderValue, uint8_t* pBuffer) {
+    return sobelBorder(pSrc, srcStep, pDst, dstStep, roiSize, mask, borderType, borderValue,
+                       pBuffer, Dir::Horiz);
+}
+
+Status ZOR_CALL zoriFilterSobelVertBorder_8u16s_C1R(const uint8_t* pSrc, int srcStep,
+                                                    int16_t* pDst, int dstStep,
+                                                    ImageSize roiSize, int mask, int borderType,
+                                                    uint8_t borderValue, uint8_t* pBuffer) {
+    return sobelBorder(pSrc, srcStep, pDst, dstStep, roiSize, mask, borderType, borderValue,
+                       pBuffer, Dir::Vert);
+}
+
+Status ZOR_CALL zoriFilterSobelHorizBorder_32f_C1R(const float* pSrc, int srcStep, float* pDst,
+                                                   int dstStep, ImageSize roiSize, int mask,
+                                                   int borderType, float borderValue,
+                                                   uint8_t* pBuffer) {
+    return sobelBorder(pSrc, srcStep, pDst, dstStep, roiSize, mask, borderType, borderValue,
+                       pBuffer, Dir::Horiz);
+}
+
+Status ZOR_CALL zoriFilterSobelVertBorder_32f_C1R(const float* pSrc, int srcStep, float* pDst,
+                                                  int dstStep, ImageSize roiSize, int mask,
+                                                  int borderType, float borderValue,
+                                                  uint8_t* pBuffer) {
+    return sobelBorder(pSrc, srcStep, pDst, dstStep, roiSize, mask, borderType, borderValue,
+                       pBuffer, Dir::Vert);
+}
+
+// ---- buffer sizes (one per data type; both directions share it) -----------------------
+
+#if ZOR_VARIANT == 0
+Status ZOR_CALL zoriFilterSobelHorizGetBufferSize_8u16s_C1R(ImageSize roiSize, int mask,
+                                                            int* pBufferSize) {
+    return sobelBufferSize(roiSize, mask, pBufferSize, false);
+}
+Status ZOR_CALL zoriFilterSobelVertGetBufferSize_8u16s_C1R(ImageSize roiSize, int mask,
+                                                           int* pBufferSize) {
+    return sobelBufferSize(roiSize, mask, pBufferSize, false);
+}
+Status ZOR_CALL zoriFilterSobelHorizGetBufferSize_32f_C1R(ImageSize roiSize, int mask,
+                                                          int* pBufferSize) {
+    return sobelBufferSize(roiSize, mask, pBufferSize, true);
+}
+Status ZOR_CALL zoriFilterSobelVertGetBufferSize_32f_C1R(ImageSize roiSize, int mask,
+                                                         int* pBufferSize) {
+    return sobelBufferSize(roiSize, mask, pBufferSize, true);
+}
+#endif
+
+}}  // namespace zor::ZOR_NS

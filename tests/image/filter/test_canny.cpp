@@ -1,0 +1,249 @@
+// Canny: buffer size, magnitudes and thresholds, direction classes and their
+// tie rules, hysteresis, clearing of whole rows, check order.
+#include <cmath>
+#include <cstdint>
+#include <cstring>
+#include <limits>
+#include <random>
+#include <vector>
+
+#include "tests/support/guarded.h"
+#include "tests/support/variants.h"
+
+namespace {
+
+class Canny : public zt::VariantTest {};
+
+struct Grad {
+    int w, h;
+    std::vector<int16_t> dx, dy;
+    Grad(int w, int h) : w(w), h(h), dx(size_t(w) * h), dy(size_t(w) * h) {}
+    void set(int x, int y, int gx, int gy) {
+        dx[size_t(y) * w + x] = int16_t(gx);
+        dy[size_t(y) * w + x] = int16_t(gy);
+    }
+};
+
+// Straightforward detector: magnitudes, suppression, then growth by a
+// breadth-first search (the result does not depend on the visiting order).
+std::vector<uint8_t> reference(const Grad& g, float low, float high) {
+    const int w = g.w, h = g.h;
+    const int L = int(low);
+    auto mag = [&](int x, int y) -> int {
+        if (x < 0 || y < 0 || x >= w || y >= h) return 0;
+        const int m = std::abs(int(g.dx[size_t(y) * w + x])) + std::abs(int(g.dy[size_t(y) * w + x]));
+        return m > L ? m : 0;
+    };
+    std::vector<uint8_t> cand(size_t(w) * h), out(size_t(w) * h);
+    std::vector<int> todo;
+    for (int y = 0; y < h; ++y)
+        for (int x = 0; x < w; ++x) {
+            const int m = mag(x, y);
+            if (m == 0) continue;
+            const int gx = g.dx[size_t(y) * w + x], gy = g.dy[size_t(y) * w + x];
+            const double ax = std::abs(gx), ay = std::abs(gy);
+            bool keep;
+            if (ay < 0.41421356237309503 * ax)
+                keep = m > mag(x - 1, y) && m >= mag(x + 1, y);
+            else if (ay <= 2.414213562373095 * ax)
+                keep = (gx < 0) != (gy < 0) ? m > mag(x + 1, y - 1) && m > mag(x - 1, y + 1)
+                                            : m > mag(x - 1, y - 1) && m > mag(x + 1, y + 1);
+            else
+                keep = m > mag(x, y - 1) && m >= mag(x, y + 1);
+            if (!keep) continue;
+            cand[size_t(y) * w + x] = 1;
+            if (float(m) > high) {
+                out[size_t(y) * w + x] = 255;
+                todo.push_back(y * w + x);
+            }
+        }
+    for (size_t i = 0; i < todo.size(); ++i) {
+        const int x0 = todo[i] % w, y0 = todo[i] / w;
+        for (int dy = -1; dy <= 1; ++dy)
+            for (int dx = -1; dx <= 1; ++dx) {
+                const int x = x0 + dx, y = y0 + dy;
+                if (x < 0 || y < 0 || x >= w || y >= h) continue;
+                const size_t k = size_t(y) * w + x;
+                if (cand[k] && !out[k]) {
+                    out[k] = 255;
+                    todo.push_back(int(k));
+                }
+            }
+    }
+    return out;
+}
+
+// Runs the detector with guarded inputs, a buffer of exactly the reported
+// size, and a destination whose rows are wider than the ROI.
+std::vector<uint8_t> run(const zt::Api& z, const Grad& g, float low, float high, Status* st = nullptr,
+                         int extra = 3) {
+    const int w = g.w, h = g.h;
+    zt::GuardedImage<int16_t> dx(w, h, 0, 2), dy(w, h, 0, 0, zt::Guard::Before);
+    for (int y = 0; y < h; ++y)
+        for (int x = 0; x < w; ++x) {
+            *dx.at(x, y) = g.dx[size_t(y) * w + x];
+            *dy.at(x, y) = g.dy[size_t(y) * w + x];
+        }
+    int size = 0;
+    EXPECT_EQ(zt::api(0).zoriCannyGetSize({w, h}, &size), StatusOk);
+    zt::GuardedBuffer buf(size_t(size), w % 2 ? zt::Guard::After : zt::Guard::Before);
+    std::memset(buf.data(), 0xCD, buf.size());
+    // exactly height * step bytes: the last row's padding is cleared too
+    const int step = w + extra;
+    zt::GuardedBuffer dst(size_t(h) * size_t(step));
+    std::memset(dst.data(), 0x5A, dst.size());
+    const Status s = z.zoriCanny_16s8u_C1R(dx.roi(), dx.step(), dy.roi(), dy.step(), dst.data(), step,
+                                           {w, h}, low, high, buf.data());
+    if (st) *st = s;
+    for (int y = 0; y < h; ++y)
+        for (int x = w; x < step; ++x) EXPECT_EQ(dst.data()[size_t(y) * step + x], 0) << x << "," << y;
+    std::vector<uint8_t> out(size_t(w) * h);
+    for (int y = 0; y < h; ++y) std::memcpy(&out[size_t(y) * w], dst.data() + size_t(y) * step, size_t(w));
+    return out;
+}
+
+TEST_P(Canny, RandomGradientsMatchReference) {
+    std::mt19937 rng(41 + variant());
+    for (int trial = 0; trial < 12; ++trial) {
+        const int w = 1 + int(rng() % 45), h = 1 + int(rng() % 20);
+        Grad g(w, h);
+        const int range = trial % 3 == 0 ? 3 : trial % 3 == 1 ? 60 : 32768;  // small ranges: many ties
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x)
+                g.set(x, y, int(rng() % (2 * range)) - range, int(rng() % (2 * range)) - range);
+        const float low = trial % 3 == 2 ? 3000.0f : float(rng() % 20) + 0.7f;
+        const float high = low * 2.5f;
+        Status st;
+        const auto got = run(z(), g, low, high, &st);
+        ASSERT_EQ(st, StatusOk);
+        ASSERT_EQ(got, reference(g, low, high)) << "trial " << trial;
+    }
+}
+
+TEST_P(Canny, SinglePixelsAndTies) {
+    const auto& z = this->z();
+    Grad zero(8, 6);
+    for (uint8_t v : run(z, zero, 10, 50)) EXPECT_EQ(v, 0);
+    Grad one(8, 6);
+    one.set(3, 2, 100, 0);
+    auto e = run(z, one, 10, 50);
+    for (int i = 0; i < 48; ++i) EXPECT_EQ(e[size_t(i)], i == 2 * 8 + 3 ? 255 : 0);
+    // horizontal plateau: the left one survives
+    Grad pair(8, 6);
+    pair.set(3, 2, 100, 0);
+    pair.set(4, 2, 100, 0);
+    e = run(z, pair, 10, 50);
+    EXPECT_EQ(e[2 * 8 + 3], 255);
+    EXPECT_EQ(e[2 * 8 + 4], 0);
+    // vertical plateau: the upper one survives
+    Grad vpair(8, 6);
+    vpair.set(3, 2, 0, -100);
+    vpair.set(3, 3, 0, -100);
+    e = run(z, vpair, 10, 50);
+    EXPECT_EQ(e[2 * 8 + 3], 255);
+    EXPECT_EQ(e[3 * 8 + 3], 0);
+    // diagonal (class 4, same signs) neighbours of equal magnitude: both suppressed
+    Grad diag(8, 6);
+    diag.set(3, 2, 50, 50);
+    diag.set(4, 3, 50, 50);
+    e = run(z, diag, 10, 50);
+    EXPECT_EQ(e[2 * 8 + 3], 0);
+    EXPECT_EQ(e[3 * 8 + 4], 0);
+    // class 2 (signs differ) compares upper right and lower left, not upper left
+    Grad d2(8, 6);
+    d2.set(3, 2, 50, -50);
+    d2.set(4, 3, 60, -60);  // lower right: not compared
+    e = run(z, d2, 10, 50);
+    EXPECT_EQ(e[2 * 8 + 3], 255);
+    // the largest magnitude, 65536, from the most negative derivatives
+    Grad big(16, 3);
+    big.set(9, 1, -32768, -32768);
+    e = run(z, big, 65535, 65535.5f);
+    EXPECT_EQ(e[1 * 16 + 9], 255);
+    // high threshold equal to the magnitude is not strong
+    e = run(z, one, 10, 100);
+    EXPECT_EQ(e[2 * 8 + 3], 0);
+    // the low threshold truncates: 10.9 acts as 10
+    Grad ten(8, 6);
+    ten.set(1, 1, 200, 0);
+    ten.set(2, 2, 10, 0);
+    ten.set(0, 2, 11, 0);
+    e = run(z, ten, 10.9f, 50);
+    EXPECT_EQ(e[1 * 8 + 1], 255);
+    EXPECT_EQ(e[2 * 8 + 2], 0);   // 10: cleared
+    EXPECT_EQ(e[2 * 8 + 0], 255); // 11: kept, touches the edge
+}
+
+TEST_P(Canny, HysteresisFollowsEightNeighbours) {
+    const auto& z = this->z();
+    // a weak chain touching a strong pixel becomes an edge, in every direction
+    for (int k = 0; k < 8; ++k) {
+        static const int ox[8] = {-1, 0, 1, -1, 1, -1, 0, 1}, oy[8] = {-1, -1, -1, 0, 0, 1, 1, 1};
+        Grad g(9, 9);
+        g.set(4, 4, 0, 0);
+        // isolated pixels of class 1 keep their own magnitude as maxima
+        g.set(4, 4, 300, 0);
+        g.set(4 + 2 * ox[k], 4 + 2 * oy[k], 30, 0);   // weak, touching only another weak one
+        g.set(4 + ox[k], 4 + oy[k], 0, 0);
+        const auto e = run(z, g, 10, 100);
+        EXPECT_EQ(e[4 * 9 + 4], 255);
+        EXPECT_EQ(e[size_t(4 + 2 * oy[k]) * 9 + size_t(4 + 2 * ox[k])], 0) << k;
+        Grad g2(9, 9);
+        g2.set(4, 4, 300, 0);
+        if (ox[k] != 0) g2.set(4 + ox[k], 4 + oy[k], 0, 30);  // class 3 beside a class 1 pixel
+        else g2.set(4 + ox[k], 4 + oy[k], 30, 0);
+        const auto e2 = run(z, g2, 10, 100);
+        EXPECT_EQ(e2[size_t(4 + oy[k]) * 9 + size_t(4 + ox[k])], 255) << k;
+    }
+}
+
+TEST_P(Canny, ChecksAndSizes) {
+    const auto& z = this->z();
+    int n = 0;
+    EXPECT_EQ(z.zoriCannyGetSize({3, 2}, &n), StatusOk);
+    EXPECT_EQ(n, 5 * 5 * 4 + 16 * 3 + 160);
+    EXPECT_EQ(z.zoriCannyGetSize({65532, 1}, &n), StatusOk);
+    EXPECT_EQ(n, 5 * 65534 * 3 + 16 * 65532 + 160);
+    EXPECT_EQ(z.zoriCannyGetSize({65533, 1}, &n), StatusOk);
+    EXPECT_EQ(n, 9 * 65535 * 3 + 16 * 65533 + 160);
+    EXPECT_EQ(z.zoriCannyGetSize({1, 65533}, &n), StatusOk);
+    EXPECT_EQ(n, 9 * 65535 * 3 + 16 + 160);
+    EXPECT_EQ(z.zoriCannyGetSize({0, 1}, nullptr), StatusNullPointer);
+    EXPECT_EQ(z.zoriCannyGetSize({0, 1}, &n), StatusBadSize);
+
+    int16_t dx[64] = {}, dy[64] = {};
+    uint8_t d[64], buf[2048];
+    std::memset(d, 7, sizeof d);
+    const ImageSize roi{4, 2};
+    auto c = z.zoriCanny_16s8u_C1R;
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, {0, 0}, 1, 2, nullptr), StatusNullPointer);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, {0, 2}, -1, 2, buf), StatusBadSize);
+    EXPECT_EQ(c(dx, 7, dy, 0, d, 0, roi, -1, 2, buf), StatusBadStep);
+    EXPECT_EQ(c(dx, 8, dy, 7, d, 4, roi, -1, 2, buf), StatusBadStep);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 3, roi, -1, 2, buf), StatusBadStep);
+    EXPECT_EQ(c(dx, 9, dy, 8, d, 4, roi, -1, 2, buf), StatusNotEvenStep);
+    EXPECT_EQ(c(dx, 8, dy, 11, d, 4, roi, -1, 2, buf), StatusNotEvenStep);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, -1, 2, buf), StatusBadArgument);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, 5, 4, buf), StatusBadArgument);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, std::numeric_limits<float>::quiet_NaN(), 4, buf), StatusBadArgument);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, 1, std::numeric_limits<float>::quiet_NaN(), buf), StatusBadArgument);
+    for (uint8_t v : d) EXPECT_EQ(v, 7);
+    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, 5, 5, buf), StatusOk);
+    for (int i = 0; i < 8; ++i) EXPECT_EQ(d[i], 0);
+    EXPECT_EQ(d[8], 7);
+}
+
+TEST_P(Canny, WideCoordinates) {
+    // a padded width of 65535 switches the stack to 32-bit coordinates
+    Grad g(65533, 1);
+    for (int x = 0; x < g.w; x += 7) g.set(x, 0, x % 3 ? 40 : 200, 0);
+    g.set(65532, 0, 200, 0);
+    g.set(65531, 0, 20, 20);
+    const auto e = run(z(), g, 10, 100, nullptr, 0);
+    EXPECT_EQ(e, reference(g, 10, 100));
+    EXPECT_EQ(e[65532], 255);
+}
+
+}  // namespace
+
+ZT_ALL_VARIANTS(Canny);
