@@ -135,6 +135,20 @@ enum {
     MaskSize5x5 = 55
 };
 
+/* Rounding modes of the float-to-integer signal conversions: any value
+   other than RoundNear truncates toward zero. */
+enum {
+    RoundZero = 0,
+    RoundNear = 1
+};
+
+/* Relation codes of zorsThreshold_32f_I: CmpGreater clips from above, any
+   other value from below. */
+enum {
+    CmpLess    = 0,
+    CmpGreater = 4
+};
+
 /* ---- Exported functions -------------------------------------------- */
 
 #define ZOR_FN(map, ret, name, params) ZOR_API ret ZOR_CALL name params;

@@ -1,0 +1,225 @@
+// Vector arithmetic, elementwise math and statistics against OpenCV and the
+// standard library, 64 Ki elements each.
+#include <benchmark/benchmark.h>
+#include <opencv2/core.hpp>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdint>
+#include <cstring>
+#include <functional>
+#include <random>
+#include <vector>
+
+#include "bench/pairs.h"
+#include "zor.h"
+
+namespace {
+
+constexpr int kLen = 64 * 1024;
+
+std::vector<float> randomFloats(int n, uint32_t seed, float lo, float hi) {
+    std::mt19937 rng(seed);
+    std::uniform_real_distribution<float> u(lo, hi);
+    std::vector<float> v(n);
+    for (auto& x : v) x = u(rng);
+    return v;
+}
+std::vector<int16_t> randomShorts(int n, uint32_t seed) {
+    std::mt19937 rng(seed);
+    std::uniform_int_distribution<int> u(-32768, 32767);
+    std::vector<int16_t> v(n);
+    for (auto& x : v) x = static_cast<int16_t>(u(rng));
+    return v;
+}
+
+cv::Mat row(std::vector<float>& v) { return cv::Mat(1, static_cast<int>(v.size()), CV_32F, v.data()); }
+
+// ---- add ----
+void zorAdd(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1), b = randomFloats(kLen, 2, -1, 1);
+    std::vector<float> d(kLen);
+    for (auto _ : state) {
+        zorsAdd_32f(a.data(), b.data(), d.data(), kLen);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+void cvAdd(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1), b = randomFloats(kLen, 2, -1, 1);
+    std::vector<float> d(kLen);
+    cv::Mat ma = row(a), mb = row(b), md = row(d);
+    for (auto _ : state) {
+        cv::add(ma, mb, md);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+
+// ---- multiply by a constant ----
+void zorMulC(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1);
+    std::vector<float> d(kLen);
+    for (auto _ : state) {
+        zorsMulC_32f(a.data(), 2.5f, d.data(), kLen);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+void cvMulC(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1);
+    std::vector<float> d(kLen);
+    cv::Mat ma = row(a), md = row(d);
+    for (auto _ : state) {
+        cv::multiply(ma, cv::Scalar::all(2.5), md);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+
+// ---- 16-bit multiply with scaling ----
+void zorMulNR(benchmark::State& state) {
+    auto a = randomShorts(kLen, 1), b = randomShorts(kLen, 2);
+    std::vector<int16_t> d(kLen);
+    for (auto _ : state) {
+        zorsMul_NR_16s_Sfs(a.data(), b.data(), d.data(), kLen, 12);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+void cvMul16s(benchmark::State& state) {
+    auto a = randomShorts(kLen, 1), b = randomShorts(kLen, 2);
+    std::vector<int16_t> d(kLen);
+    cv::Mat ma(1, kLen, CV_16S, a.data()), mb(1, kLen, CV_16S, b.data()), md(1, kLen, CV_16S, d.data());
+    for (auto _ : state) {
+        cv::multiply(ma, mb, md, 1.0 / 4096);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+
+// ---- dot product ----
+void zorDot(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1), b = randomFloats(kLen, 2, -1, 1);
+    float r;
+    for (auto _ : state) {
+        zorsDotProd_32f(a.data(), b.data(), kLen, &r);
+        benchmark::DoNotOptimize(r);
+    }
+}
+void cvDot(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1), b = randomFloats(kLen, 2, -1, 1);
+    cv::Mat ma = row(a), mb = row(b);
+    for (auto _ : state) {
+        double r = ma.dot(mb);
+        benchmark::DoNotOptimize(r);
+    }
+}
+
+// ---- magnitude of interleaved complex data ----
+void zorMagnitude(benchmark::State& state) {
+    auto c = randomFloats(2 * kLen, 1, -100, 100);
+    std::vector<float> d(kLen);
+    for (auto _ : state) {
+        zorsMagnitude_32fc(reinterpret_cast<const Complex32f*>(c.data()), d.data(), kLen);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+void cvMagnitude(benchmark::State& state) {
+    auto x = randomFloats(kLen, 1, -100, 100), y = randomFloats(kLen, 2, -100, 100);
+    std::vector<float> d(kLen);
+    cv::Mat mx = row(x), my = row(y), md = row(d);
+    for (auto _ : state) {
+        cv::magnitude(mx, my, md);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+
+// ---- phase ----
+void zorPhase(benchmark::State& state) {
+    auto x = randomFloats(kLen, 1, -100, 100), y = randomFloats(kLen, 2, -100, 100);
+    std::vector<float> d(kLen);
+    for (auto _ : state) {
+        zorsPhase_32f(x.data(), y.data(), d.data(), kLen);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+void cvPhase(benchmark::State& state) {
+    auto x = randomFloats(kLen, 1, -100, 100), y = randomFloats(kLen, 2, -100, 100);
+    std::vector<float> d(kLen);
+    cv::Mat mx = row(x), my = row(y), md = row(d);
+    for (auto _ : state) {
+        cv::phase(mx, my, md, false);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+
+// ---- natural logarithm (in place: both sides restore the input first) ----
+void zorLn(benchmark::State& state) {
+    const auto src = randomFloats(kLen, 1, 1e-3f, 1e3f);
+    std::vector<float> w(kLen);
+    for (auto _ : state) {
+        std::memcpy(w.data(), src.data(), kLen * sizeof(float));
+        zorsLn_32f_I(w.data(), kLen);
+        benchmark::DoNotOptimize(w.data());
+    }
+}
+void cvLn(benchmark::State& state) {
+    auto src = randomFloats(kLen, 1, 1e-3f, 1e3f);
+    std::vector<float> w(kLen);
+    cv::Mat mw = row(w);
+    for (auto _ : state) {
+        std::memcpy(w.data(), src.data(), kLen * sizeof(float));
+        cv::log(mw, mw);
+        benchmark::DoNotOptimize(w.data());
+    }
+}
+
+// ---- maximum with its index ----
+void zorMaxIndx(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1);
+    float m;
+    int idx;
+    for (auto _ : state) {
+        zorsMaxIndx_32f(a.data(), kLen, &m, &idx);
+        benchmark::DoNotOptimize(m);
+        benchmark::DoNotOptimize(idx);
+    }
+}
+void cvMaxIndx(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1);
+    cv::Mat ma = row(a);
+    for (auto _ : state) {
+        double mn, mx;
+        int imn[2], imx[2];
+        cv::minMaxIdx(ma, &mn, &mx, imn, imx);
+        benchmark::DoNotOptimize(mx);
+        benchmark::DoNotOptimize(imx[1]);
+    }
+}
+
+// ---- descending sort (both sides restore the input first) ----
+void zorSort(benchmark::State& state) {
+    const auto src = randomFloats(kLen, 1, -1e6f, 1e6f);
+    std::vector<float> w(kLen);
+    for (auto _ : state) {
+        std::memcpy(w.data(), src.data(), kLen * sizeof(float));
+        zorsSortDescend_32f_I(w.data(), kLen);
+        benchmark::DoNotOptimize(w.data());
+    }
+}
+void stdSort(benchmark::State& state) {
+    const auto src = randomFloats(kLen, 1, -1e6f, 1e6f);
+    std::vector<float> w(kLen);
+    for (auto _ : state) {
+        std::memcpy(w.data(), src.data(), kLen * sizeof(float));
+        std::sort(w.begin(), w.end(), std::greater<float>());
+        benchmark::DoNotOptimize(w.data());
+    }
+}
+
+}  // namespace
+
+ZB_PAIR(vadd, "zorsAdd_32f 64Ki", zorAdd, cvAdd, "cv::add", 1.2);
+ZB_PAIR(vmulc, "zorsMulC_32f 64Ki", zorMulC, cvMulC, "cv::multiply by scalar", 1.2);
+ZB_PAIR(vmulnr, "zorsMul_NR_16s_Sfs 64Ki sf=12", zorMulNR, cvMul16s, "cv::multiply 16s scale 1/4096", 1.0);
+ZB_PAIR(vdot, "zorsDotProd_32f 64Ki", zorDot, cvDot, "cv::Mat::dot", 1.5);
+ZB_PAIR(vmag, "zorsMagnitude_32fc 64Ki", zorMagnitude, cvMagnitude, "cv::magnitude", 1.5);
+ZB_PAIR(vphase, "zorsPhase_32f 64Ki", zorPhase, cvPhase, "cv::phase", 1.5);
+ZB_PAIR(vln, "zorsLn_32f_I 64Ki (+copy)", zorLn, cvLn, "cv::log (+copy)", 1.5);
+ZB_PAIR(vmaxidx, "zorsMaxIndx_32f 64Ki", zorMaxIndx, cvMaxIndx, "cv::minMaxIdx", 1.0);
+ZB_PAIR(vsort, "zorsSortDescend_32f_I 64Ki (+copy)", zorSort, stdSort, "std::sort greater (+copy)", 1.0);
