@@ -359,3 +359,60 @@ ZOR_FN(ZOR_GENERIC, Status, zorsWinHamming_64f_I,  (double* pSrcDst, int len))
 ZOR_FN(ZOR_GENERIC, Status, zorsWinHamming_64fc,   (const Complex64f* pSrc, Complex64f* pDst, int len))
 ZOR_FN(ZOR_GENERIC, Status, zorsWinHamming_64fc_I, (Complex64f* pSrcDst, int len))
 ZOR_FN(ZOR_GENERIC, Status, zorsWinHann_32f_I,     (float* pSrcDst, int len))
+
+/* ---- signal/transform/fft ---- */
+
+ZOR_FN(ZOR_ALL, Status, zorsFFTInitAlloc_C_32f, (void** ppSpec, int order, int flag, int hint))
+ZOR_FN(ZOR_ALL, Status, zorsFFTInitAlloc_R_32f, (void** ppSpec, int order, int flag, int hint))
+ZOR_FN(ZOR_ALL, Status, zorsFFTFree_C_32f, (void* pSpec))
+ZOR_FN(ZOR_ALL, Status, zorsFFTFree_R_32f, (void* pSpec))
+ZOR_FN(ZOR_ALL, Status, zorsFFTFwd_CToC_32f,
+       (const float* pSrcRe, const float* pSrcIm, float* pDstRe, float* pDstIm,
+        const void* pSpec, uint8_t* pBuffer))
+ZOR_FN(ZOR_ALL, Status, zorsFFTInv_CToC_32f,
+       (const float* pSrcRe, const float* pSrcIm, float* pDstRe, float* pDstIm,
+        const void* pSpec, uint8_t* pBuffer))
+ZOR_FN(ZOR_ALL, Status, zorsFFTFwd_RToCCS_32f,
+       (const float* pSrc, float* pDst, const void* pSpec, uint8_t* pBuffer))
+
+/* ---- signal/transform/iir ---- */
+
+ZOR_FN(ZOR_ALL, Status, zorsIIRInitAlloc_32f,
+       (void** ppState, const float* pTaps, int order, const float* pDlyLine))
+ZOR_FN(ZOR_ALL, Status, zorsIIR_32f, (const float* pSrc, float* pDst, int len, void* pState))
+ZOR_FN(ZOR_ALL, Status, zorsIIRFree_32f, (void* pState))
+
+/* ---- signal/transform/randgauss ---- */
+
+ZOR_FN(ZOR_ALL, Status, zorsRandGaussInitAlloc_32f,
+       (void** ppState, float mean, float stdDev, uint32_t seed))
+ZOR_FN(ZOR_ALL, Status, zorsRandGauss_32f, (float* pDst, int len, void* pState))
+ZOR_FN(ZOR_ALL, Status, zorsRandGaussFree_32f, (void* pState))
+
+/* ---- signal/transform/autocorr ---- */
+
+ZOR_FN(ZOR_ALL, Status, zorsAutoCorr_32f, (const float* pSrc, int srcLen, float* pDst, int dstLen))
+
+/* ---- signal/speech/melfbank ---- */
+
+ZOR_FN(ZOR_ALL, Status, zorsMelFBankInitAlloc_32f,
+       (void** ppFBank, int* pFFTOrder, int winLen, float sampFreq, float lowFreq, float highFreq,
+        int nFilter, float melMul, float melDiv, int mode))
+ZOR_FN(ZOR_ALL, Status, zorsEvalFBank_32f, (const float* pSrc, float* pDst, void* pFBank))
+ZOR_FN(ZOR_ALL, Status, zorsFBankFree_32f, (void* pFBank))
+
+/* ---- signal/speech/cepstral ---- */
+
+ZOR_FN(ZOR_SSE2UP, Status, zorsPreemphasize_32f, (float* pSrcDst, int len, float val))
+ZOR_FN(ZOR_GENERIC, Status, zorsCopyWithPadding_32f,
+       (const float* pSrc, int lenSrc, float* pDst, int lenDst))
+ZOR_FN(ZOR_GENERIC, Status, zorsDCTLifterInitAlloc_32f,
+       (void** ppDCTLifter, int lenDCT, int lenCeps, int nLifter, float val))
+ZOR_FN(ZOR_SSE2UP, Status, zorsDCTLifter_32f,
+       (const float* pSrc, float* pDst, const void* pDCTLifter))
+ZOR_FN(ZOR_GENERIC, Status, zorsDCTLifterFree_32f, (void* pDCTLifter))
+ZOR_FN(ZOR_GENERIC, Status, zorsNormEnergy_32f,
+       (float* pSrcDst, int step, int height, float silFloor, float energyScale))
+ZOR_FN(ZOR_GENERIC, Status, zorsSignChangeRate_16s, (const int16_t* pSrc, int len, int32_t* pRes))
+ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
+       (const int16_t* pSrc, int len, int lowerLag, int upperLag, int32_t* pMax, int* pMaxLag))

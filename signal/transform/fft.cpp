@@ -1,0 +1,571 @@
+// Power-of-two FFTs on float data: complex transforms on split arrays and a
+// forward real transform packed as CCS.
+//
+// Method (orders 4 and up): decimation in time.  The first pass gathers the
+// input in bit-reversed order and does the 4-point transforms in the same
+// go; an optional radix-2 pass and radix-4 passes follow, each with its own
+// precomputed twiddle table laid out in the order the passes read it.  The
+// inverse is the forward transform with real and imaginary parts swapped on
+// both sides, which costs nothing on split arrays.  The real transform runs
+// the complex one on the N/2 even/odd pairs and recombines.
+//
+// The butterflies are written once over a four-lane vector type: SSE
+// registers from variant 1 up, a plain four-float record in the generic
+// variant.
+#include "frame/variant.h"
+#include "frame/status.h"
+#include "frame/memory.h"
+
+#include <cmath>
+#include <cstring>
+
+namespace zor { namespace ZOR_NS {
+namespace {
+
+constexpr int32_t kIdComplex = 5;
+constexpr int32_t kIdReal = 6;
+constexpr int kMaxOrder = 30;
+constexpr int kSmallOrder = 10;  // up to here: static sine table, no work buffer
+
+// The spec record as callers' memory holds it; the engine's own plan
+// follows the published fields.
+struct FftSpec {
+    int32_t id;
+    int32_t order;
+    int32_t forwardScaled;
+    int32_t inverseScaled;
+    float scale;
+    uint32_t hint;
+    int32_t bufferSize;
+    int32_t allocated;
+    const int32_t* bitReverse;   // first pass: output quad of each input quad
+    const float* twiddles;       // quarter-wave sine table or the computed pass tables
+    const float* realTwiddles;   // 0.5 cos(2 pi k / N), k = 0 .. N/4
+    const float* realTwiddles2;  // -0.5 sin(2 pi k / N)
+    // engine
+    int32_t cOrder;              // order of the complex engine (order - 1 for real specs)
+    const float* passTw;         // pass twiddle tables, one after the other
+};
+
+// sin(2 pi k / 1024), k = 0 .. 256.
+alignas(32) const float kQuarterSine[257] = {
+0.0f, 0.00613588467f, 0.0122715384f, 0.0184067301f, 0.024541229f, 0.030674804f, 0.0368072242f,
+0.0429382585f, 0.0490676761f, 0.0551952459f, 0.061320737f, 0.0674439222f, 0.0735645667f,
+0.0796824396f, 0.0857973099f, 0.0919089541f, 0.0980171412f, 0.104121633f, 0.110222206f,
+0.116318628f, 0.122410677f, 0.128498107f, 0.134580702f, 0.140658244f, 0.146730468f,
+0.152797192f, 0.15885815f, 0.164913118f, 0.170961887f, 0.177004218f, 0.183039889f, 0.18906866f,
+0.195090324f, 0.201104641f, 0.207111374f, 0.213110313f, 0.219101235f, 0.225083917f,
+0.231058106f, 0.237023607f, 0.242980182f, 0.248927608f, 0.254865646f, 0.260794103f,
+0.266712755f, 0.272621363f, 0.27851969f, 0.284407526f, 0.290284663f, 0.296150893f, 0.302005947f,
+0.307849646f, 0.313681751f, 0.319502026f, 0.32531029f, 0.331106305f, 0.336889863f, 0.342660725f,
+0.348418683f, 0.354163527f, 0.359895051f, 0.365612984f, 0.371317208f, 0.377007425f,
+0.382683426f, 0.388345033f, 0.393992037f, 0.399624199f, 0.405241311f, 0.410843164f,
+0.416429549f, 0.422000259f, 0.427555084f, 0.433093816f, 0.438616246f, 0.444122136f,
+0.449611336f, 0.455083579f, 0.460538715f, 0.465976506f, 0.471396744f, 0.47679922f, 0.482183784f,
+0.487550169f, 0.492898196f, 0.498227656f, 0.50353837f, 0.50883013f, 0.514102757f, 0.519356012f,
+0.524589658f, 0.529803634f, 0.534997642f, 0.540171444f, 0.545324981f, 0.550457954f,
+0.555570245f, 0.560661554f, 0.565731823f, 0.570780754f, 0.575808167f, 0.580813944f,
+0.585797846f, 0.590759695f, 0.59569931f, 0.600616455f, 0.605511069f, 0.610382795f, 0.615231574f,
+0.620057225f, 0.624859512f, 0.629638255f, 0.634393275f, 0.639124453f, 0.643831551f, 0.64851439f,
+0.653172851f, 0.657806695f, 0.662415802f, 0.666999936f, 0.671558976f, 0.676092684f,
+0.680601001f, 0.685083687f, 0.689540565f, 0.693971455f, 0.698376238f, 0.702754736f,
+0.707106769f, 0.711432219f, 0.715730846f, 0.720002532f, 0.724247098f, 0.728464365f,
+0.732654274f, 0.736816585f, 0.740951121f, 0.745057762f, 0.749136388f, 0.753186822f,
+0.757208824f, 0.761202395f, 0.765167236f, 0.769103348f, 0.773010433f, 0.77688849f, 0.780737221f,
+0.784556568f, 0.78834641f, 0.792106569f, 0.795836926f, 0.799537241f, 0.803207517f, 0.806847572f,
+0.81045717f, 0.81403631f, 0.817584813f, 0.8211025f, 0.824589312f, 0.82804507f, 0.831469595f,
+0.834862888f, 0.838224709f, 0.841554999f, 0.84485358f, 0.848120332f, 0.851355195f, 0.854557991f,
+0.857728601f, 0.860866964f, 0.863972843f, 0.867046237f, 0.870086968f, 0.873094976f,
+0.876070082f, 0.879012227f, 0.881921291f, 0.884797096f, 0.887639642f, 0.890448749f,
+0.893224299f, 0.895966232f, 0.898674488f, 0.901348829f, 0.903989315f, 0.906595707f,
+0.909168005f, 0.91170603f, 0.914209783f, 0.916679084f, 0.919113874f, 0.921514034f, 0.923879504f,
+0.926210225f, 0.928506076f, 0.93076694f, 0.932992816f, 0.935183525f, 0.937339008f, 0.939459205f,
+0.941544056f, 0.943593442f, 0.945607305f, 0.947585583f, 0.949528158f, 0.95143503f, 0.953306019f,
+0.955141187f, 0.956940353f, 0.958703458f, 0.960430503f, 0.962121427f, 0.963776052f,
+0.965394437f, 0.966976464f, 0.968522072f, 0.970031261f, 0.971503913f, 0.972939968f,
+0.974339366f, 0.975702107f, 0.977028131f, 0.97831738f, 0.979569793f, 0.980785251f, 0.981963873f,
+0.983105481f, 0.984210074f, 0.985277653f, 0.986308098f, 0.987301409f, 0.988257587f,
+0.989176512f, 0.990058184f, 0.990902662f, 0.991709769f, 0.992479563f, 0.993211925f,
+0.993906975f, 0.994564593f, 0.99518472f, 0.995767415f, 0.996312618f, 0.996820271f, 0.997290432f,
+0.997723043f, 0.998118103f, 0.998475552f, 0.99879545f, 0.999077737f, 0.999322355f, 0.999529421f,
+0.999698818f, 0.999830604f, 0.999924719f, 0.999981165f, 1.0f
+};
+
+// cos and sin of 2 pi num / den, rounded to float: from the static table
+// when den divides 1024, else computed in double.
+void unitRoot(int64_t num, int64_t den, float& c, float& s) {
+    num %= den;
+    if (num < 0) num += den;
+    if (den <= 1024) {
+        const int i = static_cast<int>(num * (1024 / den));
+        auto sine = [](int j) {  // sin(2 pi j / 1024), j in 0 .. 1023
+            const int q = j >> 8, r = j & 255;
+            const float v = (q & 1) ? kQuarterSine[256 - r] : kQuarterSine[r];
+            return q >= 2 ? -v : v;
+        };
+        s = sine(i);
+        c = sine((i + 256) & 1023);
+        return;
+    }
+    const double a = 6.283185307179586 * static_cast<double>(num) / static_cast<double>(den);
+    c = static_cast<float>(std::cos(a));
+    s = static_cast<float>(std::sin(a));
+}
+
+// ---- four-lane vectors ----------------------------------------------------
+
+#if ZOR_SIMD >= 1
+struct V { __m128 v; };
+inline V ld(const float* p) { return {_mm_loadu_ps(p)}; }
+inline void st(float* p, V a) { _mm_storeu_ps(p, a.v); }
+inline V splat(float x) { return {_mm_set1_ps(x)}; }
+inline V operator+(V a, V b) { return {_mm_add_ps(a.v, b.v)}; }
+inline V operator-(V a, V b) { return {_mm_sub_ps(a.v, b.v)}; }
+inline V operator*(V a, V b) { return {_mm_mul_ps(a.v, b.v)}; }
+inline void transpose(V& a, V& b, V& c, V& d) { _MM_TRANSPOSE4_PS(a.v, b.v, c.v, d.v); }
+inline V reversed(V a) { return {_mm_shuffle_ps(a.v, a.v, _MM_SHUFFLE(0, 1, 2, 3))}; }
+// p[0..7] = re0 im0 re1 im1 ... into re and im lanes
+inline void ldPairs(const float* p, V& re, V& im) {
+    const __m128 a = _mm_loadu_ps(p), b = _mm_loadu_ps(p + 4);
+    re.v = _mm_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+    im.v = _mm_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+}
+inline void stPairs(float* p, V re, V im) {
+    _mm_storeu_ps(p, _mm_unpacklo_ps(re.v, im.v));
+    _mm_storeu_ps(p + 4, _mm_unpackhi_ps(re.v, im.v));
+}
+#else
+struct V { float v[4]; };
+inline V ld(const float* p) { return {{p[0], p[1], p[2], p[3]}}; }
+inline void st(float* p, V a) { for (int i = 0; i < 4; ++i) p[i] = a.v[i]; }
+inline V splat(float x) { return {{x, x, x, x}}; }
+inline V operator+(V a, V b) { for (int i = 0; i < 4; ++i) a.v[i] += b.v[i]; return a; }
+inline V operator-(V a, V b) { for (int i = 0; i < 4; ++i) a.v[i] -= b.v[i]; return a; }
+inline V operator*(V a, V b) { for (int i = 0; i < 4; ++i) a.v[i] *= b.v[i]; return a; }
+inline void transpose(V& a, V& b, V& c, V& d) {
+    V* r[4] = {&a, &b, &c, &d};
+    for (int i = 0; i < 4; ++i)
+        for (int j = i + 1; j < 4; ++j) {
+            const float t = r[i]->v[j];
+            r[i]->v[j] = r[j]->v[i];
+            r[j]->v[i] = t;
+        }
+}
+inline V reversed(V a) { return {{a.v[3], a.v[2], a.v[1], a.v[0]}}; }
+inline void ldPairs(const float* p, V& re, V& im) {
+    for (int i = 0; i < 4; ++i) { re.v[i] = p[2 * i]; im.v[i] = p[2 * i + 1]; }
+}
+inline void stPairs(float* p, V re, V im) {
+    for (int i = 0; i < 4; ++i) { p[2 * i] = re.v[i]; p[2 * i + 1] = im.v[i]; }
+}
+#endif
+
+// (ar + i ai)(wr + i wi)
+inline void cmul(V ar, V ai, V wr, V wi, V& rr, V& ri) {
+    rr = ar * wr - ai * wi;
+    ri = ar * wi + ai * wr;
+}
+
+// ---- passes -----------------------------------------------------------------
+
+// Input quad c .. c+3 of four streams q apart: lane l is element c + l of
+// the subsequences x[b], x[b + q], x[b + 2q], x[b + 3q].
+struct SplitInput {
+    const float* re;
+    const float* im;
+    void get(int i, V& r, V& m) const { r = ld(re + i); m = ld(im + i); }
+};
+// Complex values packed as re, im pairs (the real transform's input).
+struct PairInput {
+    const float* p;
+    void get(int i, V& r, V& m) const { ldPairs(p + 2 * i, r, m); }
+};
+
+// Bit-reversed gather fused with the 4-point transforms: the transform of
+// subsequence b lands at 4 * rev[b] of the work arrays.
+template <class In>
+void firstPass(const In& in, float* wr, float* wi, int n, const int32_t* rev) {
+    const int q = n >> 2;
+    for (int c = 0; c < q; c += 4) {
+        V g0r, g0i, g1r, g1i, g2r, g2i, g3r, g3i;
+        in.get(c, g0r, g0i);
+        in.get(c + q, g1r, g1i);
+        in.get(c + 2 * q, g2r, g2i);
+        in.get(c + 3 * q, g3r, g3i);
+        const V s02r = g0r + g2r, s02i = g0i + g2i, d02r = g0r - g2r, d02i = g0i - g2i;
+        const V s13r = g1r + g3r, s13i = g1i + g3i, d13r = g1r - g3r, d13i = g1i - g3i;
+        V y0r = s02r + s13r, y0i = s02i + s13i;
+        V y1r = d02r + d13i, y1i = d02i - d13r;  // d02 - i d13
+        V y2r = s02r - s13r, y2i = s02i - s13i;
+        V y3r = d02r - d13i, y3i = d02i + d13r;  // d02 + i d13
+        transpose(y0r, y1r, y2r, y3r);
+        transpose(y0i, y1i, y2i, y3i);
+        const int j0 = 4 * rev[c], j1 = 4 * rev[c + 1], j2 = 4 * rev[c + 2], j3 = 4 * rev[c + 3];
+        st(wr + j0, y0r); st(wi + j0, y0i);
+        st(wr + j1, y1r); st(wi + j1, y1i);
+        st(wr + j2, y2r); st(wi + j2, y2i);
+        st(wr + j3, y3r); st(wi + j3, y3i);
+    }
+}
+
+// Radix 2 over pairs of 4-point transforms; tw = cos[4], sin[4] of -2 pi k / 8.
+void radix2Pass(const float* ir, const float* ii, float* orr, float* oi, int n, const float* tw) {
+    const V wr = ld(tw), wi = ld(tw + 4);
+    for (int b = 0; b < n; b += 8) {
+        const V a0r = ld(ir + b), a0i = ld(ii + b);
+        V tr, ti;
+        cmul(ld(ir + b + 4), ld(ii + b + 4), wr, wi, tr, ti);
+        st(orr + b, a0r + tr); st(oi + b, a0i + ti);
+        st(orr + b + 4, a0r - tr); st(oi + b + 4, a0i - ti);
+    }
+}
+
+// One radix-4 butterfly on lanes p0 .. p0+3 of the four quarters L apart.
+// In bit-reversed order the sub-transform of the odd quarter (residue 1)
+// sits at offset 2L and that of residue 2 at offset L.
+inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, int p0, int L,
+                       V w1r, V w1i, V w2r, V w2i, V w3r, V w3i) {
+    const int p1 = p0 + L, p2 = p1 + L, p3 = p2 + L;
+    const V a0r = ld(ir + p0), a0i = ld(ii + p0);
+    V t1r, t1i, t2r, t2i, t3r, t3i;
+    cmul(ld(ir + p2), ld(ii + p2), w1r, w1i, t1r, t1i);
+    cmul(ld(ir + p1), ld(ii + p1), w2r, w2i, t2r, t2i);
+    cmul(ld(ir + p3), ld(ii + p3), w3r, w3i, t3r, t3i);
+    const V s02r = a0r + t2r, s02i = a0i + t2i, d02r = a0r - t2r, d02i = a0i - t2i;
+    const V s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
+    st(orr + p0, s02r + s13r); st(oi + p0, s02i + s13i);
+    st(orr + p2, s02r - s13r); st(oi + p2, s02i - s13i);
+    st(orr + p1, d02r + d13i); st(oi + p1, d02i - d13r);
+    st(orr + p3, d02r - d13i); st(oi + p3, d02i + d13r);
+}
+
+// Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds, per
+// four k, the lanes of w^k, w^2k, w^3k (re then im), w = exp(-2 pi i / 4L).
+void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, int L,
+                const float* tw) {
+    if (L == 4) {  // one twiddle chunk serves every block: keep it in registers
+        const V w1r = ld(tw), w1i = ld(tw + 4), w2r = ld(tw + 8), w2i = ld(tw + 12);
+        const V w3r = ld(tw + 16), w3i = ld(tw + 20);
+        for (int p0 = 0; p0 < n; p0 += 16) butterfly4(ir, ii, orr, oi, p0, 4, w1r, w1i, w2r, w2i, w3r, w3i);
+        return;
+    }
+    for (int base = 0; base < n; base += 4 * L) {
+        const float* t = tw;
+        for (int k = 0; k < L; k += 4, t += 24)
+            butterfly4(ir, ii, orr, oi, base + k, L, ld(t), ld(t + 4), ld(t + 8), ld(t + 12),
+                       ld(t + 16), ld(t + 20));
+    }
+}
+
+void scaleArray(float* p, int n, float s) {
+    const V v = splat(s);
+    int i = 0;
+    for (; i + 4 <= n; i += 4) st(p + i, ld(p + i) * v);
+    for (; i < n; ++i) p[i] *= s;
+}
+
+// ---- plan and tables -------------------------------------------------------
+
+// Floats of pass twiddles for a complex engine of order m (m >= 4).
+int64_t passTableFloats(int m) {
+    int64_t total = (m & 1) ? 8 : 0;
+    for (int64_t L = (m & 1) ? 8 : 4; L * 4 <= (int64_t(1) << m); L *= 4) total += 6 * L;
+    return total;
+}
+
+void fillPassTables(float* tw, int m) {
+    if (m & 1) {
+        for (int k = 0; k < 4; ++k) {
+            float c, s;
+            unitRoot(k, 8, c, s);
+            tw[k] = c;
+            tw[4 + k] = -s;
+        }
+        tw += 8;
+    }
+    for (int64_t L = (m & 1) ? 8 : 4; L * 4 <= (int64_t(1) << m); L *= 4) {
+        for (int64_t k = 0; k < L; k += 4, tw += 24)
+            for (int j = 1; j <= 3; ++j)
+                for (int l = 0; l < 4; ++l) {
+                    float c, s;
+                    unitRoot(j * (k + l), 4 * L, c, s);
+                    tw[(j - 1) * 8 + l] = c;
+                    tw[(j - 1) * 8 + 4 + l] = -s;
+                }
+    }
+}
+
+void fillBitReverse(int32_t* rev, int bits) {
+    const int32_t n = int32_t(1) << bits;
+    rev[0] = 0;
+    for (int32_t i = 1; i < n; ++i) rev[i] = (rev[i >> 1] >> 1) | ((i & 1) << (bits - 1));
+}
+
+// Runs the complex engine of order m >= 4 (n = 2^m) from `in` into (dr, di),
+// working in (wr, wi): the last pass writes the destination.
+template <class In>
+void runComplex(const FftSpec* s, const In& in, float* wr, float* wi, float* dr, float* di) {
+    const int m = s->cOrder;
+    const int n = 1 << m;
+    firstPass(in, wr, wi, n, s->bitReverse);
+    const float* tw = s->passTw;
+    int L = 4;
+    if (m & 1) {
+        radix2Pass(wr, wi, wr, wi, n, tw);
+        tw += 8;
+        L = 8;
+    }
+    for (; 4 * L <= n; L *= 4) {
+        const bool last = 4 * L == n;
+        radix4Pass(wr, wi, last ? dr : wr, last ? di : wi, n, L, tw);
+        tw += 6 * L;
+    }
+}
+
+// Reference-quality kernels for the shortest lengths (N <= 16), in double.
+// cos(2 pi k / 16)
+constexpr double kCos16[16] = {1.0, 0.9238795325112867, 0.7071067811865476, 0.3826834323650898,
+                               0.0, -0.3826834323650898, -0.7071067811865476, -0.9238795325112867,
+                               -1.0, -0.9238795325112867, -0.7071067811865476, -0.3826834323650898,
+                               0.0, 0.3826834323650898, 0.7071067811865476, 0.9238795325112867};
+
+// X[k] = sum x[t] exp(-2 pi i k t / n) for k = 0 .. kCount - 1; xi may be null (real input).
+void directDft(const float* xr, const float* xi, int n, int kCount, double* outR, double* outI) {
+    const int step = 16 / n;
+    for (int k = 0; k < kCount; ++k) {
+        double ar = 0, ai = 0;
+        for (int t = 0; t < n; ++t) {
+            const int e = (k * t) % n * step;
+            const double c = kCos16[e], sn = kCos16[(e + 12) & 15];  // sin = cos(. - pi/2)
+            const double vr = xr[t], vi = xi ? xi[t] : 0.0;
+            ar += vr * c + vi * sn;
+            ai += vi * c - vr * sn;
+        }
+        outR[k] = ar;
+        outI[k] = ai;
+    }
+}
+
+bool overlaps(const float* a, const float* b, int64_t n) {
+    return a < b + n && b < a + n;
+}
+
+Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const float* si, float* dr,
+                      float* di, uint8_t* pBuffer) {
+    const int order = s->order;
+    const int n = 1 << order;
+    if (order < 4) {
+        double outR[8], outI[8];
+        directDft(sr, si, n, n, outR, outI);
+        const double f = scaled ? s->scale : 1.0;
+        for (int k = 0; k < n; ++k) {
+            dr[k] = static_cast<float>(outR[k]) * static_cast<float>(f);
+            di[k] = static_cast<float>(outI[k]) * static_cast<float>(f);
+        }
+        return StatusOk;
+    }
+    const SplitInput in{sr, si};
+    if (order > kSmallOrder) {
+        uint8_t* own = nullptr;
+        if (!pBuffer) {
+            own = static_cast<uint8_t*>(mem::alignedAlloc(static_cast<uint32_t>(s->bufferSize)));
+            if (!own) return StatusNoMemory;
+            pBuffer = own;
+        }
+        float* w = reinterpret_cast<float*>((reinterpret_cast<uintptr_t>(pBuffer) + 31) & ~uintptr_t(31));
+        runComplex(s, in, w, w + n, dr, di);
+        mem::alignedFree(own);
+    } else if (overlaps(sr, dr, n) || overlaps(sr, di, n) || overlaps(si, dr, n) ||
+               overlaps(si, di, n)) {
+        alignas(16) float w[2 << kSmallOrder];
+        runComplex(s, in, w, w + n, dr, di);
+    } else {
+        runComplex(s, in, dr, di, dr, di);
+    }
+    if (scaled) {
+        scaleArray(dr, n, s->scale);
+        scaleArray(di, n, s->scale);
+    }
+    return StatusOk;
+}
+
+// CCS from the half-length transform Z (zr, zi; m = N/2 values):
+// X[k] = E + T, X[m-k] = conj(E - T) with E = (Z[k] + conj Z[m-k]) / 2,
+// T = w^k (Z[k] - conj Z[m-k]) / 2i.
+void recombine(const FftSpec* s, const float* zr, const float* zi, float* dst, int m) {
+    const float* rc = s->realTwiddles;
+    const float* rs = s->realTwiddles2;
+    const V half = splat(0.5f);
+    for (int k = 1; k <= m / 2; k += 4) {
+        const V ar = ld(zr + k), ai = ld(zi + k);
+        const V br = reversed(ld(zr + m - k - 3)), bi = reversed(ld(zi + m - k - 3));
+        // B = conj Z[m-k]: (br, -bi)
+        const V er = half * (ar + br), ei = half * (ai - bi);
+        const V dr = ar - br, di = ai + bi;
+        const V c = ld(rc + k), sn = ld(rs + k);
+        const V tr = c * di + sn * dr, ti = sn * di - c * dr;
+        stPairs(dst + 2 * k, er + tr, ei + ti);
+        // conj(E - T) for m-k, m-k-1, .. : written in reverse lane order
+        const V xr = reversed(er - tr), xi = reversed(ti - ei);
+        stPairs(dst + 2 * (m - k - 3), xr, xi);
+    }
+    const float r0 = zr[0], i0 = zi[0];
+    dst[0] = r0 + i0;
+    dst[1] = 0.0f;
+    dst[2 * m] = r0 - i0;
+    dst[2 * m + 1] = 0.0f;
+}
+
+Status forwardReal(const FftSpec* s, const float* src, float* dst, uint8_t* pBuffer) {
+    const int order = s->order;
+    const int n = 1 << order;
+    const bool scaled = s->forwardScaled != 0;
+    if (order < 5) {
+        double outR[9], outI[9];
+        directDft(src, nullptr, n, n / 2 + 1, outR, outI);
+        const float f = scaled ? s->scale : 1.0f;
+        for (int k = 0; k <= n / 2; ++k) {
+            dst[2 * k] = static_cast<float>(outR[k]) * f;
+            dst[2 * k + 1] = static_cast<float>(outI[k]) * f;
+        }
+        dst[1] = 0.0f;
+        if (n > 1) dst[n + 1] = 0.0f;
+        return StatusOk;
+    }
+    const int m = n / 2;
+    const PairInput in{src};
+    if (order > kSmallOrder) {
+        uint8_t* own = nullptr;
+        if (!pBuffer) {
+            own = static_cast<uint8_t*>(mem::alignedAlloc(static_cast<uint32_t>(s->bufferSize)));
+            if (!own) return StatusNoMemory;
+            pBuffer = own;
+        }
+        float* w = reinterpret_cast<float*>((reinterpret_cast<uintptr_t>(pBuffer) + 31) & ~uintptr_t(31));
+        runComplex(s, in, w, w + m, w, w + m);
+        recombine(s, w, w + m, dst, m);
+        mem::alignedFree(own);
+    } else {
+        alignas(16) float w[1 << kSmallOrder];
+        runComplex(s, in, w, w + m, w, w + m);
+        recombine(s, w, w + m, dst, m);
+    }
+    if (scaled) scaleArray(dst, n + 2, s->scale);
+    return StatusOk;
+}
+
+Status initSpec(void** ppSpec, int order, int flag, int hint, bool real) {
+    if (!ppSpec) return StatusNullPointer;
+    if (order < 0 || order > kMaxOrder) return StatusBadOrder;
+    if (flag != 1 && flag != 2 && flag != 4 && flag != 8) return StatusBadFlag;
+    const int m = real ? order - 1 : order;  // order of the complex engine
+    const bool engine = real ? order >= 5 : order >= 4;
+    const int64_t n = int64_t(1) << order;
+    // Layout of the one block: record, bit-reversal table, pass twiddles,
+    // real twiddles; each part starts on 32 bytes.
+    auto up32 = [](int64_t b) { return (b + 31) & ~int64_t(31); };
+    const int64_t head = up32(sizeof(FftSpec));
+    const int64_t revBytes = engine ? up32((int64_t(1) << (m - 2)) * 4) : 0;
+    const int64_t passBytes = engine ? up32(passTableFloats(m) * 4) : 0;
+    const int64_t realCount = (real && engine) ? n / 4 + 4 : 0;
+    const int64_t realBytes = up32(realCount * 4);
+    const int64_t total = head + revBytes + passBytes + 2 * realBytes;
+    const int64_t buffer = order > kSmallOrder ? (real ? n : 2 * n) * 4 + 64 : 0;
+    // Sizes that the 32-bit record fields cannot express are as good as an
+    // allocation failure.
+    if (total > 0x7FFFFFFF || buffer > 0x7FFFFFFF) return StatusNoMemory;
+    uint8_t* block = static_cast<uint8_t*>(mem::alignedAlloc(static_cast<uint32_t>(total)));
+    if (!block) return StatusNoMemory;
+
+    FftSpec* s = reinterpret_cast<FftSpec*>(block);
+    std::memset(s, 0, sizeof(FftSpec));
+    s->id = real ? kIdReal : kIdComplex;
+    s->order = order;
+    s->forwardScaled = (flag == 1 || flag == 4) ? 1 : 0;
+    s->inverseScaled = (flag == 2 || flag == 4) ? 1 : 0;
+    s->scale = flag == 4 ? static_cast<float>(1.0 / std::sqrt(static_cast<double>(n)))
+             : flag == 8 ? 1.0f
+                         : static_cast<float>(1.0 / static_cast<double>(n));
+    s->hint = static_cast<uint32_t>(hint);
+    s->bufferSize = static_cast<int32_t>(buffer);
+    s->allocated = 1;
+    s->cOrder = m;
+    s->twiddles = kQuarterSine;
+    if (engine) {
+        int32_t* rev = reinterpret_cast<int32_t*>(block + head);
+        fillBitReverse(rev, m - 2);
+        s->bitReverse = rev;
+        float* pass = reinterpret_cast<float*>(block + head + revBytes);
+        fillPassTables(pass, m);
+        s->passTw = pass;
+        if (m > kSmallOrder) s->twiddles = pass;
+        if (real) {
+            float* rc = reinterpret_cast<float*>(block + head + revBytes + passBytes);
+            float* rs = rc + realBytes / 4;
+            for (int64_t k = 0; k < realCount; ++k) {
+                float c, sn;
+                unitRoot(k, n, c, sn);
+                rc[k] = 0.5f * c;
+                rs[k] = -0.5f * sn;
+            }
+            s->realTwiddles = rc;
+            s->realTwiddles2 = rs;
+        }
+    }
+    *ppSpec = s;
+    return StatusOk;
+}
+
+Status freeSpec(void* pSpec, int32_t id) {
+    if (!pSpec) return StatusNullPointer;
+    FftSpec* s = static_cast<FftSpec*>(pSpec);
+    if (s->id != id) return StatusContextMismatch;
+    s->id = 0;  // a second free is then refused rather than releasing twice
+    mem::alignedFree(s);
+    return StatusOk;
+}
+
+Status complexCall(const float* sr, const float* si, float* dr, float* di, const void* pSpec,
+                   uint8_t* pBuffer, bool inverse) {
+    if (!pSpec) return StatusNullPointer;
+    const FftSpec* s = static_cast<const FftSpec*>(pSpec);
+    if (s->id != kIdComplex) return StatusContextMismatch;
+    if (Status st = anyNull(sr, si, dr, di)) return st;
+    // The inverse transform is the forward one on swapped parts.
+    if (inverse) return forwardComplex(s, s->inverseScaled != 0, si, sr, di, dr, pBuffer);
+    return forwardComplex(s, s->forwardScaled != 0, sr, si, dr, di, pBuffer);
+}
+
+}  // namespace
+
+Status ZOR_CALL zorsFFTInitAlloc_C_32f(void** ppSpec, int order, int flag, int hint) {
+    return initSpec(ppSpec, order, flag, hint, false);
+}
+
+Status ZOR_CALL zorsFFTInitAlloc_R_32f(void** ppSpec, int order, int flag, int hint) {
+    return initSpec(ppSpec, order, flag, hint, true);
+}
+
+Status ZOR_CALL zorsFFTFree_C_32f(void* pSpec) { return freeSpec(pSpec, kIdComplex); }
+Status ZOR_CALL zorsFFTFree_R_32f(void* pSpec) { return freeSpec(pSpec, kIdReal); }
+
+Status ZOR_CALL zorsFFTFwd_CToC_32f(const float* pSrcRe, const float* pSrcIm, float* pDstRe,
+                                    float* pDstIm, const void* pSpec, uint8_t* pBuffer) {
+    return complexCall(pSrcRe, pSrcIm, pDstRe, pDstIm, pSpec, pBuffer, false);
+}
+
+Status ZOR_CALL zorsFFTInv_CToC_32f(const float* pSrcRe, const float* pSrcIm, float* pDstRe,
+                                    float* pDstIm, const void* pSpec, uint8_t* pBuffer) {
+    return complexCall(pSrcRe, pSrcIm, pDstRe, pDstIm, pSpec, pBuffer, true);
+}
+
+Status ZOR_CALL zorsFFTFwd_RToCCS_32f(const float* pSrc, float* pDst, const void* pSpec,
+                                      uint8_t* pBuffer) {
+    if (!pSpec) return StatusNullPointer;
+    const FftSpec* s = static_cast<const FftSpec*>(pSpec);
+    if (s->id != kIdReal) return StatusContextMismatch;
+    if (Status st = anyNull(pSrc, pDst)) return st;
+    return forwardReal(s, pSrc, pDst, pBuffer);
+}
+
+}}  // namespace zor::ZOR_NS
