@@ -13,6 +13,7 @@
 // after it (a plateau keeps its left or upper pixel); along diagonals it must
 // beat both.
 #include "frame/variant.h"
+#include "frame/rows.h"
 #include "frame/status.h"
 
 #include <climits>
@@ -22,14 +23,6 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-template <class T>
-inline const T* rowAt(const T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<const T*>(reinterpret_cast<const uint8_t*>(base) + row * step);
-}
-template <class T>
-inline T* rowAt(T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<T*>(reinterpret_cast<uint8_t*>(base) + row * step);
-}
 
 // Stack coordinates fit 16 bits unless a padded side reaches 65535.
 inline bool wideCoordinates(ImageSize roi) {

@@ -15,6 +15,7 @@
 // The 16s integer form scales the kernel by the float reciprocal of the
 // divisor and runs the float-kernel 16s filter.
 #include "frame/variant.h"
+#include "frame/rows.h"
 #include "frame/fpu.h"
 #include "frame/memory.h"
 #include "frame/status.h"
@@ -45,14 +46,6 @@ inline Walk walkOf(ImageSize kernelSize, ImagePoint anchor, int channels) {
             static_cast<ptrdiff_t>(kernelSize.height) - 1 - anchor.y};
 }
 
-template <class T>
-inline const T* rowAt(const T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<const T*>(reinterpret_cast<const uint8_t*>(base) + row * step);
-}
-template <class T>
-inline T* rowAt(T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<T*>(reinterpret_cast<uint8_t*>(base) + row * step);
-}
 
 inline int64_t rowSamples(int width, int kernelWidth, int channels) {
     return (static_cast<int64_t>(width) + kernelWidth - 1) * channels;

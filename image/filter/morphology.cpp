@@ -7,6 +7,7 @@
 // computed.  The 3x3 forms are the case ay = 1 (two buffers); the masked
 // forms use ay + 1 buffers.  The caller supplies the border pixels.
 #include "frame/variant.h"
+#include "frame/rows.h"
 #include "frame/memory.h"
 #include "frame/status.h"
 #include "image/filter/extreme3x3.h"
@@ -18,10 +19,6 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-template <class T>
-inline T* rowAt(T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<T*>(reinterpret_cast<uint8_t*>(base) + row * step);
-}
 
 struct MaxOp {
     template <class T>

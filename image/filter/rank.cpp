@@ -12,6 +12,7 @@
 // Maximum and minimum are separable: a row pass over the mW values of each
 // neighbourhood row into a ring of mH rows, then a column pass over the ring.
 #include "frame/variant.h"
+#include "frame/rows.h"
 #include "frame/memory.h"
 #include "frame/status.h"
 #include "image/filter/extreme3x3.h"
@@ -24,14 +25,6 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-template <class T>
-inline const T* rowAt(const T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<const T*>(reinterpret_cast<const uint8_t*>(base) + row * step);
-}
-template <class T>
-inline T* rowAt(T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<T*>(reinterpret_cast<uint8_t*>(base) + row * step);
-}
 
 Status checkRank(const void* src, int srcStep, const void* dst, int dstStep, ImageSize roi,
                  ImageSize mask, ImagePoint anchor, bool oddOnly) {

@@ -19,6 +19,7 @@
 // ROI; the border forms read only the ROI and synthesise the rest in the
 // caller's buffer (border types documented in zor_manifest.h).
 #include "frame/variant.h"
+#include "frame/rows.h"
 #include "frame/fpu.h"
 #include "frame/memory.h"
 #include "frame/status.h"
@@ -46,14 +47,6 @@ SobelKernel sobelKernel(Dir dir, int size) {
                             : SobelKernel{5, {1, 4, 6, 4, 1}, {-1, -2, 0, 2, 1}};
 }
 
-template <class T>
-inline const T* rowAt(const T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<const T*>(reinterpret_cast<const uint8_t*>(base) + row * step);
-}
-template <class T>
-inline T* rowAt(T* base, int step, ptrdiff_t row) {
-    return reinterpret_cast<T*>(reinterpret_cast<uint8_t*>(base) + row * step);
-}
 
 // ---- row pass: s points at column 0 and is readable from -r to w - 1 + r ----------
 

@@ -10,17 +10,10 @@
 #include <type_traits>
 
 #include "frame/abi.h"
+#include "frame/rows.h"
 #include "zor.h"
 
 namespace zor { inline namespace ZOR_INLINE_NS {
-
-// Row y of an image: steps are signed byte distances and are used as given,
-// so a zero step repeats the first row and a negative one walks upwards.
-template <class T>
-inline T* rowAt(T* p, int step, int y) {
-    using Byte = std::conditional_t<std::is_const_v<T>, const uint8_t, uint8_t>;
-    return reinterpret_cast<T*>(reinterpret_cast<Byte*>(p) + static_cast<ptrdiff_t>(y) * step);
-}
 
 // A region whose rows follow each other without gaps on every side is one
 // long row: rowsOf() gives the elements per row to process and the number of
