@@ -32,8 +32,12 @@ public:
     void ReportRuns(const std::vector<Run>& runs) override {
         ConsoleReporter::ReportRuns(runs);
         for (const Run& r : runs) {
-            if (r.error_occurred || r.run_type != Run::RT_Iteration) continue;
-            const std::string name = r.benchmark_name();
+            if (r.error_occurred) continue;
+            // With repetitions, the median stands for the workload; without,
+            // the single measurement does.
+            const bool median = r.run_type == Run::RT_Aggregate && r.aggregate_name == "median";
+            if (r.run_type != Run::RT_Iteration && !median) continue;
+            const std::string name = r.run_name.str();
             const auto slash = name.rfind('/');
             if (slash == std::string::npos) continue;
             auto it = pairs().find(name.substr(0, slash));
