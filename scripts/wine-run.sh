@@ -4,7 +4,7 @@
 set -eu
 export WINEDEBUG=-all
 export WINEDLLOVERRIDES="mscoree,mshtml=;winemenubuilder.exe=d"
-export WINEPREFIX="${ZOR_WINEPREFIX:-$HOME/.zor-wine32}"
+export WINEPREFIX="${ZOR_WINEPREFIX:-${HOME:-/tmp}/.zor-wine32}"
 export WINEARCH=win32
 if [ ! -f "$WINEPREFIX/system.reg" ]; then
   wineboot --init >/dev/null 2>&1 || true
