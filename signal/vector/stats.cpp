@@ -237,6 +237,17 @@ int extremeIndex(const T* s, int n) {
     return extremeIndexScalar<T, Max>(s, n);
 }
 
+// The extreme value, and optionally its first index (a null pIndx is allowed:
+// then only the value is reported).
+template <class T, bool Max>
+Status extremeOf(const T* pSrc, int len, T* pValue, int* pIndx = nullptr) {
+    if (Status s = checkFirst(anyNull(pSrc, pValue), badLength(len))) return s;
+    const int k = extremeIndex<T, Max>(pSrc, len);
+    *pValue = pSrc[k];
+    if (pIndx) *pIndx = k;
+    return StatusOk;
+}
+
 // ---- exact integer sums ------------------------------------------------------------
 
 #if ZOR_SIMD >= 2
@@ -362,29 +373,16 @@ Status ZOR_CALL zorsStdDev_32f(const float* pSrc, int len, float* pStdDev, int h
 }
 
 Status ZOR_CALL zorsMax_16s(const int16_t* pSrc, int len, int16_t* pMax) {
-    if (Status s = checkFirst(anyNull(pSrc, pMax), badLength(len))) return s;
-    *pMax = pSrc[extremeIndex<int16_t, true>(pSrc, len)];
-    return StatusOk;
+    return extremeOf<int16_t, true>(pSrc, len, pMax);
 }
 Status ZOR_CALL zorsMax_64f(const double* pSrc, int len, double* pMax) {
-    if (Status s = checkFirst(anyNull(pSrc, pMax), badLength(len))) return s;
-    *pMax = pSrc[extremeIndex<double, true>(pSrc, len)];
-    return StatusOk;
+    return extremeOf<double, true>(pSrc, len, pMax);
 }
-// A null pIndx is allowed: then only the maximum is reported.
 Status ZOR_CALL zorsMaxIndx_16s(const int16_t* pSrc, int len, int16_t* pMax, int* pIndx) {
-    if (Status s = checkFirst(anyNull(pSrc, pMax), badLength(len))) return s;
-    const int k = extremeIndex<int16_t, true>(pSrc, len);
-    *pMax = pSrc[k];
-    if (pIndx) *pIndx = k;
-    return StatusOk;
+    return extremeOf<int16_t, true>(pSrc, len, pMax, pIndx);
 }
 Status ZOR_CALL zorsMaxIndx_64f(const double* pSrc, int len, double* pMax, int* pIndx) {
-    if (Status s = checkFirst(anyNull(pSrc, pMax), badLength(len))) return s;
-    const int k = extremeIndex<double, true>(pSrc, len);
-    *pMax = pSrc[k];
-    if (pIndx) *pIndx = k;
-    return StatusOk;
+    return extremeOf<double, true>(pSrc, len, pMax, pIndx);
 }
 
 Status ZOR_CALL zorsNorm_L2_32f(const float* pSrc, int len, float* pNorm) {
@@ -408,21 +406,13 @@ Status ZOR_CALL zorsDotProd_32f(const float* pSrc1, const float* pSrc2, int len,
 #endif  // ZOR_VARIANT != 1
 
 Status ZOR_CALL zorsMax_32f(const float* pSrc, int len, float* pMax) {
-    if (Status s = checkFirst(anyNull(pSrc, pMax), badLength(len))) return s;
-    *pMax = pSrc[extremeIndex<float, true>(pSrc, len)];
-    return StatusOk;
+    return extremeOf<float, true>(pSrc, len, pMax);
 }
 Status ZOR_CALL zorsMin_32f(const float* pSrc, int len, float* pMin) {
-    if (Status s = checkFirst(anyNull(pSrc, pMin), badLength(len))) return s;
-    *pMin = pSrc[extremeIndex<float, false>(pSrc, len)];
-    return StatusOk;
+    return extremeOf<float, false>(pSrc, len, pMin);
 }
 Status ZOR_CALL zorsMaxIndx_32f(const float* pSrc, int len, float* pMax, int* pIndx) {
-    if (Status s = checkFirst(anyNull(pSrc, pMax), badLength(len))) return s;
-    const int k = extremeIndex<float, true>(pSrc, len);
-    *pMax = pSrc[k];
-    if (pIndx) *pIndx = k;
-    return StatusOk;
+    return extremeOf<float, true>(pSrc, len, pMax, pIndx);
 }
 
 #if ZOR_VARIANT != 1
