@@ -193,3 +193,43 @@ ZB_PAIR(iir4, "zorsIIR_32f order 4, 64 Ki samples", zorIir, loopIir,
         "plain double direct form loop -O2", 1.0);
 ZB_PAIR(randgauss, "zorsRandGauss_32f 64 Ki samples", zorGauss, stdGauss,
         "std::normal_distribution<float> + std::mt19937", 0.5);
+
+// ---- autocorrelation -------------------------------------------------------------
+
+namespace {
+
+// The plain loop: every lag summed in double.
+__attribute__((noinline)) void directAutoCorr(const float* x, int n, float* r, int lags) {
+    for (int k = 0; k < lags; ++k) {
+        double acc = 0;
+        for (int i = 0; i + k < n; ++i) acc += double(x[i]) * double(x[i + k]);
+        r[k] = static_cast<float>(acc);
+    }
+}
+
+template <int Len, int Lags>
+void zorAutoCorr(benchmark::State& state) {
+    const auto x = noise(Len, 7);
+    std::vector<float> r(Lags);
+    for (auto _ : state) {
+        zorsAutoCorr_32f(x.data(), Len, r.data(), Lags);
+        benchmark::ClobberMemory();
+    }
+}
+
+template <int Len, int Lags>
+void loopAutoCorr(benchmark::State& state) {
+    const auto x = noise(Len, 7);
+    std::vector<float> r(Lags);
+    for (auto _ : state) {
+        directAutoCorr(x.data(), Len, r.data(), Lags);
+        benchmark::ClobberMemory();
+    }
+}
+
+}  // namespace
+
+ZB_PAIR(autocorr_short, "zorsAutoCorr_32f 400 samples, 13 lags", (zorAutoCorr<400, 13>),
+        (loopAutoCorr<400, 13>), "plain double loop -O2", 0);
+ZB_PAIR(autocorr_long, "zorsAutoCorr_32f 4096 samples, 4096 lags", (zorAutoCorr<4096, 4096>),
+        (loopAutoCorr<4096, 4096>), "plain double loop -O2", 0);
