@@ -34,13 +34,13 @@ struct GaussState {
 struct Generator {
     uint32_t lcg, a, b, c, borrow;
 
-    // One pair of uniforms in (-1, 1).
-    void pair(double& u1, double& u2) {
+    // One pair of raw words; u1 and u2 are these read as signed, times kUnit.
+    void pair(int32_t& w1, int32_t& w2) {
         const uint32_t m = lcg * 69069u;
         const uint32_t t = b - c + borrow;
         const uint32_t top = t >> 31;
         const uint32_t tp = top ? t - 18u : t;
-        u1 = kUnit * static_cast<double>(static_cast<int32_t>(tp + m + 1013904243u));
+        w1 = static_cast<int32_t>(tp + m + 1013904243u);
         const uint32_t s = a - b - top;
         uint32_t an;
         if (static_cast<int32_t>(s) < 0) {
@@ -54,9 +54,47 @@ struct Generator {
         b = tp;
         a = an;
         lcg = m * 69069u + 924302730u;  // two congruential steps at once
-        u2 = kUnit * static_cast<double>(static_cast<int32_t>(a + lcg));
+        w2 = static_cast<int32_t>(a + lcg);
     }
 };
+
+constexpr int kBatch = 64;
+
+// Appends to (u1s, u2s, qs) from position got the pairs accepted among the
+// next n drawn (n <= kBatch), returning the new count.  Every drawn pair is
+// consumed, accepted or not, so drawing only as many as are still missing
+// never draws past the last one needed.
+int drawAccepted(Generator& g, int n, double* u1s, double* u2s, double* qs, int got) {
+    int32_t w1[kBatch], w2[kBatch];
+    for (int j = 0; j < n; ++j) g.pair(w1[j], w2[j]);
+    int j = 0;
+#if ZOR_SIMD >= 2
+    const __m128d unit = _mm_set1_pd(kUnit), one = _mm_set1_pd(1.0), zero = _mm_setzero_pd();
+    for (; j + 2 <= n; j += 2) {
+        const __m128d u1 = _mm_mul_pd(unit, _mm_cvtepi32_pd(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(w1 + j))));
+        const __m128d u2 = _mm_mul_pd(unit, _mm_cvtepi32_pd(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(w2 + j))));
+        const __m128d q = _mm_add_pd(_mm_mul_pd(u1, u1), _mm_mul_pd(u2, u2));
+        const int ok = _mm_movemask_pd(_mm_and_pd(_mm_cmplt_pd(q, one), _mm_cmpneq_pd(q, zero)));
+        _mm_storel_pd(u1s + got, u1);
+        _mm_storel_pd(u2s + got, u2);
+        _mm_storel_pd(qs + got, q);
+        got += ok & 1;
+        _mm_storeh_pd(u1s + got, u1);
+        _mm_storeh_pd(u2s + got, u2);
+        _mm_storeh_pd(qs + got, q);
+        got += ok >> 1;
+    }
+#endif
+    for (; j < n; ++j) {
+        const double u1 = toDouble(kUnit * w1[j]), u2 = toDouble(kUnit * w2[j]);
+        const double q = toDouble(toDouble(u1 * u1) + toDouble(u2 * u2));
+        u1s[got] = u1;
+        u2s[got] = u2;
+        qs[got] = q;
+        got += (q < 1.0) & (q != 0.0);
+    }
+    return got;
+}
 
 }  // namespace
 
@@ -94,24 +132,17 @@ Status ZOR_CALL zorsRandGauss_32f(float* pDst, int len, void* pState) {
         pDst[i++] = toFloat(toDouble(sd * st->pendingFactor) * st->pendingUniform + mean);
         st->needPair = 1;
     }
-    // Pairs in batches: draw the accepted uniforms first (acceptance
-    // without a branch), then the logarithms and roots, which no longer
-    // wait on one another, then the values.
-    constexpr int kBatch = 64;
-    double u1s[kBatch], u2s[kBatch], qs[kBatch];
+    // Pairs in batches: the raw words first (the generator's own chain
+    // alone), then the uniforms and the acceptance without a branch, then
+    // the logarithms and roots, which do not wait on one another, then the
+    // values.  A slot past the accepted ones may be overwritten by a rejected
+    // pair, hence one spare.
+    double u1s[kBatch + 1], u2s[kBatch + 1], qs[kBatch + 1];
     while (i < len) {
         const int remaining = (len - i + 1) / 2;
         const int want = remaining < kBatch ? remaining : kBatch;
         int got = 0;
-        while (got < want) {
-            double u1, u2;
-            g.pair(u1, u2);
-            const double q = toDouble(toDouble(u1 * u1) + toDouble(u2 * u2));
-            u1s[got] = u1;
-            u2s[got] = u2;
-            qs[got] = q;
-            got += (q < 1.0) & (q != 0.0);
-        }
+        while (got < want) got = drawAccepted(g, want - got, u1s, u2s, qs, got);
         double fs[kBatch];
         for (int t = 0; t < want; ++t) fs[t] = toDouble(-2.0 * std::log(qs[t]));
         int t = 0;
