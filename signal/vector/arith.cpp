@@ -349,52 +349,153 @@ inline float lnElement(float x, Status& first) {
     return toFloat(std::log(static_cast<double>(x)));
 }
 
+// The logarithm and the arctangent run as table-driven approximations in
+// double whose relative error has a proven bound far below the float
+// precision.  The float that the standard library's result (correct to
+// within an ulp) rounds to is then known, unless the approximation lies
+// within that bound of a rounding midpoint between two floats: such
+// elements (about one in ten thousand) are recomputed with the library.
+
 #if ZOR_SIMD >= 2
-// Both ends of y -/+ |y| 2^-40 round to the same float in every lane.  The
-// approximations below are accurate to far better than 2^-40 relative, the
-// standard library to 2^-52, so then the library's result rounds to the
-// same float as the approximation.
-inline bool roundingDecided(__m128d y0, __m128d y1) {
-    const __m128d absMask = _mm_castsi128_pd(_mm_set1_epi64x(0x7FFFFFFFFFFFFFFFll));
-    const __m128d rel = _mm_set1_pd(0x1p-40);
-    const __m128d t0 = _mm_mul_pd(_mm_and_pd(y0, absMask), rel);
-    const __m128d t1 = _mm_mul_pd(_mm_and_pd(y1, absMask), rel);
-    const __m128 lo = _mm_movelh_ps(_mm_cvtpd_ps(_mm_sub_pd(y0, t0)), _mm_cvtpd_ps(_mm_sub_pd(y1, t1)));
-    const __m128 hi = _mm_movelh_ps(_mm_cvtpd_ps(_mm_add_pd(y0, t0)), _mm_cvtpd_ps(_mm_add_pd(y1, t1)));
-    return _mm_movemask_ps(_mm_cmpeq_ps(lo, hi)) == 0xF;
+// Lanes (of the four doubles y0[0], y0[1], y1[0], y1[1], normal-range float
+// values) that lie within Margin double ulps of a float rounding midpoint.
+// A double rounds to float by its 29 low mantissa bits: the midpoints are
+// where those read 2^28, so the low 32 bits of each double decide.  The
+// midpoint below a power of two (whose float neighbour below is closer) lies
+// 2^27 ulps away, beyond any Margin used here.
+template <int Margin>
+inline __m128i nearMidpoint(__m128d y0, __m128d y1) {
+    static_assert(Margin > 0 && Margin < (1 << 26), "margin must stay inside one float ulp");
+    const __m128i low = _mm_castps_si128(
+        _mm_shuffle_ps(_mm_castpd_ps(y0), _mm_castpd_ps(y1), _MM_SHUFFLE(2, 0, 2, 0)));
+    const __m128i off = _mm_and_si128(_mm_add_epi32(low, _mm_set1_epi32(Margin - (1 << 28))),
+                                      _mm_set1_epi32(0x1FFFFFFF));
+    return _mm_cmplt_epi32(off, _mm_set1_epi32(2 * Margin));
 }
 
-// log(c) and 1/c for c = 1 + k/128, k = 0..128, interleaved.
-struct LnTable {
-    alignas(16) double e[129][2];
-    LnTable() {
-        for (int k = 0; k <= 128; ++k) {
-            const double c = 1.0 + k / 128.0;
-            e[k][0] = 1.0 / c;
-            e[k][1] = k == 128 ? 0x1.62e42fefa39efp-1 : std::log(c);  // log 2 as below, so log(1 - tiny) cancels exactly
-        }
-    }
+inline __m128d loadRow(const void* table, int byteOffset) {
+    return _mm_load_pd(reinterpret_cast<const double*>(static_cast<const char*>(table) + byteOffset));
+}
+
+// ---- logarithm ----
+//
+// x = 2^e m with m within 2^-9 of c = 1 + k/256 (m may be just below 1, the
+// rounding to the nearest c having carried into the exponent), so that
+// log x = e log 2 + log c + log(1 + r), r = (m - c)/c, |r| <= 2^-9, and
+// log(1 + r) = r - r^2/2 + r^3/3 - r^4/4 to within |r|^5/5.
+//
+// Error: where e = k = 0 the result is log(1 + r) itself, to within
+// |r|^4/5 < 2^-38.3 relative.  Elsewhere |log x| >= 2^-10 and the truncation
+// is below 2^-47.3, 2^-37.3 relative; e log 2 + log c, exact where it
+// cancels (e = -1, c near 2: Sterbenz), adds a few 2^-53 relative.  So the
+// approximation is within 2^-37.2 |log x|: 2^15.8 double ulps.  With the
+// library's own ulp, a margin of 2^17 ulps is safe with room to spare.
+constexpr int kLnMargin = 1 << 17;
+
+constexpr double kLogC[256] = {
+    0x0.0p+0, 0x1.ff00aa2b10bc0p-9, 0x1.fe02a6b106789p-8, 0x1.7dc475f810a77p-7,
+    0x1.fc0a8b0fc03e4p-7, 0x1.3cea44346a575p-6, 0x1.7b91b07d5b11bp-6, 0x1.b9fc027af9198p-6,
+    0x1.f829b0e783300p-6, 0x1.1b0d98923d980p-5, 0x1.39e87b9febd60p-5, 0x1.58a5bafc8e4d5p-5,
+    0x1.77458f632dcfcp-5, 0x1.95c830ec8e3ebp-5, 0x1.b42dd711971bfp-5, 0x1.d276b8adb0b52p-5,
+    0x1.f0a30c01162a6p-5, 0x1.075983598e471p-4, 0x1.16536eea37ae1p-4, 0x1.253f62f0a1417p-4,
+    0x1.341d7961bd1d1p-4, 0x1.42edcbea646f0p-4, 0x1.51b073f06183fp-4, 0x1.60658a93750c4p-4,
+    0x1.6f0d28ae56b4cp-4, 0x1.7da766d7b12cdp-4, 0x1.8c345d6319b21p-4, 0x1.9ab42462033adp-4,
+    0x1.a926d3a4ad563p-4, 0x1.b78c82bb0eda1p-4, 0x1.c5e548f5bc743p-4, 0x1.d4313d66cb35dp-4,
+    0x1.e27076e2af2e6p-4, 0x1.f0a30c01162a6p-4, 0x1.fec9131dbeabbp-4, 0x1.0671512ca596ep-3,
+    0x1.0d77e7cd08e59p-3, 0x1.14785846742acp-3, 0x1.1b72ad52f67a0p-3, 0x1.2266f190a5acbp-3,
+    0x1.29552f81ff523p-3, 0x1.303d718e47fd3p-3, 0x1.371fc201e8f74p-3, 0x1.3dfc2b0ecc62ap-3,
+    0x1.44d2b6ccb7d1ep-3, 0x1.4ba36f39a55e5p-3, 0x1.526e5e3a1b438p-3, 0x1.59338d9982086p-3,
+    0x1.5ff3070a793d4p-3, 0x1.66acd4272ad51p-3, 0x1.6d60fe719d21dp-3, 0x1.740f8f54037a5p-3,
+    0x1.7ab890210d909p-3, 0x1.815c0a14357ebp-3, 0x1.87fa06520c911p-3, 0x1.8e928de886d41p-3,
+    0x1.9525a9cf456b4p-3, 0x1.9bb362e7dfb83p-3, 0x1.a23bc1fe2b563p-3, 0x1.a8becfc882f19p-3,
+    0x1.af3c94e80bff3p-3, 0x1.b5b519e8fb5a4p-3, 0x1.bc286742d8cd6p-3, 0x1.c2968558c18c1p-3,
+    0x1.c8ff7c79a9a22p-3, 0x1.cf6354e09c5dcp-3, 0x1.d5c216b4fbb91p-3, 0x1.dc1bca0abec7dp-3,
+    0x1.e27076e2af2e6p-3, 0x1.e8c0252aa5a60p-3, 0x1.ef0adcbdc5936p-3, 0x1.f550a564b7b37p-3,
+    0x1.fb9186d5e3e2bp-3, 0x1.00e6c45ad501dp-2, 0x1.0402594b4d041p-2, 0x1.071b85fcd590dp-2,
+    0x1.0a324e27390e3p-2, 0x1.0d46b579ab74bp-2, 0x1.1058bf9ae4ad5p-2, 0x1.136870293a8b0p-2,
+    0x1.1675cababa60ep-2, 0x1.1980d2dd4236fp-2, 0x1.1c898c16999fbp-2, 0x1.1f8ff9e48a2f3p-2,
+    0x1.22941fbcf7966p-2, 0x1.2596010df763ap-2, 0x1.2895a13de86a3p-2, 0x1.2b9303ab89d25p-2,
+    0x1.2e8e2bae11d31p-2, 0x1.31871c9544185p-2, 0x1.347dd9a987d55p-2, 0x1.3772662bfd85bp-2,
+    0x1.3a64c556945eap-2, 0x1.3d54fa5c1f710p-2, 0x1.404308686a7e4p-2, 0x1.432ef2a04e814p-2,
+    0x1.4618bc21c5ec2p-2, 0x1.49006804009d1p-2, 0x1.4be5f957778a1p-2, 0x1.4ec973260026ap-2,
+    0x1.51aad872df82dp-2, 0x1.548a2c3add263p-2, 0x1.5767717455a6cp-2, 0x1.5a42ab0f4cfe2p-2,
+    0x1.5d1bdbf5809cap-2, 0x1.5ff3070a793d4p-2, 0x1.62c82f2b9c795p-2, 0x1.659b57303e1f3p-2,
+    0x1.686c81e9b14afp-2, 0x1.6b3bb2235943ep-2, 0x1.6e08eaa2ba1e4p-2, 0x1.70d42e2789236p-2,
+    0x1.739d7f6bbd007p-2, 0x1.7664e1239dbcfp-2, 0x1.792a55fdd47a2p-2, 0x1.7bede0a37afc0p-2,
+    0x1.7eaf83b82afc3p-2, 0x1.816f41da0d496p-2, 0x1.842d1da1e8b17p-2, 0x1.86e919a330ba0p-2,
+    0x1.89a3386c1425bp-2, 0x1.8c5b7c858b48bp-2, 0x1.8f11e873662c7p-2, 0x1.91c67eb45a83ep-2,
+    0x1.947941c2116fbp-2, 0x1.972a341135158p-2, 0x1.99d958117e08bp-2, 0x1.9c86b02dc0863p-2,
+    0x1.9f323ecbf984cp-2, 0x1.a1dc064d5b995p-2, 0x1.a484090e5bb0ap-2, 0x1.a72a4966bd9eap-2,
+    0x1.a9cec9a9a084ap-2, 0x1.ac718c258b0e4p-2, 0x1.af1293247786bp-2, 0x1.b1b1e0ebdfc5bp-2,
+    0x1.b44f77bcc8f63p-2, 0x1.b6eb59d3cf35ep-2, 0x1.b9858969310fbp-2, 0x1.bc1e08b0dad0ap-2,
+    0x1.beb4d9da71b7cp-2, 0x1.c149ff115f027p-2, 0x1.c3dd7a7cdad4dp-2, 0x1.c66f4e3ff6ff8p-2,
+    0x1.c8ff7c79a9a22p-2, 0x1.cb8e0744d7acap-2, 0x1.ce1af0b85f3ebp-2, 0x1.d0a63ae721e64p-2,
+    0x1.d32fe7e00ebd5p-2, 0x1.d5b7f9ae2c684p-2, 0x1.d83e7258a2f3ep-2, 0x1.dac353e2c5954p-2,
+    0x1.dd46a04c1c4a1p-2, 0x1.dfc859906d5b5p-2, 0x1.e24881a7c6c26p-2, 0x1.e4c71a8687704p-2,
+    0x1.e744261d68788p-2, 0x1.e9bfa659861f5p-2, 0x1.ec399d2468cc0p-2, 0x1.eeb20c640ddf4p-2,
+    0x1.f128f5faf06edp-2, 0x1.f39e5bc811e5cp-2, 0x1.f6123fa7028acp-2, 0x1.f884a36fe9ec2p-2,
+    0x1.faf588f78f31fp-2, 0x1.fd64f20f61572p-2, 0x1.ffd2e0857f498p-2, 0x1.011fab125ff8ap-1,
+    0x1.02552a5a5d0ffp-1, 0x1.0389eefce633bp-1, 0x1.04bdf9da926d2p-1, 0x1.05f14bd26459cp-1,
+    0x1.0723e5c1cdf40p-1, 0x1.0855c884b450ep-1, 0x1.0986f4f573521p-1, 0x1.0ab76bece14d2p-1,
+    0x1.0be72e4252a83p-1, 0x1.0d163ccb9d6b8p-1, 0x1.0e44985d1cc8cp-1, 0x1.0f7241c9b497dp-1,
+    0x1.109f39e2d4c97p-1, 0x1.11cb81787ccf8p-1, 0x1.12f719593efbcp-1, 0x1.1422025243d45p-1,
+    0x1.154c3d2f4d5eap-1, 0x1.1675cababa60ep-1, 0x1.179eabbd899a1p-1, 0x1.18c6e0ff5cf06p-1,
+    0x1.19ee6b467c96fp-1, 0x1.1b154b57da29fp-1, 0x1.1c3b81f713c25p-1, 0x1.1d610fe677003p-1,
+    0x1.1e85f5e7040d0p-1, 0x1.1faa34b87094cp-1, 0x1.20cdcd192ab6ep-1, 0x1.21f0bfc65beecp-1,
+    0x1.23130d7bebf43p-1, 0x1.2434b6f483934p-1, 0x1.2555bce98f7cbp-1, 0x1.26762013430e0p-1,
+    0x1.2795e1289b11bp-1, 0x1.28b500df60783p-1, 0x1.29d37fec2b08bp-1, 0x1.2af15f02640adp-1,
+    0x1.2c0e9ed448e8cp-1, 0x1.2d2b4012edc9ep-1, 0x1.2e47436e40268p-1, 0x1.2f62a99509546p-1,
+    0x1.307d7334f10bep-1, 0x1.3197a0fa7fe6ap-1, 0x1.32b1339121d71p-1, 0x1.33ca2ba328995p-1,
+    0x1.34e289d9ce1d3p-1, 0x1.35fa4edd36ea0p-1, 0x1.37117b54747b6p-1, 0x1.38280fe58797fp-1,
+    0x1.393e0d3562a1ap-1, 0x1.3a5373e7ebdfap-1, 0x1.3b68449fffc23p-1, 0x1.3c7c7fff73206p-1,
+    0x1.3d9026a7156fbp-1, 0x1.3ea33936b2f5cp-1, 0x1.3fb5b84d16f42p-1, 0x1.40c7a4880dce9p-1,
+    0x1.41d8fe84672aep-1, 0x1.42e9c6ddf80bfp-1, 0x1.43f9fe2f9ce67p-1, 0x1.4509a5133bb0ap-1,
+    0x1.4618bc21c5ec2p-1, 0x1.472743f33aaadp-1, 0x1.48353d1ea88dfp-1, 0x1.4942a83a2fc07p-1,
+    0x1.4a4f85db03ebbp-1, 0x1.4b5bd6956e274p-1, 0x1.4c679afccee3ap-1, 0x1.4d72d3a39fd00p-1,
+    0x1.4e7d811b75bb1p-1, 0x1.4f87a3f5026e9p-1, 0x1.50913cc01686bp-1, 0x1.519a4c0ba3446p-1,
+    0x1.52a2d265bc5abp-1, 0x1.53aad05b99b7dp-1, 0x1.54b2467999498p-1, 0x1.55b9354b40bcdp-1,
+    0x1.56bf9d5b3f399p-1, 0x1.57c57f336f191p-1, 0x1.58cadb5cd7989p-1, 0x1.59cfb25fae87ep-1,
+    0x1.5ad404c359f2dp-1, 0x1.5bd7d30e71c73p-1, 0x1.5cdb1dc6c1765p-1, 0x1.5ddde57149923p-1,
+    0x1.5ee02a9241675p-1, 0x1.5fe1edad18919p-1, 0x1.60e32f44788d9p-1, 0x1.61e3efda46467p-1,
 };
-const LnTable& lnTable() {
-    static const LnTable t;
+constexpr double kLn2 = 0x1.62e42fefa39efp-1;
+
+struct LnRow {
+    double inv, logc;
+};
+struct LnTable {
+    alignas(16) LnRow row[256];
+};
+constexpr LnTable makeLnTable() {
+    LnTable t{};
+    for (int k = 0; k < 256; ++k) t.row[k] = LnRow{1.0 / (1.0 + k / 256.0), kLogC[k]};
     return t;
 }
+// 1/c rounds the same at compile time on every platform (IEEE division).
+constexpr LnTable kLnTable = makeLnTable();
 
-// log of two positive normal floats, given as e (unbiased exponent), d = m - c
-// (exact in float, |d| <= 2^-8) and the table rows k.
-inline __m128d lnPair(const LnTable& t, __m128i e, __m128 d, int k0, int k1) {
-    const __m128d r0 = _mm_load_pd(t.e[k0]), r1 = _mm_load_pd(t.e[k1]);
-    const __m128d inv = _mm_unpacklo_pd(r0, r1), logc = _mm_unpackhi_pd(r0, r1);
-    const __m128d r = _mm_mul_pd(_mm_cvtps_pd(d), inv);  // |r| <= 2^-8
-    // log(1 + r) to degree 6: the remainder r^7/7 is below 2^-50 |r|.
-    __m128d p = _mm_set1_pd(-1.0 / 6);
-    p = _mm_add_pd(_mm_mul_pd(p, r), _mm_set1_pd(1.0 / 5));
-    p = _mm_add_pd(_mm_mul_pd(p, r), _mm_set1_pd(-0.25));
-    p = _mm_add_pd(_mm_mul_pd(p, r), _mm_set1_pd(1.0 / 3));
-    p = _mm_add_pd(_mm_mul_pd(p, r), _mm_set1_pd(-0.5));
-    p = _mm_mul_pd(_mm_add_pd(_mm_mul_pd(p, r), _mm_set1_pd(1.0)), r);
-    const __m128d ln2 = _mm_set1_pd(0x1.62e42fefa39efp-1);
-    return _mm_add_pd(_mm_add_pd(_mm_mul_pd(_mm_cvtepi32_pd(e), ln2), logc), p);
+// Byte offset of the table row for the float with bits u (k * sizeof(LnRow)),
+// formed in general registers: it starts the longest dependency chain of
+// the loop, and that way it needs neither the vector unit nor a transfer
+// out of it.
+inline int lnRowOffset(const float* p) {
+    uint32_t u;
+    std::memcpy(&u, p, 4);
+    return static_cast<int>(((u + 0x4000u) >> (15 - 4)) & 0xFF0u);
+}
+
+// log x for two lanes: e as integers, d = m - c (exact in float), table rows
+// at the byte offsets o0, o1.  The polynomial is evaluated in a split form
+// for a shorter dependency chain.
+inline __m128d lnPair(__m128i e, __m128 d, int o0, int o1) {
+    const __m128d row0 = loadRow(kLnTable.row, o0), row1 = loadRow(kLnTable.row, o1);
+    const __m128d r = _mm_mul_pd(_mm_cvtps_pd(d), _mm_unpacklo_pd(row0, row1));
+    const __m128d hi = _mm_add_pd(_mm_mul_pd(_mm_cvtepi32_pd(e), _mm_set1_pd(kLn2)), _mm_unpackhi_pd(row0, row1));
+    const __m128d r2 = _mm_mul_pd(r, r);
+    // r + r2 (a + b) with a = r/3 - 1/2 and b = -r2/4 computed side by side.
+    const __m128d a = _mm_add_pd(_mm_mul_pd(r, _mm_set1_pd(1.0 / 3)), _mm_set1_pd(-0.5));
+    const __m128d b = _mm_mul_pd(r2, _mm_set1_pd(-0.25));
+    return _mm_add_pd(_mm_add_pd(hi, r), _mm_mul_pd(r2, _mm_add_pd(a, b)));
 }
 #endif
 
@@ -402,27 +503,28 @@ inline __m128d lnPair(const LnTable& t, __m128i e, __m128 d, int k0, int k1) {
     Status first = StatusOk;
     int i = 0;
 #if ZOR_SIMD >= 2
-    const LnTable& t = lnTable();
+    const __m128i one = _mm_set1_epi32(0x3F800000);
     for (; i + 4 <= n; i += 4) {
         const __m128i u = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i));
-        // Positive normal finite floats only; everything else element by element.
-        const __m128i ok = _mm_and_si128(_mm_cmpgt_epi32(u, _mm_set1_epi32(0x007FFFFF)),
-                                         _mm_cmplt_epi32(u, _mm_set1_epi32(0x7F800000)));
-        if (_mm_movemask_epi8(ok) == 0xFFFF) {
-            const __m128i mant = _mm_and_si128(u, _mm_set1_epi32(0x007FFFFF));
-            const __m128i k = _mm_srli_epi32(_mm_add_epi32(mant, _mm_set1_epi32(0x8000)), 16);
-            const __m128i e = _mm_sub_epi32(_mm_srli_epi32(u, 23), _mm_set1_epi32(127));
-            const __m128 m = _mm_castsi128_ps(_mm_or_si128(mant, _mm_set1_epi32(0x3F800000)));
-            const __m128 c = _mm_castsi128_ps(_mm_add_epi32(_mm_slli_epi32(k, 16), _mm_set1_epi32(0x3F800000)));
-            const __m128 d = _mm_sub_ps(m, c);  // exact: m and c are within 2^-8 of each other
-            alignas(16) int32_t ks[4];
-            _mm_store_si128(reinterpret_cast<__m128i*>(ks), k);
-            const __m128d y0 = lnPair(t, e, d, ks[0], ks[1]);
-            const __m128d y1 = lnPair(t, _mm_shuffle_epi32(e, 0xEE), _mm_movehl_ps(d, d), ks[2], ks[3]);
-            if (roundingDecided(y0, y1)) {
-                _mm_storeu_ps(p + i, _mm_movelh_ps(_mm_cvtpd_ps(y0), _mm_cvtpd_ps(y1)));
-                continue;
-            }
+        // Round the mantissa to 8 bits: a carry moves into the exponent.
+        // Lanes other than positive normal finite floats compute garbage
+        // harmlessly and are redone element by element.
+        const __m128i t = _mm_add_epi32(u, _mm_set1_epi32(0x4000));
+        const __m128i expo = _mm_and_si128(t, _mm_set1_epi32(0x7F800000));
+        const __m128i kbits = _mm_and_si128(t, _mm_set1_epi32(0x007F8000));
+        const __m128 m = _mm_castsi128_ps(_mm_add_epi32(_mm_sub_epi32(u, expo), one));
+        const __m128 d = _mm_sub_ps(m, _mm_castsi128_ps(_mm_or_si128(kbits, one)));
+        const __m128i e = _mm_sub_epi32(_mm_srli_epi32(expo, 23), _mm_set1_epi32(127));
+        const __m128d y0 = lnPair(e, d, lnRowOffset(p + i), lnRowOffset(p + i + 1));
+        const __m128d y1 = lnPair(_mm_shuffle_epi32(e, 0xEE), _mm_movehl_ps(d, d),
+                                  lnRowOffset(p + i + 2), lnRowOffset(p + i + 3));
+        // Not a positive normal finite float: u outside [0x00800000,
+        // 0x7F800000), tested as one signed compare.
+        const __m128i special = _mm_cmpgt_epi32(_mm_add_epi32(u, _mm_set1_epi32(0x7F800000)),
+                                                _mm_set1_epi32(-0x01000001));
+        if (_mm_movemask_epi8(_mm_or_si128(special, nearMidpoint<kLnMargin>(y0, y1))) == 0) {
+            _mm_storeu_ps(p + i, _mm_movelh_ps(_mm_cvtpd_ps(y0), _mm_cvtpd_ps(y1)));
+            continue;
         }
         for (int j = i; j < i + 4; ++j) p[j] = lnElement(p[j], first);
     }
@@ -440,44 +542,71 @@ inline float atan2Element(float y, float x) {
 }
 
 #if ZOR_SIMD >= 2
-// atan(k/32), k = 0..32.
-struct AtanTable {
-    double v[33];
-    AtanTable() {
-        for (int k = 0; k <= 32; ++k) v[k] = std::atan(k / 32.0);
-    }
+// With num = min(|y|, |x|), den = max(|y|, |x|), t = num/den in [0, 1] and
+// c = k/64 within 2^-6.9 of t (k from a float estimate of t):
+//   atan(t) = atan(c) + atan(z),  z = (num - c den) / (den + c num),
+// where num - c den and den + c num are exact in double, so z is the
+// correctly rounded quotient, |z| <= 2^-6.9, and atan(z) = z - z^3/3 + z^5/5
+// to within |z|^7/7, 2^-44.2 relative.  The octant (|y| > |x|) and the side
+// (x < 0) select base and sign:
+//   atan2(|y|, x) = base + sigma atan(t) = T + atan(sigma z),
+// with T = base + sigma atan(c) from a table per octant and k, and sigma
+// applied to num and c; the sign of y is applied last (atan2 is odd
+// in y).  T is within 2^-52 relative and never cancels against atan(z) by
+// more than a factor 3: the whole is within 2^-43.5 relative, 2^9.5 double
+// ulps; margin 2^13.
+constexpr int kPhaseMargin = 1 << 13;
+
+constexpr double kAtanK[65] = {
+    0x0.0p+0, 0x1.fff555bbb729bp-7, 0x1.ffd55bba97625p-6, 0x1.7fb818430da2ap-5,
+    0x1.ff55bb72cfdeap-5, 0x1.3f59f0e7c559dp-4, 0x1.7ee182602f10fp-4, 0x1.be39ebe6f07c3p-4,
+    0x1.fd5ba9aac2f6ep-4, 0x1.1e1fafb043727p-3, 0x1.3d6eee8c6626cp-3, 0x1.5c9811e3ec26ap-3,
+    0x1.7b97b4bce5b02p-3, 0x1.9a6a8e96c8626p-3, 0x1.b90d7529260a2p-3, 0x1.d77d5df205736p-3,
+    0x1.f5b75f92c80ddp-3, 0x1.09dc597d86362p-2, 0x1.18bf5a30bf178p-2, 0x1.278372057ef46p-2,
+    0x1.362773707ebccp-2, 0x1.44aa436c2af0ap-2, 0x1.530ad9951cd4ap-2, 0x1.614840309cfe2p-2,
+    0x1.6f61941e4def1p-2, 0x1.7d5604b63b3f7p-2, 0x1.8b24d394a1b25p-2, 0x1.98cd5454d6b18p-2,
+    0x1.a64eec3cc23fdp-2, 0x1.b3a911da65c6cp-2, 0x1.c0db4c94ec9f0p-2, 0x1.cde53432c1351p-2,
+    0x1.dac670561bb4fp-2, 0x1.e77eb7f175a34p-2, 0x1.f40dd0b541418p-2, 0x1.0039c73c1a40cp-1,
+    0x1.0657e94db30d0p-1, 0x1.0c6145b5b43dap-1, 0x1.1255d9bfbd2a9p-1, 0x1.1835a88be7c13p-1,
+    0x1.1e00babdefeb4p-1, 0x1.23b71e2cc9e6ap-1, 0x1.2958e59308e31p-1, 0x1.2ee628406cbcap-1,
+    0x1.345f01cce37bbp-1, 0x1.39c391cd4171ap-1, 0x1.3f13fb89e96f4p-1, 0x1.445065b795b56p-1,
+    0x1.4978fa3269ee1p-1, 0x1.4e8de5bb6ec04p-1, 0x1.538f57b89061fp-1, 0x1.587d81f732fbbp-1,
+    0x1.5d58987169b18p-1, 0x1.6220d115d7b8ep-1, 0x1.66d663923e087p-1, 0x1.6b798920b3d99p-1,
+    0x1.700a7c5784634p-1, 0x1.748978fba8e0fp-1, 0x1.78f6bbd5d315ep-1, 0x1.7d528289fa093p-1,
+    0x1.819d0b7158a4dp-1, 0x1.85d69576cc2c5p-1, 0x1.89ff5ff57f1f8p-1, 0x1.8e17aa99cc05ep-1,
+    0x1.921fb54442d18p-1,
 };
-const AtanTable& atanTable() {
-    static const AtanTable t;
+constexpr double kPi = 0x1.921fb54442d18p+1, kHalfPi = 0x1.921fb54442d18p+0;
+
+// T for row (steep + 2 left) * 128 + k: steep for |y| > |x|, left for x < 0.
+// Rows with k above 64 are never used for results (zero); they keep the
+// loads of lanes that are recomputed anyway inside the table.
+struct PhaseTable {
+    alignas(16) double base[4 * 128];
+};
+constexpr PhaseTable makePhaseTable() {
+    PhaseTable t{};
+    for (int oct = 0; oct < 4; ++oct) {
+        const bool steep = oct & 1, left = oct & 2;
+        const double base = steep ? kHalfPi : left ? kPi : 0.0;
+        const double sigma = steep != left ? -1.0 : 1.0;
+        for (int k = 0; k <= 64; ++k) t.base[oct * 128 + k] = base + sigma * kAtanK[k];
+    }
     return t;
 }
+constexpr PhaseTable kPhaseTable = makePhaseTable();
 
-// atan2(y, x) for two pairs of finite non-zero floats (widened to double).
-inline __m128d atan2Pair(const AtanTable& t, __m128d y, __m128d x, __m128i k) {
-    const __m128d absMask = _mm_castsi128_pd(_mm_set1_epi64x(0x7FFFFFFFFFFFFFFFll));
-    const __m128d ay = _mm_and_pd(y, absMask), ax = _mm_and_pd(x, absMask);
-    const __m128d num = _mm_min_pd(ay, ax), den = _mm_max_pd(ay, ax);
-    // t = num/den in [0, 1]; with c = k/32 close to t,
-    // atan(t) = atan(c) + atan((t - c) / (1 + t c)) = atan(c) + atan((num - c den) / (den + c num)).
-    const __m128d c = _mm_mul_pd(_mm_cvtepi32_pd(k), _mm_set1_pd(1.0 / 32));
-    const __m128d dd = _mm_div_pd(_mm_sub_pd(num, _mm_mul_pd(c, den)), _mm_add_pd(den, _mm_mul_pd(c, num)));
-    const __m128d d2 = _mm_mul_pd(dd, dd);
-    // |dd| < 2^-5.9: atan to degree 7, the remainder d^9/9 below 2^-50 |dd|.
-    __m128d q = _mm_set1_pd(-1.0 / 7);
-    q = _mm_add_pd(_mm_mul_pd(q, d2), _mm_set1_pd(1.0 / 5));
-    q = _mm_sub_pd(_mm_mul_pd(q, d2), _mm_set1_pd(1.0 / 3));
-    q = _mm_add_pd(_mm_mul_pd(_mm_mul_pd(q, d2), dd), dd);
-    alignas(16) int32_t ks[4];
-    _mm_store_si128(reinterpret_cast<__m128i*>(ks), k);
-    __m128d r = _mm_add_pd(_mm_set_pd(t.v[ks[1]], t.v[ks[0]]), q);
-    // Octant and quadrant: |y| > |x| reflects about pi/4, x < 0 about pi/2.
-    const __m128d steep = _mm_cmpgt_pd(ay, ax);
-    r = _mm_or_pd(_mm_andnot_pd(steep, r),
-                  _mm_and_pd(steep, _mm_sub_pd(_mm_set1_pd(0x1.921fb54442d18p+0), r)));
-    const __m128d left = _mm_cmplt_pd(x, _mm_setzero_pd());
-    r = _mm_or_pd(_mm_andnot_pd(left, r),
-                  _mm_and_pd(left, _mm_sub_pd(_mm_set1_pd(0x1.921fb54442d18p+1), r)));
-    return _mm_or_pd(r, _mm_andnot_pd(absMask, y));  // the sign of y
+inline double phaseBase(int row) { return kPhaseTable.base[row]; }
+
+// Two lanes of atan(z) with snum = sigma num, den and sc = sigma c as floats
+// (widened exactly), plus T.
+inline __m128d phasePair(__m128 snum, __m128 den, __m128 sc, int row0, int row1) {
+    const __m128d c = _mm_cvtps_pd(sc), nd = _mm_cvtps_pd(snum), dd = _mm_cvtps_pd(den);
+    const __m128d z = _mm_div_pd(_mm_sub_pd(nd, _mm_mul_pd(c, dd)), _mm_add_pd(dd, _mm_mul_pd(c, nd)));
+    const __m128d z2 = _mm_mul_pd(z, z);
+    const __m128d q = _mm_add_pd(_mm_mul_pd(z2, _mm_set1_pd(1.0 / 5)), _mm_set1_pd(-1.0 / 3));
+    const __m128d t = _mm_set_pd(phaseBase(row1), phaseBase(row0));
+    return _mm_add_pd(_mm_add_pd(t, z), _mm_mul_pd(_mm_mul_pd(z, z2), q));
 }
 #endif
 
@@ -485,32 +614,39 @@ inline __m128d atan2Pair(const AtanTable& t, __m128d y, __m128d x, __m128i k) {
 [[maybe_unused]] void atan2Vec(const float* py, const float* px, float* d, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    const AtanTable& t = atanTable();
-    const __m128i absMask = _mm_set1_epi32(0x7FFFFFFF);
+    const __m128i signBit = _mm_set1_epi32(INT32_MIN);
     for (; i + 4 <= n; i += 4) {
-        const __m128 yf = _mm_loadu_ps(py + i), xf = _mm_loadu_ps(px + i);
-        const __m128i ya = _mm_and_si128(_mm_castps_si128(yf), absMask);
-        const __m128i xa = _mm_and_si128(_mm_castps_si128(xf), absMask);
-        // Zeros, infinities and NaNs take the library's own rules.
-        const __m128i z = _mm_setzero_si128();
-        const __m128i special = _mm_or_si128(
-            _mm_or_si128(_mm_cmpeq_epi32(ya, z), _mm_cmpeq_epi32(xa, z)),
-            _mm_or_si128(_mm_cmpgt_epi32(ya, _mm_set1_epi32(0x7F7FFFFF)),
-                         _mm_cmpgt_epi32(xa, _mm_set1_epi32(0x7F7FFFFF))));
-        if (_mm_movemask_epi8(special) == 0) {
-            // The table row from a float estimate of the ratio; any row within
-            // one of the nearest keeps |dd| small enough.
-            const __m128 yaf = _mm_castsi128_ps(ya), xaf = _mm_castsi128_ps(xa);
-            const __m128 tf = _mm_div_ps(_mm_min_ps(yaf, xaf), _mm_max_ps(yaf, xaf));
-            const __m128i k = _mm_cvtps_epi32(_mm_mul_ps(tf, _mm_set1_ps(32.0f)));
-            const __m128d r0 = atan2Pair(t, _mm_cvtps_pd(yf), _mm_cvtps_pd(xf), k);
-            const __m128d r1 = atan2Pair(t, _mm_cvtps_pd(_mm_movehl_ps(yf, yf)),
-                                         _mm_cvtps_pd(_mm_movehl_ps(xf, xf)),
-                                         _mm_shuffle_epi32(k, 0xEE));
-            if (roundingDecided(r0, r1)) {
-                _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(r0), _mm_cvtpd_ps(r1)));
-                continue;
-            }
+        const __m128i yb = _mm_loadu_si128(reinterpret_cast<const __m128i*>(py + i));
+        const __m128i xb = _mm_loadu_si128(reinterpret_cast<const __m128i*>(px + i));
+        const __m128i ya = _mm_andnot_si128(signBit, yb), xa = _mm_andnot_si128(signBit, xb);
+        // A NaN in either makes num (x's) or den (y's) NaN.
+        const __m128 num = _mm_min_ps(_mm_castsi128_ps(ya), _mm_castsi128_ps(xa));
+        const __m128 den = _mm_max_ps(_mm_castsi128_ps(xa), _mm_castsi128_ps(ya));
+        // t + 2^17 rounds t to a multiple of 1/64: the low bits hold k, and
+        // subtracting 2^17 again leaves c = k/64 exactly.  The reciprocal
+        // estimate (12 bits) keeps |t - c| <= 2^-7 + 2^-11.4 and k <= 64.
+        const __m128 tk = _mm_add_ps(_mm_mul_ps(num, _mm_rcp_ps(den)), _mm_set1_ps(0x1p17f));
+        const __m128i steep = _mm_cmpgt_epi32(ya, xa);  // positive floats order as integers
+        const __m128i left = _mm_srai_epi32(xb, 31);
+        const __m128i row = _mm_or_si128(_mm_and_si128(_mm_castps_si128(tk), _mm_set1_epi32(127)),
+                                         _mm_or_si128(_mm_and_si128(steep, _mm_set1_epi32(128)),
+                                                      _mm_and_si128(left, _mm_set1_epi32(256))));
+        const __m128 sigma = _mm_castsi128_ps(_mm_slli_epi32(_mm_xor_si128(steep, left), 31));
+        const __m128 snum = _mm_xor_ps(num, sigma);
+        const __m128 sc = _mm_xor_ps(_mm_sub_ps(tk, _mm_set1_ps(0x1p17f)), sigma);
+        const __m128d r0 = phasePair(snum, den, sc, _mm_extract_epi16(row, 0), _mm_extract_epi16(row, 2));
+        const __m128d r1 = phasePair(_mm_movehl_ps(snum, snum), _mm_movehl_ps(den, den), _mm_movehl_ps(sc, sc),
+                                     _mm_extract_epi16(row, 4), _mm_extract_epi16(row, 6));
+        // Both magnitudes must lie in [2^-60, 2^60): zeros, infinities, NaNs
+        // and extreme ratios (a result below the normal floats, a reciprocal
+        // estimate out of range) are left to the library, like results near
+        // a rounding midpoint.
+        const __m128 special = _mm_or_ps(_mm_cmpnle_ps(_mm_set1_ps(0x1p-60f), num),
+                                         _mm_cmpnlt_ps(den, _mm_set1_ps(0x1p60f)));
+        if (_mm_movemask_ps(_mm_or_ps(special, _mm_castsi128_ps(nearMidpoint<kPhaseMargin>(r0, r1)))) == 0) {
+            const __m128 r = _mm_movelh_ps(_mm_cvtpd_ps(r0), _mm_cvtpd_ps(r1));
+            _mm_storeu_ps(d + i, _mm_or_ps(r, _mm_castsi128_ps(_mm_and_si128(yb, signBit))));
+            continue;
         }
         for (int j = i; j < i + 4; ++j) d[j] = atan2Element(py[j], px[j]);
     }
@@ -603,11 +739,57 @@ inline void swapAt(float* a, int i, int j) {
     a[j] = t;
 }
 
+// The partition of a descending quicksort about pivot, as the classic
+// two-scan loop
+//     i = lo, j = hi;
+//     for (;;) { do ++i; while (a[i] > pivot); do --j; while (pivot > a[j]);
+//                if (i >= j) break; swap(a[i], a[j]); }
+// does it, same swaps and same j (so equal elements such as -0 and +0 end
+// where that loop leaves them), returning j.  Between the last pair swapped
+// (l, r) the scans meet only original values, and l, r themselves (holding
+// swapped values) stop the opposite scan; so the stops are found in blocks
+// with branch-free loops, and the next i is min(next left stop, r), the
+// next j max(next right stop, l).  Blocks are clipped at r and l so that
+// they read original values only.
+inline int partitionDescend(float* a, int lo, int hi, float pivot) {
+    constexpr int kBlock = 64;
+    int lstop[kBlock], rstop[kBlock];
+    int ln = 0, lk = 0, rn = 0, rk = 0;
+    int lscan = lo + 1, rscan = hi - 1;  // next positions to scan
+    int l = lo, r = hi;                  // last swapped pair
+    for (;;) {
+        while (lk == ln && lscan < r) {
+            const int end = lscan + kBlock < r ? lscan + kBlock : r;
+            lk = ln = 0;
+            for (int p = lscan; p < end; ++p) {
+                lstop[ln] = p;
+                ln += !(a[p] > pivot);
+            }
+            lscan = end;
+        }
+        while (rk == rn && rscan > l) {
+            const int end = rscan - kBlock > l ? rscan - kBlock : l;
+            rk = rn = 0;
+            for (int q = rscan; q > end; --q) {
+                rstop[rn] = q;
+                rn += !(pivot > a[q]);
+            }
+            rscan = end;
+        }
+        const int i = lk < ln && lstop[lk] < r ? lstop[lk] : r;
+        const int j = rk < rn && rstop[rk] > l ? rstop[rk] : l;
+        if (i >= j) return j;
+        swapAt(a, i, j);
+        l = i;
+        r = j;
+        ++lk;
+        ++rk;
+    }
+}
+
 // Descending quicksort without recursion: median-of-three pivot, the larger
 // part stacked and the smaller one done first (so 32 entries cover any int
-// length), short runs finished by selection sort.  Every scan stops at an
-// element that does not compare past the pivot (the pivot itself, then the
-// last swapped pair), so NaNs cannot run it off the partition.
+// length), short runs finished by selection sort.
 void sortDescend(float* a, int n) {
     struct Range { int lo, hi; };
     Range stack[32];
@@ -621,14 +803,7 @@ void sortDescend(float* a, int n) {
                 swapAt(a, mid, hi);
                 if (a[mid] > a[lo]) swapAt(a, lo, mid);
             }
-            const float pivot = a[mid];
-            int i = lo, j = hi;
-            for (;;) {
-                do ++i; while (a[i] > pivot);
-                do --j; while (pivot > a[j]);
-                if (i >= j) break;
-                swapAt(a, i, j);
-            }
+            const int j = partitionDescend(a, lo, hi, a[mid]);
             // [lo, j] holds the larger elements, [j + 1, hi] the smaller.
             if (j - lo < hi - j) {
                 stack[top++] = Range{j + 1, hi};

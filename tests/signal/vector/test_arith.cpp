@@ -8,6 +8,7 @@
 #include <functional>
 #include <limits>
 #include <random>
+#include <sstream>
 #include <vector>
 
 #include "tests/support/guarded.h"
@@ -699,6 +700,133 @@ TEST_P(VecMath, ArctangentQuadrantsAndAccuracy) {
     EXPECT_LE(worst, 1);
 }
 
+namespace {
+// The double result rounded to double (a volatile store: the x87 unit may
+// return more) and then once to float.
+float roundedLog(float x) {
+    volatile double d = std::log(static_cast<double>(x));
+    return static_cast<float>(d);
+}
+float roundedAtan2(float y, float x) {
+    volatile double d = std::atan2(static_cast<double>(y), static_cast<double>(x));
+    return static_cast<float>(d);
+}
+
+#if defined(_WIN32)
+constexpr int kSweep = 1 << 16;  // emulated: keep the suite quick
+#else
+constexpr int kSweep = 1 << 20;
+#endif
+
+// Finds the first element whose bits differ from want's.
+::testing::AssertionResult bitsEqual(const std::vector<float>& got, const std::vector<float>& want,
+                                     const std::vector<float>& in1, const std::vector<float>* in2 = nullptr) {
+    for (size_t i = 0; i < got.size(); ++i)
+        if (bitsOf(got[i]) != bitsOf(want[i])) {
+            std::ostringstream m;
+            m << std::hexfloat << "input " << in1[i];
+            if (in2) m << ", " << (*in2)[i];
+            m << ": got " << got[i] << ", want " << want[i];
+            return ::testing::AssertionFailure() << m.str();
+        }
+    return ::testing::AssertionSuccess();
+}
+}  // namespace
+
+// Against the library's double logarithm rounded to float, bit for bit, over
+// random bit patterns of every positive float and the places where the
+// approximation changes table row (mantissa low bits around 0x4000), powers
+// of two, the neighbourhood of 1 and the ends of the range.
+TEST_P(VecMath, LogarithmMatchesRoundedLibraryOverManyInputs) {
+    const Api& z = this->z();
+    std::vector<float> src;
+    std::mt19937 rng(2024);
+    std::uniform_int_distribution<uint32_t> any(1, 0x7F7FFFFF);
+    for (int i = 0; i < kSweep; ++i) src.push_back(floatOf(any(rng)));
+    for (uint32_t e : {1u, 60u, 125u, 126u, 127u, 128u, 200u, 254u})
+        for (uint32_t k = 0; k < 256; ++k)
+            for (int j = -2; j <= 2; ++j) src.push_back(floatOf((e << 23) | (k << 15) | uint32_t(0x4000 + j)));
+    for (uint32_t e = 1; e < 255; ++e)
+        for (int j = -3; j <= 3; ++j) src.push_back(floatOf((e << 23) + uint32_t(j)));
+    for (int j = 1; j <= 40000; ++j) {
+        src.push_back(floatOf(0x3F800000u + uint32_t(j)));
+        src.push_back(floatOf(0x3F800000u - uint32_t(j)));
+    }
+    src.push_back(floatOf(0x7F7FFFFFu));
+    src.push_back(floatOf(1u));
+    // Logarithms within a few dozen double ulps of a float rounding midpoint
+    // (where the fast approximation must defer to the library), and the one
+    // float whose logarithm the approximation alone would round wrongly.
+    for (uint32_t u : {0x01b5b6ffu, 0x01f100d0u, 0x022ae487u, 0x02ae0decu, 0x02c7a933u, 0x031c2829u,
+                       0x039656e7u, 0x03b0ffa6u, 0x03d2f29fu, 0x03f22eecu, 0x04294560u, 0x04366d72u,
+                       0x65d890d3u})
+        for (int rep = 0; rep < 4; ++rep) src.insert(src.begin() + 4 * rep + 1, floatOf(u));
+    std::vector<float> want(src.size());
+    for (size_t i = 0; i < src.size(); ++i) want[i] = roundedLog(src[i]);
+    std::vector<float> got = src;
+    ASSERT_EQ(z.zorsLn_32f_I(got.data(), static_cast<int>(got.size())), StatusOk);
+    EXPECT_TRUE(bitsEqual(got, want, src));
+}
+
+// Against the library's double atan2 rounded to float, bit for bit: random
+// bit patterns (zeros, infinities and NaNs included), magnitudes within
+// 2^+-60 of each other in every quadrant, ratios next to the table points
+// k/64 (and next to 1, where the octants meet), small integers.
+TEST_P(VecMath, PhaseMatchesRoundedLibraryOverManyInputs) {
+    const Api& z = this->z();
+    std::mt19937_64 rng(99);
+    const int n = kSweep / 2;
+    std::vector<float> y(n), x(n);
+    for (int i = 0; i < n; ++i) {
+        const uint64_t b = rng();
+        switch (i % 4) {
+            case 0:
+                y[i] = floatOf(uint32_t(b));
+                x[i] = floatOf(uint32_t(b >> 32));
+                break;
+            case 1:
+                y[i] = floatOf((uint32_t(b) & 0x807FFFFFu) | (uint32_t(97 + (b >> 24) % 60) << 23));
+                x[i] = floatOf((uint32_t(b >> 32) & 0x807FFFFFu) | (uint32_t(97 + (b >> 56) % 60) << 23));
+                break;
+            case 2: {
+                const float m = floatOf((uint32_t(b) & 0x007FFFFFu) | (uint32_t(110 + (b >> 24) % 40) << 23));
+                const float t = float((b >> 32) % 65) / 64.0f + float(int((b >> 40) % 2001) - 1000) * 0x1p-30f;
+                y[i] = m * t * ((b >> 60) & 1 ? -1.0f : 1.0f);
+                x[i] = (b >> 61) & 1 ? -m : m;
+                if ((b >> 62) & 1) std::swap(y[i], x[i]);
+                break;
+            }
+            default:
+                y[i] = float(int(b % 2001) - 1000);
+                x[i] = float(int((b >> 20) % 2001) - 1000);
+        }
+    }
+    // Pairs whose atan2 lies within a few hundred double ulps of a float
+    // rounding midpoint, in every lane position.
+    const uint32_t hard[][2] = {{0x35d1e46f, 0xbfcb1f45}, {0xbf89d3ac, 0x329300c5}, {0x36c2cff3, 0x4b42ea0b},
+                                {0x479a92e3, 0x3e55d3b3}, {0x4b63aab7, 0xc15fdf6b}, {0xb6108402, 0xbeb7ffb1},
+                                {0x467d87d0, 0x48b569af}, {0xb9c38785, 0xb5dffcb2}, {0xb9d18983, 0x336b8d4d},
+                                {0xb2fdd19e, 0x36c9fe93}, {0xb719abcf, 0xc20797ec}, {0x4b4e6eaa, 0x3e5c2cff}};
+    int at = 5;
+    for (const auto& h : hard) {
+        y[at] = floatOf(h[0]);
+        x[at] = floatOf(h[1]);
+        at += 9;
+    }
+    std::vector<float> want(n), got(n), a21(n);
+    for (int i = 0; i < n; ++i) want[i] = roundedAtan2(y[i], x[i]);
+    ASSERT_EQ(z.zorsPhase_32f(x.data(), y.data(), got.data(), n), StatusOk);
+    ASSERT_EQ(z.zorsAtan2_32f_A21(y.data(), x.data(), a21.data(), n), StatusOk);
+    // NaN results: any NaN will do.
+    for (int i = 0; i < n; ++i)
+        if (want[i] != want[i]) {
+            EXPECT_TRUE(got[i] != got[i] && a21[i] != a21[i]);
+            got[i] = a21[i] = want[i];
+        }
+    EXPECT_TRUE(bitsEqual(got, want, y, &x));
+    EXPECT_TRUE(bitsEqual(a21, want, y, &x));
+}
+
 TEST_P(VecMath, MagnitudePowerAndNormalizeInDouble) {
     const Api& z = this->z();
     const float re[4] = {3, -5, 1e30f, 1e-30f}, im[4] = {4, 12, 1e30f, 0};
@@ -757,6 +885,78 @@ TEST_P(VecSortSplit, SortsDescending) {
     const auto out = g.get(3001);
     EXPECT_EQ(std::count_if(out.begin(), out.end(), [](float f) { return std::isnan(f); }),
               std::count_if(w.begin(), w.end(), [](float f) { return std::isnan(f); }));
+}
+
+namespace {
+// The documented sort written plainly: median of three, the classic two-scan
+// partition, the larger part stacked, runs of 9 or fewer finished by
+// selection of the smallest to the end.  Equal elements (-0 and +0) and NaNs
+// end where this sequence of swaps leaves them.
+void referenceSortDescend(float* a, int n) {
+    struct Range { int lo, hi; };
+    std::vector<Range> stack;
+    int lo = 0, hi = n - 1;
+    for (;;) {
+        while (hi - lo + 1 > 9) {
+            const int mid = lo + (hi - lo) / 2;
+            if (a[mid] > a[lo]) std::swap(a[lo], a[mid]);
+            if (a[hi] > a[mid]) {
+                std::swap(a[mid], a[hi]);
+                if (a[mid] > a[lo]) std::swap(a[lo], a[mid]);
+            }
+            const float pivot = a[mid];
+            int i = lo, j = hi;
+            for (;;) {
+                do ++i; while (a[i] > pivot);
+                do --j; while (pivot > a[j]);
+                if (i >= j) break;
+                std::swap(a[i], a[j]);
+            }
+            if (j - lo < hi - j) {
+                stack.push_back({j + 1, hi});
+                hi = j;
+            } else {
+                stack.push_back({lo, j});
+                lo = j + 1;
+            }
+        }
+        for (int end = hi; end > lo; --end) {
+            int m = lo;
+            for (int k = lo + 1; k <= end; ++k)
+                if (a[k] < a[m]) m = k;
+            std::swap(a[m], a[end]);
+        }
+        if (stack.empty()) break;
+        lo = stack.back().lo;
+        hi = stack.back().hi;
+        stack.pop_back();
+    }
+}
+}  // namespace
+
+// Signed zeros, NaNs and heavy duplication: the same bits as the plain
+// algorithm, so the placement of elements that compare equal is fixed.
+TEST_P(VecSortSplit, SortLeavesEqualElementsWhereTheDocumentedSwapsDo) {
+    const Api& z = this->z();
+    std::mt19937 rng(17);
+    for (int trial = 0; trial < 300; ++trial) {
+        const int n = 1 + static_cast<int>(rng() % (trial < 200 ? 150 : 3000));
+        const int kind = trial % 4;
+        std::vector<float> v(n);
+        for (auto& x : v) {
+            const uint32_t r = rng();
+            x = kind == 0   ? (r % 3 == 0 ? 0.0f : r % 3 == 1 ? -0.0f : float(int(r % 5) - 2))
+                : kind == 1 ? (r % 13 == 0 ? kNaN : float(int(r % 50)))
+                : kind == 2 ? floatOf(r)
+                            : (r % 2 ? 0.0f : -0.0f);
+        }
+        std::vector<float> want = v;
+        referenceSortDescend(want.data(), n);
+        Guarded<float> g(n, trial % 2 ? zt::Guard::After : zt::Guard::Before);
+        g.load(v);
+        ASSERT_EQ(z.zorsSortDescend_32f_I(g.p(), n), StatusOk);
+        ASSERT_TRUE(sameBits(g.get(n), want)) << "n=" << n << " kind=" << kind;
+    }
 }
 
 TEST_P(VecSortSplit, DeinterleaveSplitsChannelsAndWarnsOnAlignment) {
