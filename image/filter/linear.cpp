@@ -374,9 +374,244 @@ private:
     IntKernelTable* hiTable_ = nullptr;
     IntKernelTable* loTable_ = nullptr;
 };
+
+// Float kernels on 8u samples, fast and still exact.  The kernel is put on a
+// grid of 2^-g: n_i = round(c_i * 2^g), 16-bit integers, and t = sum p_i * n_i
+// is formed exactly in 32-bit lanes by pmaddwd.  The true sum S satisfies
+// S * 2^g = t + sum p_i * d_i with d_i = c_i * 2^g - n_i in [-1/2, 1/2], so
+// S * 2^g lies in [t + 255 * (sum of negative d_i), t + 255 * (sum of positive
+// d_i)]; the double accumulation of the generic loop is off S by less than
+// (n - 1) * 2^-53 * 255 * sum |c_i|, far below one grid unit (g is chosen so
+// that 255 * sum |c_i| * 2^g <= 2^29).  The 8u conversion is a monotonic
+// function of the sum and equals exact half-up rounding except within an ulp
+// (< 2^-44 below 256) of a half.  So where half-up rounding of both ends of
+// the interval, widened by two grid units each side, gives the same byte,
+// that byte is what the double loop gives; the remaining samples (sums within
+// about 0.01 of a half) are recomputed by the double loop itself.
+//
+// Kernels whose rows mirror vertically (after the rounding to the grid) add
+// the two source rows first: half the multiplies.
+class GridFloatKernel {
+public:
+    GridFloatKernel(const float* kernel, ImageSize ks, int channels, int samples)
+        : ks_(ks), channels_(channels), samples_(samples) {
+        const int64_t n = static_cast<int64_t>(ks.width) * ks.height;
+        if (samples < 16 || n > (int64_t(1) << 20)) return;
+        double maxAbs = 0.0, sumAbs = 0.0;
+        for (int64_t i = 0; i < n; ++i) {
+            const double c = static_cast<double>(kernel[i]);
+            if (!(c - c == 0.0)) return;  // infinite or NaN: the double loop decides
+            maxAbs = std::max(maxAbs, std::fabs(c));
+            sumAbs += std::fabs(c);
+        }
+        sumAbs *= 1.0 + 1e-9;  // covers the rounding of the sum above
+        int g = 31;            // 2^(g-1) must fit the 32-bit lanes
+        while (g >= 1 && (maxAbs * std::ldexp(1.0, g) > 32767.0 ||
+                          255.0 * sumAbs * std::ldexp(1.0, g) > 536870912.0))
+            --g;
+        if (g < 1) return;  // huge coefficients: other paths
+        shift_ = g;
+
+        pairs_ = (ks.width + 1) / 2;
+        rowLen_ = static_cast<int64_t>(samples) + static_cast<int64_t>(ks.width - 1) * channels;
+        // walk-order grid kernel first, to test the mirror symmetry
+        int32_t* grid = static_cast<int32_t*>(mem::alignedAlloc(static_cast<uint32_t>(n * 4)));
+        if (!grid) return;
+        double negSum = 0.0, posSum = 0.0;
+        for (int r = 0; r < ks.height; ++r)
+            for (int q = 0; q < ks.width; ++q) {
+                const double c = std::ldexp(static_cast<double>(kernel[n - 1 - r * ks.width - q]), g);
+                const double ni = std::floor(c + 0.5);
+                const double d = c - ni;  // exact
+                (d < 0 ? negSum : posSum) += d;
+                grid[r * ks.width + q] = static_cast<int32_t>(ni);
+            }
+        loOff_ = static_cast<int32_t>(std::floor(255.0 * negSum)) - 2 + (int32_t(1) << (g - 1));
+        hiOff_ = static_cast<int32_t>(std::ceil(255.0 * posSum)) + 2 + (int32_t(1) << (g - 1));
+        fold_ = ks.height > 1;
+        for (int r = 0; fold_ && r < ks.height / 2; ++r)
+            fold_ = std::memcmp(grid + r * ks.width, grid + (ks.height - 1 - r) * ks.width,
+                                sizeof(int32_t) * size_t(ks.width)) == 0;
+        groups_ = fold_ ? (ks.height + 1) / 2 : ks.height;
+        rowStride_ = (rowLen_ + 7) & ~int64_t(7);
+        const uint64_t tableBytes = uint64_t(groups_) * uint64_t(pairs_) * sizeof(__m128i);
+        const uint64_t bytes = tableBytes + uint64_t(groups_) * uint64_t(rowStride_) * 4;
+        if (bytes <= 0x7FFFFFFFu) block_ = mem::alignedAlloc(static_cast<uint32_t>(bytes));
+        if (block_) {
+            table_ = static_cast<__m128i*>(block_);
+            rows_ = reinterpret_cast<uint32_t*>(static_cast<uint8_t*>(block_) + tableBytes);
+            for (int gi = 0; gi < groups_; ++gi)
+                for (int p = 0; p < pairs_; ++p) {
+                    const int q = 2 * p;
+                    const int32_t c0 = grid[gi * ks.width + q];
+                    const int32_t c1 = q + 1 < ks.width ? grid[gi * ks.width + q + 1] : 0;
+                    table_[gi * pairs_ + p] = _mm_set1_epi32(static_cast<int32_t>(
+                        (static_cast<uint32_t>(c1) << 16) | (static_cast<uint32_t>(c0) & 0xFFFFu)));
+                }
+        }
+        mem::alignedFree(grid);
+    }
+    ~GridFloatKernel() { mem::alignedFree(block_); }
+    GridFloatKernel(const GridFloatKernel&) = delete;
+    GridFloatKernel& operator=(const GridFloatKernel&) = delete;
+    bool ok() const { return block_ != nullptr; }
+
+    void row(const uint8_t* top, int srcStep, uint8_t* dst, const float* kernel) const {
+        for (int gi = 0; gi < groups_; ++gi) {
+            const int other = ks_.height - 1 - gi;
+            pairUp(rowAt(top, srcStep, gi), fold_ && other != gi ? rowAt(top, srcStep, other) : nullptr,
+                   rows_ + gi * rowStride_);
+        }
+        switch (ks_.width) {  // the common widths with the tap loop unrolled
+        case 3: blocks<3>(top, srcStep, dst, kernel); break;
+        case 5: blocks<5>(top, srcStep, dst, kernel); break;
+        case 7: blocks<7>(top, srcStep, dst, kernel); break;
+        default: blocks<0>(top, srcStep, dst, kernel); break;
+        }
+    }
+
+private:
+    // Rounds 16 grid sums to bytes, each under both ends of its interval;
+    // returns the samples where they differ.
+    unsigned settle(const __m128i acc[4], uint8_t* dst) const {
+        const __m128i g = _mm_cvtsi32_si128(shift_);
+        auto bytes = [&](__m128i off) {
+            __m128i v[4];
+            for (int i = 0; i < 4; ++i) v[i] = _mm_sra_epi32(_mm_add_epi32(acc[i], off), g);
+            return _mm_packus_epi16(_mm_packs_epi32(v[0], v[1]), _mm_packs_epi32(v[2], v[3]));
+        };
+        const __m128i lo = bytes(_mm_set1_epi32(loOff_)), hi = bytes(_mm_set1_epi32(hiOff_));
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), lo);
+        return ~static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(lo, hi))) & 0xFFFFu;
+    }
+
+    // KW: the kernel width when known at compile time, 0 otherwise.
+    template <int KW>
+    void blocks(const uint8_t* top, int srcStep, uint8_t* dst, const float* kernel) const {
+        const int c = channels_;
+        const int pairs = KW ? (KW + 1) / 2 : pairs_;
+        const __m128i zero = _mm_setzero_si128();
+        for (int x0 = 0; x0 < samples_; x0 += 16) {
+            const int x = x0 + 16 <= samples_ ? x0 : samples_ - 16;  // last block overlaps
+            __m128i acc[4] = {zero, zero, zero, zero};
+            for (int gi = 0; gi < groups_; ++gi) {
+                const uint32_t* w = rows_ + gi * rowStride_ + x;
+                const __m128i* t = table_ + gi * pairs_;
+                for (int k = 0; k < pairs; ++k) {
+                    const __m128i* pk = reinterpret_cast<const __m128i*>(w + 2 * k * c);
+                    const __m128i tk = t[k];
+                    for (int i = 0; i < 4; ++i)
+                        acc[i] = _mm_add_epi32(acc[i], _mm_madd_epi16(_mm_loadu_si128(pk + i), tk));
+                }
+            }
+            unsigned unsure = settle(acc, dst + x);
+            while (unsure) {  // a sum too close to a half: the double loop decides
+                const int i = __builtin_ctz(unsure);
+                unsure &= unsure - 1;
+                floatRow(top, srcStep, dst, x + i, x + i + 1, kernel, ks_, c);
+            }
+        }
+    }
+
+    // The pmaddwd operands of a tap and the next one: w[i] = (v[i], v[i + c])
+    // as two 16-bit halves, v = a (+ b) widened, for rowLen_ samples; a
+    // partner beyond the row is 0 (it only meets the 0 that pads an odd
+    // kernel width).
+    void pairUp(const uint8_t* a, const uint8_t* b, uint32_t* w) const {
+        const __m128i zero = _mm_setzero_si128();
+        const int64_t c = channels_;
+        auto widened = [&](const uint8_t* p, const uint8_t* q, __m128i& lo, __m128i& hi) {
+            const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+            lo = _mm_unpacklo_epi8(v, zero);
+            hi = _mm_unpackhi_epi8(v, zero);
+            if (q) {
+                const __m128i u = _mm_loadu_si128(reinterpret_cast<const __m128i*>(q));
+                lo = _mm_add_epi16(lo, _mm_unpacklo_epi8(u, zero));
+                hi = _mm_add_epi16(hi, _mm_unpackhi_epi8(u, zero));
+            }
+        };
+        int64_t i = 0;
+        for (; i + c + 16 <= rowLen_; i += 16) {
+            __m128i v0, v1, u0, u1;
+            widened(a + i, b ? b + i : nullptr, v0, v1);
+            widened(a + i + c, b ? b + i + c : nullptr, u0, u1);
+            __m128i* o = reinterpret_cast<__m128i*>(w + i);
+            _mm_storeu_si128(o, _mm_unpacklo_epi16(v0, u0));
+            _mm_storeu_si128(o + 1, _mm_unpackhi_epi16(v0, u0));
+            _mm_storeu_si128(o + 2, _mm_unpacklo_epi16(v1, u1));
+            _mm_storeu_si128(o + 3, _mm_unpackhi_epi16(v1, u1));
+        }
+        auto v = [&](int64_t j) -> uint32_t { return j < rowLen_ ? uint32_t(a[j] + (b ? b[j] : 0)) : 0u; };
+        for (; i < rowLen_; ++i) w[i] = v(i) | (v(i + c) << 16);
+    }
+
+    ImageSize ks_;
+    int channels_, samples_;
+    int shift_ = 0, pairs_ = 0, groups_ = 0;
+    bool fold_ = false;
+    int64_t rowLen_ = 0, rowStride_ = 0;
+    int32_t loOff_ = 0, hiOff_ = 0;
+    void* block_ = nullptr;
+    __m128i* table_ = nullptr;
+    uint32_t* rows_ = nullptr;
+};
 #endif
 
 #if ZOR_SIMD >= 4
+// Source rows as byte pairs (p[i], p[i + channels]), the operands of
+// pmaddubsw for a kernel tap and the next one: each source row is paired
+// once and then serves kH output rows.  A ring of kH rows; the pair of the
+// last samples, which has no partner in the row, takes 0.
+class PairRows {
+public:
+    PairRows(int rows, int64_t samples, int channels) : rows_(rows), samples_(samples), channels_(channels) {
+        const uint64_t bytes = uint64_t(rows) * uint64_t(samples + 8) * 2;
+        if (bytes > 0x7FFFFFFFu) return;
+        base_ = static_cast<uint16_t*>(mem::alignedAlloc(static_cast<uint32_t>(bytes)));
+        order_ = static_cast<const uint16_t**>(mem::alignedAlloc(static_cast<uint32_t>(rows * sizeof(void*))));
+        if (!order_) {
+            mem::alignedFree(base_);
+            base_ = nullptr;
+        }
+    }
+    ~PairRows() {
+        mem::alignedFree(base_);
+        mem::alignedFree(order_);
+    }
+    PairRows(const PairRows&) = delete;
+    PairRows& operator=(const PairRows&) = delete;
+    bool ok() const { return base_ != nullptr; }
+    // Before output row y: pairs the source rows it needs that are not yet
+    // in the ring (all of them for the first row), top being its first
+    // source row; returns the rows, from the top.
+    const uint16_t* const* advance(const uint8_t* top, int srcStep, int y) {
+        for (int r = y == 0 ? 0 : rows_ - 1; r < rows_; ++r) pair(rowAt(top, srcStep, r), y + r);
+        for (int r = 0; r < rows_; ++r) order_[r] = base_ + ((y + r) % rows_) * (samples_ + 8);
+        return order_;
+    }
+
+private:
+    void pair(const uint8_t* p, int sourceRow) {
+        uint16_t* out = base_ + (sourceRow % rows_) * (samples_ + 8);
+        const int64_t c = channels_;
+        int64_t i = 0;
+        for (; i + c + 16 <= samples_; i += 16) {
+            const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i));
+            const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i + c));
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(out + i), _mm_unpacklo_epi8(a, b));
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(out + i + 8), _mm_unpackhi_epi8(a, b));
+        }
+        for (; i < samples_; ++i)
+            out[i] = static_cast<uint16_t>(p[i] | (i + c < samples_ ? p[i + c] << 8 : 0));
+    }
+
+    int rows_;
+    int64_t samples_;
+    int channels_;
+    uint16_t* base_ = nullptr;
+    const uint16_t** order_ = nullptr;
+};
+
 // Small kernels (SSSE3): coefficients as signed bytes, pixel pairs summed by
 // pmaddubsw, running sums in 16 bits.  Taken only when nothing can saturate
 // or wrap: every coefficient fits a byte, 255 * (|c_q| + |c_q+1|) and
@@ -426,6 +661,39 @@ public:
                 lo = _mm_add_epi16(lo, _mm_maddubs_epi16(_mm_unpacklo_epi8(a, b), t[k]));
                 hi = _mm_add_epi16(hi, _mm_maddubs_epi16(_mm_unpackhi_epi8(a, b), t[k]));
             }
+        }
+    }
+
+    // One output row from the pair rows of its source rows (rows[r]: source
+    // row r of the neighbourhood), scaled.  P: the number of tap pairs when
+    // known at compile time, 0 otherwise.
+    template <int P, class Scale>
+    void pairedRow(const uint16_t* const* rows, uint8_t* dst, int samples, int channels,
+                   const Scale& scale) const {
+        const int pairs = P ? P : pairs_;
+        for (int x0 = 0; x0 < samples; x0 += 16) {
+            const int x = x0 + 16 <= samples ? x0 : samples - 16;  // last block overlaps
+            __m128i lo = _mm_setzero_si128(), hi = _mm_setzero_si128();
+            for (int r = 0; r < ks_.height; ++r) {
+                const uint16_t* p = rows[r] + x;
+                const __m128i* t = table_ + r * pairs;
+                for (int k = 0; k < pairs; ++k) {
+                    const uint16_t* q = p + 2 * k * channels;
+                    lo = _mm_add_epi16(lo, _mm_maddubs_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(q)), t[k]));
+                    hi = _mm_add_epi16(hi, _mm_maddubs_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(q + 8)), t[k]));
+                }
+            }
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + x), scale.apply(lo, hi));
+        }
+    }
+    template <class Scale>
+    void pairedRow(const uint16_t* const* rows, uint8_t* dst, int samples, int channels,
+                   const Scale& scale) const {
+        switch (pairs_) {
+        case 2: pairedRow<2, Scale>(rows, dst, samples, channels, scale); break;
+        case 3: pairedRow<3, Scale>(rows, dst, samples, channels, scale); break;
+        case 4: pairedRow<4, Scale>(rows, dst, samples, channels, scale); break;
+        default: pairedRow<0, Scale>(rows, dst, samples, channels, scale); break;
         }
     }
 
@@ -502,6 +770,55 @@ private:
 };
 #endif
 
+#if ZOR_SIMD >= 2
+// 8 samples of a row as 32-bit integers.
+inline void load8(const uint8_t* p, __m128i& lo, __m128i& hi) {
+    const __m128i v = _mm_unpacklo_epi8(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)), _mm_setzero_si128());
+    lo = _mm_unpacklo_epi16(v, _mm_setzero_si128());
+    hi = _mm_unpackhi_epi16(v, _mm_setzero_si128());
+}
+inline void load8(const int16_t* p, __m128i& lo, __m128i& hi) {
+    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+    const __m128i sign = _mm_srai_epi16(v, 15);
+    lo = _mm_unpacklo_epi16(v, sign);
+    hi = _mm_unpackhi_epi16(v, sign);
+}
+
+// The double loop itself, 8 output samples at a time, two per register:
+// each lane performs the scalar loop's operations in its order (exact
+// products, one rounding per addition), so the sums are the same bits.
+template <class T>
+void doubleRow(const T* top, int srcStep, T* dst, int samples, const float* kernel, ImageSize ks,
+               int channels) {
+    const int n = ks.width * ks.height;
+    for (int x0 = 0; x0 < samples; x0 += 8) {
+        const int x = x0 + 8 <= samples ? x0 : samples - 8;  // last block overlaps
+        __m128d acc[4] = {_mm_setzero_pd(), _mm_setzero_pd(), _mm_setzero_pd(), _mm_setzero_pd()};
+        for (int r = 0; r < ks.height; ++r) {
+            const T* p = rowAt(top, srcStep, r) + x;
+            const float* k = kernel + n - 1 - r * ks.width;
+            for (int q = 0; q < ks.width; ++q) {
+                const __m128d c = _mm_set1_pd(static_cast<double>(k[-q]));
+                __m128i lo, hi;
+                load8(p + q * channels, lo, hi);
+                acc[0] = _mm_add_pd(acc[0], _mm_mul_pd(_mm_cvtepi32_pd(lo), c));
+                acc[1] = _mm_add_pd(acc[1], _mm_mul_pd(_mm_cvtepi32_pd(_mm_shuffle_epi32(lo, 0xEE)), c));
+                acc[2] = _mm_add_pd(acc[2], _mm_mul_pd(_mm_cvtepi32_pd(hi), c));
+                acc[3] = _mm_add_pd(acc[3], _mm_mul_pd(_mm_cvtepi32_pd(_mm_shuffle_epi32(hi, 0xEE)), c));
+            }
+        }
+        alignas(16) double sums[8];
+        for (int i = 0; i < 4; ++i) _mm_store_pd(sums + 2 * i, acc[i]);
+        for (int i = 0; i < 8; ++i) {
+            if constexpr (sizeof(T) == 1)
+                dst[x + i] = roundSum8u(sums[i]);
+            else
+                dst[x + i] = roundSum16s(sums[i]);
+        }
+    }
+}
+#endif
+
 // ---- the filters ---------------------------------------------------------------
 
 // Steps that cannot hold a source row of (width + kW - 1) samples or a
@@ -537,9 +854,14 @@ Status filterInt8u(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, I
         if (bytes.ok()) {
             const Scale16 scale(d, bytes.absMax());
             if (scale.ok()) {
+                PairRows pairs(ks.height, rowSamples(roi.width, ks.width, channels), channels);
                 for (int y = 0; y < roi.height; ++y) {
                     const uint8_t* t = rowAt(top, srcStep, y);
                     uint8_t* o = rowAt(dst, dstStep, y);
+                    if (pairs.ok()) {
+                        bytes.pairedRow(pairs.advance(t, srcStep, y), o, samples, channels, scale);
+                        continue;
+                    }
                     for (int x0 = 0; x0 < samples; x0 += 16) {
                         const int x = x0 + 16 <= samples ? x0 : samples - 16;  // last block overlaps
                         __m128i lo, hi;
@@ -586,6 +908,12 @@ Status filterFloat(const T* src, int srcStep, T* dst, int dstStep, ImageSize roi
     const T* top = rowAt(src, srcStep, -walk.up) - walk.left;
 #if ZOR_SIMD >= 2
     if constexpr (sizeof(T) == 1) {
+        GridFloatKernel grid(kernel, ks, channels, samples);
+        if (grid.ok()) {
+            for (int y = 0; y < roi.height; ++y)
+                grid.row(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), kernel);
+            return StatusOk;
+        }
         if (samples >= 16) {
             ExactFloatKernel exact(kernel, ks);
             if (exact.ok()) {
@@ -594,6 +922,11 @@ Status filterFloat(const T* src, int srcStep, T* dst, int dstStep, ImageSize roi
                 return StatusOk;
             }
         }
+    }
+    if (samples >= 8) {
+        for (int y = 0; y < roi.height; ++y)
+            doubleRow(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), samples, kernel, ks, channels);
+        return StatusOk;
     }
 #endif
     for (int y = 0; y < roi.height; ++y)

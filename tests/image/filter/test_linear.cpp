@@ -7,6 +7,7 @@
 #include <random>
 #include <vector>
 
+#include "frame/fpu.h"
 #include "tests/support/guarded.h"
 #include "tests/support/variants.h"
 
@@ -199,6 +200,111 @@ TEST_P(LinearFilter, FloatKernelsMatchReference) {
                     ASSERT_EQ(*d16.at(x, y), e);
                     ASSERT_EQ(*e16.at(x, y), e);
                 }
+        }
+}
+
+// The float-kernel 8u result as defined: the sum accumulated in double in
+// neighbourhood order (top row first, left to right, the kernel read
+// backwards), then half up, NaN and negatives to 0, saturated.
+uint8_t float8uRef(const TightSource<uint8_t>& s, int x, int y, const std::vector<float>& k, ImageSize ks,
+                   ImagePoint a) {
+    zor::DoublePrecisionScope fpu;
+    double sum = 0;
+    const int n = ks.width * ks.height;
+    for (int r = 0; r < ks.height; ++r)
+        for (int q = 0; q < ks.width; ++q) {
+            const double p = s.at(x + (q - (ks.width - 1 - a.x)) * s.c, y + r - (ks.height - 1 - a.y));
+            sum = zor::toDouble(sum + p * double(k[size_t(n - 1 - r * ks.width - q)]));
+        }
+    if (sum > 0) sum = zor::toDouble(sum + 0.5);
+    if (sum > 255) return 255;
+    if (!(sum >= 0)) return 0;
+    return uint8_t(int(sum));
+}
+
+int16_t float16sRef(const TightSource<int16_t>& s, int x, int y, const std::vector<float>& k, ImageSize ks,
+                    ImagePoint a) {
+    zor::DoublePrecisionScope fpu;
+    double sum = 0;
+    const int n = ks.width * ks.height;
+    for (int r = 0; r < ks.height; ++r)
+        for (int q = 0; q < ks.width; ++q) {
+            const double p = s.at(x + q - (ks.width - 1 - a.x), y + r - (ks.height - 1 - a.y));
+            sum = zor::toDouble(sum + p * double(k[size_t(n - 1 - r * ks.width - q)]));
+        }
+    if (sum > 0) sum = zor::toDouble(sum + 0.5);
+    if (sum < 0) sum = zor::toDouble(sum - 0.5);
+    if (sum > 32767) return 32767;
+    if (sum < -32768) return -32768;
+    if (sum != sum) return 0;
+    return int16_t(int(sum));
+}
+
+// Kernels and pictures whose sums sit on or next to a half, far apart
+// magnitudes, negative and non-finite coefficients: the fast paths must
+// settle each of these exactly like the double loop.
+TEST_P(LinearFilter, FloatKernel8uExactNearHalves) {
+    std::mt19937 rng(31 + variant());
+    const float inf = std::numeric_limits<float>::infinity(), nan = std::numeric_limits<float>::quiet_NaN();
+    enum Kind { Halves, NearHalves, Ninths, Mixed, Negative, Large, Tiny, NonFinite, Count };
+    for (int kind = 0; kind < Count; ++kind)
+        for (const Shape& sh : {Shape{5, 5, 2, 2}, Shape{3, 3, 1, 1}, Shape{4, 3, 0, 2}, Shape{1, 6, 0, 5}}) {
+            const ImageSize ks{sh.kw, sh.kh};
+            const ImagePoint a{sh.ax, sh.ay};
+            std::vector<float> k(size_t(sh.kw * sh.kh));
+            for (size_t i = 0; i < k.size(); ++i) {
+                const float u = float(int(rng() % 9) - 2);
+                switch (kind) {
+                case Halves: k[i] = 0.5f; break;                                 // sums: n.0 and n.5
+                case NearHalves: k[i] = 0.5f + (rng() % 2 ? 1.0f : -1.0f) * 0x1p-22f; break;
+                case Ninths: k[i] = u / 9.0f; break;
+                case Mixed: k[i] = rng() % 2 ? u * 0x1p-30f : u / 7.0f; break;   // wide exponent range
+                case Negative: k[i] = -u / 3.0f + 0.25f; break;
+                case Large: k[i] = u * 1000.25f; break;
+                case Tiny: k[i] = u * 1e-7f + (rng() % 3 == 0 ? 1e-40f : 0.0f); break;  // subnormals too
+                default: k[i] = u / 5.0f; break;
+                }
+            }
+            if (kind == NonFinite) k[rng() % k.size()] = rng() % 2 ? inf : nan;
+            // symmetric rows in half the cases (the vector path adds mirrored rows first)
+            if (rng() % 2)
+                for (int r = 0; r < sh.kh / 2; ++r)
+                    for (int q = 0; q < sh.kw; ++q)
+                        k[size_t((sh.kh - 1 - r) * sh.kw + q)] = k[size_t(r * sh.kw + q)];
+            for (int c : {1, 3})
+                for (int w : {16, 23, 40}) {
+                    const int h = 3;
+                    TightSource<uint8_t> src(w, h, ks, a, c, w % 2 ? zt::Guard::After : zt::Guard::Before);
+                    for (int i = 0; i < src.rowLen * src.rows; ++i)
+                        src.base()[i] = kind == Halves || kind == NearHalves ? uint8_t(rng() % 4 ? rng() % 24 : 255)
+                                                                             : uint8_t(rng());
+                    zt::GuardedImage<uint8_t> dst(w * c, h);
+                    auto fn = c == 1 ? z().zoriFilter32f_8u_C1R : z().zoriFilter32f_8u_C3R;
+                    ASSERT_EQ(fn(src.roi(), src.step(), dst.roi(), dst.step(), {w, h}, k.data(), ks, a), StatusOk);
+                    ASSERT_TRUE(dst.outsideIntact());
+                    for (int y = 0; y < h; ++y)
+                        for (int x = 0; x < w * c; ++x)
+                            ASSERT_EQ(*dst.at(x, y), float8uRef(src, x, y, k, ks, a))
+                                << "kind " << kind << " k " << sh.kw << "x" << sh.kh << " c " << c << " w " << w
+                                << " at " << x << "," << y;
+                }
+            // the same kernels on 16-bit samples, rounded half away from zero
+            for (int w : {3, 8, 19}) {
+                const int h = 2;
+                TightSource<int16_t> src(w, h, ks, a, 1, w % 2 ? zt::Guard::After : zt::Guard::Before);
+                for (int i = 0; i < src.rowLen * src.rows; ++i)
+                    src.base()[i] = int16_t(rng() % 3 ? int(rng() % 64) - 32 : int(rng() % 65536) - 32768);
+                zt::GuardedImage<int16_t> dst(w, h);
+                ASSERT_EQ(z().zoriFilter32f_16s_C1R(src.roi(), src.step(), dst.roi(), dst.step(), {w, h}, k.data(),
+                                                    ks, a),
+                          StatusOk);
+                ASSERT_TRUE(dst.outsideIntact());
+                for (int y = 0; y < h; ++y)
+                    for (int x = 0; x < w; ++x)
+                        ASSERT_EQ(*dst.at(x, y), float16sRef(src, x, y, k, ks, a))
+                            << "kind " << kind << " k " << sh.kw << "x" << sh.kh << " w " << w << " at " << x << ","
+                            << y;
+            }
         }
 }
 
