@@ -120,6 +120,87 @@ TEST_P(Canny, RandomGradientsMatchReference) {
     }
 }
 
+// Smooth random pictures give long, connected edges: growth runs across many
+// rows, also upwards, and through rows far above the one being suppressed.
+TEST_P(Canny, TallPicturesMatchReference) {
+    std::mt19937 rng(7 + variant());
+    for (int trial = 0; trial < 6; ++trial) {
+        const int w = 8 + int(rng() % 60), h = 30 + int(rng() % 70);
+        std::vector<double> f(size_t(w + 2) * (h + 2));
+        for (int b = 0; b < 12; ++b) {  // a few blobs
+            const double cx = rng() % (w + 2), cy = rng() % (h + 2), r = 3 + rng() % 15, a = int(rng() % 200) - 100;
+            for (int y = 0; y < h + 2; ++y)
+                for (int x = 0; x < w + 2; ++x)
+                    f[size_t(y) * (w + 2) + x] += a * std::exp(-((x - cx) * (x - cx) + (y - cy) * (y - cy)) / (r * r));
+        }
+        Grad g(w, h);
+        auto F = [&](int x, int y) { return f[size_t(y + 1) * (w + 2) + size_t(x + 1)]; };
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x)
+                g.set(x, y, int(8 * (F(x + 1, y) - F(x - 1, y))) + int(rng() % 5) - 2,
+                      int(8 * (F(x, y + 1) - F(x, y - 1))) + int(rng() % 5) - 2);
+        for (const float low : {1.0f, 20.0f, 60.5f}) {
+            const float high = low * (trial % 2 ? 2.0f : 6.0f);
+            ASSERT_EQ(run(z(), g, low, high), reference(g, low, high)) << trial << " " << low;
+        }
+    }
+}
+
+// A weak path that winds down and up over many rows, one strong pixel at
+// its far end: the whole path becomes an edge (the growth must climb back
+// into rows settled long before).
+TEST_P(Canny, WindingPathGrowsBackUpwards) {
+    const int w = 24, h = 80;
+    Grad g(w, h);
+    // columns 2, 6, 10, ... go down or up alternately, joined at the ends
+    // (vertical runs of class 1, horizontal joins of class 3: each pixel is
+    // alone along its own gradient, so all are candidates)
+    std::vector<std::pair<int, int>> path;
+    for (int c = 0; c < 5; ++c) {
+        const int x = 2 + 4 * c;
+        for (int i = 1; i < h - 1; ++i) {
+            path.push_back({x, c % 2 ? h - 1 - i : i});
+            g.set(x, path.back().second, 40, 0);
+        }
+        const int yEnd = c % 2 ? 1 : h - 2;
+        for (int dx = 1; dx < 4 && c < 4; ++dx) {
+            path.push_back({x + dx, yEnd});
+            g.set(x + dx, yEnd, 0, -30);  // below the runs: no plateau with them
+        }
+    }
+    g.set(path.back().first, path.back().second, 400, 0);  // the only strong pixel
+    const auto e = run(z(), g, 10, 100);
+    EXPECT_EQ(e, reference(g, 10, 100));
+    for (const auto& p : path) ASSERT_EQ(e[size_t(p.second) * w + p.first], 255) << p.first << "," << p.second;
+}
+
+// Extreme derivatives: magnitudes up to 65536 side by side with 65535, and
+// threshold edge values (low 0, low and high near and above 65535).
+TEST_P(Canny, ExtremeMagnitudesAndThresholds) {
+    std::mt19937 rng(99 + variant());
+    static const int16_t vals[] = {-32768, -32767, 32767, 32766, 0, 1, -1, -16384};
+    for (int trial = 0; trial < 6; ++trial) {
+        const int w = 9 + int(rng() % 30), h = 3 + int(rng() % 12);
+        Grad g(w, h);
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x) g.set(x, y, vals[rng() % 8], vals[rng() % 8]);
+        const float lows[] = {0.0f, 1.0f, 65534.0f, 65535.0f, 65536.0f, 40000.0f};
+        const float low = lows[trial];
+        for (const float high : {low, low + 0.5f, 65535.0f, 65535.5f, 65536.0f, 1e30f}) {
+            if (high < low) continue;
+            ASSERT_EQ(run(z(), g, low, high), reference(g, low, high)) << trial << " " << low << " " << high;
+        }
+    }
+    // ordinary edges over many rows, and the largest magnitude only in the
+    // last row: everything before it is redone another way, same result
+    Grad g(40, 50);
+    for (int y = 0; y < g.h; ++y)
+        for (int x = 0; x < g.w; ++x) g.set(x, y, (x * 7 + y * 3) % 11 == 0 ? 300 : int(rng() % 40), int(rng() % 90));
+    g.set(17, 49, -32768, -32768);
+    for (const float low : {0.0f, 30.0f})
+        ASSERT_EQ(run(z(), g, low, 200), reference(g, low, 200)) << low;
+}
+
 TEST_P(Canny, SinglePixelsAndTies) {
     const auto& z = this->z();
     Grad zero(8, 6);
