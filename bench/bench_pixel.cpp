@@ -25,7 +25,9 @@ struct Images {
     cv::Mat c3 = randomMat(CV_8UC3), c3out = cv::Mat(kH, kW, CV_8UC3);
     cv::Mat c1 = randomMat(CV_8UC1), c1out = cv::Mat(kH, kW, CV_8UC1);
     cv::Mat f1 = randomMat(CV_32FC1), f1out = cv::Mat(kH, kW, CV_32FC1);
-    std::vector<cv::Mat> planes = {cv::Mat(kH, kW, CV_8UC1), cv::Mat(kH, kW, CV_8UC1), cv::Mat(kH, kW, CV_8UC1)};
+    // filled, not just allocated: untouched pages all map to one zero page,
+    // which would make the merge read one physical page three times over
+    std::vector<cv::Mat> planes = {randomMat(CV_8UC1), randomMat(CV_8UC1), randomMat(CV_8UC1)};
 };
 Images& img() {
     static Images i;

@@ -54,76 +54,88 @@ private:
 
 ptrdiff_t widen8u16uSimd(const uint8_t* s, uint16_t* d, ptrdiff_t n) {
     const __m128i z = _mm_setzero_si128();
-    ptrdiff_t x = 0;
-    for (; x + 16 <= n; x += 16) {
+    return eachBlock<16>(n, [&](ptrdiff_t x) {
         const __m128i v = load16(s + x);
         store16(d + x, _mm_unpacklo_epi8(v, z));
         store16(d + x + 8, _mm_unpackhi_epi8(v, z));
+    });
+}
+
+// Sixteen bytes to sixteen floats, each byte zero-extended into a 32-bit lane.
+inline void bytesToFloat16(const uint8_t* s, float* d) {
+    const __m128i v = load16(s);
+    __m128i lanes[4];
+#if ZOR_SIMD >= 4
+    // one shuffle per four values: byte k of the load into the low byte of a
+    // zeroed lane
+    for (int q = 0; q < 4; ++q) {
+        const char b = static_cast<char>(4 * q);
+        lanes[q] = _mm_shuffle_epi8(v, _mm_setr_epi8(b, -1, -1, -1, char(b + 1), -1, -1, -1, char(b + 2), -1, -1, -1,
+                                                     char(b + 3), -1, -1, -1));
     }
-    return x;
+#else
+    const __m128i z = _mm_setzero_si128();
+    const __m128i lo = _mm_unpacklo_epi8(v, z), hi = _mm_unpackhi_epi8(v, z);
+    lanes[0] = _mm_unpacklo_epi16(lo, z);
+    lanes[1] = _mm_unpackhi_epi16(lo, z);
+    lanes[2] = _mm_unpacklo_epi16(hi, z);
+    lanes[3] = _mm_unpackhi_epi16(hi, z);
+#endif
+    for (int q = 0; q < 4; ++q) _mm_storeu_ps(d + 4 * q, _mm_cvtepi32_ps(lanes[q]));
 }
 
 ptrdiff_t u8ToFloatSimd(const uint8_t* s, float* d, ptrdiff_t n) {
-    ptrdiff_t x = 0;
-#if ZOR_SIMD >= 4
-    // one shuffle per four values: byte k of the load into the low byte of a
-    // zeroed 32-bit lane
-    const __m128i m0 = _mm_setr_epi8(0, -1, -1, -1, 1, -1, -1, -1, 2, -1, -1, -1, 3, -1, -1, -1);
-    const __m128i m1 = _mm_setr_epi8(4, -1, -1, -1, 5, -1, -1, -1, 6, -1, -1, -1, 7, -1, -1, -1);
-    const __m128i m2 = _mm_setr_epi8(8, -1, -1, -1, 9, -1, -1, -1, 10, -1, -1, -1, 11, -1, -1, -1);
-    const __m128i m3 = _mm_setr_epi8(12, -1, -1, -1, 13, -1, -1, -1, 14, -1, -1, -1, 15, -1, -1, -1);
-    for (; x + 16 <= n; x += 16) {
-        const __m128i v = load16(s + x);
-        _mm_storeu_ps(d + x, _mm_cvtepi32_ps(_mm_shuffle_epi8(v, m0)));
-        _mm_storeu_ps(d + x + 4, _mm_cvtepi32_ps(_mm_shuffle_epi8(v, m1)));
-        _mm_storeu_ps(d + x + 8, _mm_cvtepi32_ps(_mm_shuffle_epi8(v, m2)));
-        _mm_storeu_ps(d + x + 12, _mm_cvtepi32_ps(_mm_shuffle_epi8(v, m3)));
-    }
-#endif
-    const __m128i z = _mm_setzero_si128();
-    for (; x + 16 <= n; x += 16) {
-        const __m128i v = load16(s + x);
-        const __m128i lo = _mm_unpacklo_epi8(v, z), hi = _mm_unpackhi_epi8(v, z);
-        _mm_storeu_ps(d + x, _mm_cvtepi32_ps(_mm_unpacklo_epi16(lo, z)));
-        _mm_storeu_ps(d + x + 4, _mm_cvtepi32_ps(_mm_unpackhi_epi16(lo, z)));
-        _mm_storeu_ps(d + x + 8, _mm_cvtepi32_ps(_mm_unpacklo_epi16(hi, z)));
-        _mm_storeu_ps(d + x + 12, _mm_cvtepi32_ps(_mm_unpackhi_epi16(hi, z)));
-    }
-    return x;
+    return eachBlock<16>(n, [&](ptrdiff_t x) { bytesToFloat16(s + x, d + x); });
 }
 
 ptrdiff_t s16ToFloatSimd(const int16_t* s, float* d, ptrdiff_t n) {
-    ptrdiff_t x = 0;
-    for (; x + 8 <= n; x += 8) {
+    return eachBlock<8>(n, [&](ptrdiff_t x) {
         const __m128i v = load16(s + x);
         // the word in the upper half, then an arithmetic shift: sign extension
         _mm_storeu_ps(d + x, _mm_cvtepi32_ps(_mm_srai_epi32(_mm_unpacklo_epi16(v, v), 16)));
         _mm_storeu_ps(d + x + 4, _mm_cvtepi32_ps(_mm_srai_epi32(_mm_unpackhi_epi16(v, v), 16)));
-    }
-    return x;
+    });
 }
 
-// Only the upper clamp is done in float: min returns its second operand
-// when one is NaN, so NaN (and -inf) stay and convert to the integer
-// indefinite value, INT_MIN, which the packs below saturate to 0 together
-// with every negative value; 255 and above end as 255.
-template <bool Nearest>
-inline __m128i floatToInt(__m128 v) {
-    v = _mm_min_ps(_mm_set1_ps(255.0f), v);
+// Float to 8 bits, sixteen values at a time.  cvtps2dq (or cvttps2dq) turns
+// NaN and everything outside the int32 range into INT_MIN, which the signed
+// pack saturates to -32768 and the unsigned pack to 0: right for NaN, -inf
+// and large negative values, wrong only for 2^31 and above.  So the fast
+// form converts without any clamp, and a block whose signed packs hold
+// -32768 (such a value, or one at or below -32768: rare in images) is done
+// again with the upper clamp in float first.  min returns its second operand
+// when one is NaN, so NaN stays NaN there and still ends as 0; 255 and above
+// end as 255.
+//
+// With Aligned the loads fold into the conversions (legacy SSE takes only
+// aligned memory operands), which leaves more room in the out-of-order
+// window for loads in flight.  The clamped form stays out of line so that
+// the compiler keeps no loaded value around for it.
+template <bool Nearest, bool Clamp, bool Aligned>
+inline __m128i floatToInt(const float* s) {
+    __m128 v = Aligned ? _mm_load_ps(s) : _mm_loadu_ps(s);
+    if constexpr (Clamp) v = _mm_min_ps(_mm_set1_ps(255.0f), v);
     return Nearest ? _mm_cvtps_epi32(v) : _mm_cvttps_epi32(v);
 }
+template <bool Nearest, bool Clamp, bool Aligned>
+inline __m128i floatToI16x8(const float* s) {
+    return _mm_packs_epi32(floatToInt<Nearest, Clamp, Aligned>(s), floatToInt<Nearest, Clamp, Aligned>(s + 4));
+}
 
 template <bool Nearest>
+[[gnu::noinline, gnu::cold]] __m128i clampedToU8x16(const float* s) {
+    return _mm_packus_epi16(floatToI16x8<Nearest, true, false>(s), floatToI16x8<Nearest, true, false>(s + 8));
+}
+
+template <bool Nearest, bool Aligned>
 ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
-    ptrdiff_t x = 0;
-    for (; x + 16 <= n; x += 16) {
-        const __m128i a = floatToInt<Nearest>(_mm_loadu_ps(s + x));
-        const __m128i b = floatToInt<Nearest>(_mm_loadu_ps(s + x + 4));
-        const __m128i c = floatToInt<Nearest>(_mm_loadu_ps(s + x + 8));
-        const __m128i e = floatToInt<Nearest>(_mm_loadu_ps(s + x + 12));
-        store16(d + x, _mm_packus_epi16(_mm_packs_epi32(a, b), _mm_packs_epi32(c, e)));
-    }
-    return x;
+    const __m128i outOfRange = _mm_set1_epi16(-32768);
+    return eachBlock<16>(n, [&](ptrdiff_t x) {
+        const __m128i lo = floatToI16x8<Nearest, false, Aligned>(s + x);
+        const __m128i hi = floatToI16x8<Nearest, false, Aligned>(s + x + 8);
+        const bool redo = _mm_movemask_epi8(_mm_cmpeq_epi16(_mm_min_epi16(lo, hi), outOfRange)) != 0;
+        store16(d + x, redo ? clampedToU8x16<Nearest>(s + x) : _mm_packus_epi16(lo, hi));
+    });
 }
 
 // Multiplies 24 words (three registers) by a repeating pattern of factors.
@@ -174,7 +186,16 @@ template <bool Nearest>
 void toU8Row(const float* s, uint8_t* d, ptrdiff_t n) {
     ptrdiff_t x = 0;
 #if ZOR_SIMD >= 2
-    x = floatToU8Simd<Nearest>(s, d, n);
+    // a few values one by one until the source is 16-byte aligned (possible
+    // when it is at least float aligned), then aligned blocks
+    const uintptr_t a = reinterpret_cast<uintptr_t>(s);
+    const ptrdiff_t head = static_cast<ptrdiff_t>((16 - (a & 15)) & 15) / 4;
+    if ((a & 3) == 0 && n >= head + 16) {
+        for (; x < head; ++x) d[x] = floatToU8(s[x], Nearest);
+        x += floatToU8Simd<Nearest, true>(s + x, d + x, n - x);
+    } else {
+        x = floatToU8Simd<Nearest, false>(s, d, n);
+    }
 #endif
     for (; x < n; ++x) d[x] = floatToU8(s[x], Nearest);
 }

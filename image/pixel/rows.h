@@ -34,9 +34,39 @@ inline bool packed(int step, ImageSize roi, int bytesPerPixel) {
     return static_cast<int64_t>(step) == static_cast<int64_t>(roi.width) * bytesPerPixel;
 }
 
+// Calls block(x) for x = 0, Block, 2 Block, ... while a whole block fits in
+// n and returns where it stopped.  Two blocks per iteration: half the loop
+// overhead, and the loads of the next block are issued before the stores of
+// this one have to wait for their cache lines.
+template <ptrdiff_t Block, class F>
+inline ptrdiff_t eachBlock(ptrdiff_t n, F&& block) {
+    ptrdiff_t x = 0;
+    for (; x + 2 * Block <= n; x += 2 * Block) {
+        block(x);
+        block(x + Block);
+    }
+    if (x + Block <= n) {
+        block(x);
+        x += Block;
+    }
+    return x;
+}
+
 #if ZOR_SIMD >= 2
 inline __m128i load16(const void* p) { return _mm_loadu_si128(static_cast<const __m128i*>(p)); }
 inline void store16(void* p, __m128i v) { _mm_storeu_si128(static_cast<__m128i*>(p), v); }
+inline void load48(const void* p, __m128i (&v)[3]) {
+    const uint8_t* b = static_cast<const uint8_t*>(p);
+    v[0] = load16(b);
+    v[1] = load16(b + 16);
+    v[2] = load16(b + 32);
+}
+inline void store48(void* p, const __m128i (&v)[3]) {
+    uint8_t* b = static_cast<uint8_t*>(p);
+    store16(b, v[0]);
+    store16(b + 16, v[1]);
+    store16(b + 32, v[2]);
+}
 // Keeps the bytes of `keep` where mask is set, takes `fresh` elsewhere.
 inline __m128i blend16(__m128i fresh, __m128i keep, __m128i mask) {
     return _mm_or_si128(_mm_and_si128(mask, keep), _mm_andnot_si128(mask, fresh));
@@ -90,18 +120,6 @@ struct Shuffle48 {
     }
 };
 
-inline void load48(const void* p, __m128i (&v)[3]) {
-    const uint8_t* b = static_cast<const uint8_t*>(p);
-    v[0] = load16(b);
-    v[1] = load16(b + 16);
-    v[2] = load16(b + 32);
-}
-inline void store48(void* p, const __m128i (&v)[3]) {
-    uint8_t* b = static_cast<uint8_t*>(p);
-    store16(b, v[0]);
-    store16(b + 16, v[1]);
-    store16(b + 32, v[2]);
-}
 #endif
 
 }}  // namespace zor::ZOR_INLINE_NS

@@ -113,6 +113,42 @@ TEST_P(Convert, SimdAgreesWithGeneric) {
     EXPECT_EQ(a, b);
 }
 
+// Mostly in-range values with a few values that the conversion instruction
+// cannot represent (NaN of either sign, infinities, 2^31 and beyond, values at
+// or below -32768) sprinkled over the rows: blocks with and without such a
+// value side by side, the odd value at every position of a block.  The
+// source starts at every float offset from a 16-byte boundary.
+TEST_P(Convert, FloatTo8uRareOutOfRangeValues) {
+    std::mt19937 rng(12);
+    float nanBits[2];
+    const uint32_t nb[2] = {0x7FC00001u, 0xFFC00000u};
+    std::memcpy(nanBits, nb, sizeof nb);
+    const float odd[] = {nanBits[0], nanBits[1], std::numeric_limits<float>::infinity(),
+                         -std::numeric_limits<float>::infinity(), 2147483648.0f, 3e9f, 1e30f, -2147483648.0f,
+                         -40000.0f, -32768.5f, -32768.0f, -32767.5f, 32767.5f, 65535.0f};
+    const ImageSize roi = {1001, 3};
+    const size_t count = size_t(roi.width) * roi.height;
+    std::vector<float> v(count);
+    for (float& x : v)
+        x = rng() % 2 ? float(rng() % 600) / 2.0f - 20.0f : std::uniform_real_distribution<float>(-5.0f, 260.0f)(rng);
+    for (size_t i = 0; i < v.size(); i += 1 + rng() % 200) v[i] = odd[rng() % (sizeof odd / sizeof odd[0])];
+    zt::GuardedBuffer buf(count * sizeof(float) + 32);
+    uint8_t* base = static_cast<uint8_t*>(buf.data());
+    base += (16 - reinterpret_cast<uintptr_t>(base) % 16) % 16;
+    for (int offset : {0, 4, 8, 12}) {
+        uint8_t* src = base + offset;
+        std::memcpy(src, v.data(), count * sizeof(float));
+        for (int mode : {1, 0}) {
+            std::vector<uint8_t> out(count, 0xAB);
+            ASSERT_EQ(z().zoriConvert_32f8u_C1R(reinterpret_cast<const float*>(src), roi.width * 4, out.data(),
+                                                roi.width, roi, mode),
+                      StatusOk);
+            for (size_t i = 0; i < count; ++i)
+                ASSERT_EQ(out[i], refU8(v[i], mode)) << "offset " << offset << " mode " << mode << " element " << i;
+        }
+    }
+}
+
 TEST_P(Convert, Checks) {
     uint8_t a[16] = {};
     float f[16] = {};

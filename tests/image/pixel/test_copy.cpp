@@ -324,6 +324,46 @@ TEST_P(SetFill, EveryForm) {
     checkSetC3<int16_t>(z().zoriSet_16s_C3R, {-32768, 1, 32767});
 }
 
+// Rows of several thousand bytes: the fill is written in pieces whose
+// boundaries must keep the channel phase, row by row and as one long row.
+TEST_P(SetFill, LongRows) {
+    std::mt19937 rng(52);
+    for (zpt::Layout l : {zpt::Layout{0, false}, zpt::Layout{5, true}}) {
+        {
+            const ImageSize roi = {1500, 3};
+            auto dst = image<uint8_t>(roi, 3, l, rng);
+            const uint8_t v[3] = {7, 8, 9};
+            ASSERT_EQ(z().zoriSet_8u_C3R(v, dst->roi(), dst->step(), roi), StatusOk);
+            const std::vector<uint8_t> c = contents(*dst);
+            for (size_t i = 0; i < c.size(); ++i) ASSERT_EQ(c[i], v[i % 3]) << i;
+            ASSERT_TRUE(dst->outsideIntact());
+        }
+        {
+            const ImageSize roi = {1100, 2};
+            auto dst = image<int16_t>(roi, 3, l, rng);
+            const int16_t v[3] = {-2, 300, -32768};
+            ASSERT_EQ(z().zoriSet_16s_C3R(v, dst->roi(), dst->step(), roi), StatusOk);
+            const std::vector<int16_t> c = contents(*dst);
+            for (size_t i = 0; i < c.size(); ++i) ASSERT_EQ(c[i], v[i % 3]) << i;
+            ASSERT_TRUE(dst->outsideIntact());
+        }
+        {
+            const ImageSize roi = {2001, 2};
+            auto dst = image<int16_t>(roi, 1, l, rng);
+            ASSERT_EQ(z().zoriSet_16s_C1R(-7, dst->roi(), dst->step(), roi), StatusOk);
+            ASSERT_EQ(contents(*dst), std::vector<int16_t>(size_t(roi.width) * roi.height, -7));
+            ASSERT_TRUE(dst->outsideIntact());
+        }
+        {
+            const ImageSize roi = {1901, 2};
+            auto dst = image<int32_t>(roi, 1, l, rng);
+            ASSERT_EQ(z().zoriSet_32s_C1R(-123456, dst->roi(), dst->step(), roi), StatusOk);
+            ASSERT_EQ(contents(*dst), std::vector<int32_t>(size_t(roi.width) * roi.height, -123456));
+            ASSERT_TRUE(dst->outsideIntact());
+        }
+    }
+}
+
 TEST_P(SetFill, FloatIsStoredBitForBit) {
     // a quiet NaN with a payload survives any register it passes through
     uint32_t bits = 0x7FC12345u;
