@@ -206,9 +206,10 @@ TEST_P(LinearFilter, FloatKernelsMatchReference) {
 // The float-kernel 8u result as defined: the sum accumulated in double in
 // neighbourhood order (top row first, left to right, the kernel read
 // backwards), then half up, NaN and negatives to 0, saturated.
-uint8_t float8uRef(const TightSource<uint8_t>& s, int x, int y, const std::vector<float>& k, ImageSize ks,
-                   ImagePoint a) {
-    zor::DoublePrecisionScope fpu;
+// The caller holds a DoublePrecisionScope.
+template <class T>
+double kernelSumRef(const TightSource<T>& s, int x, int y, const std::vector<float>& k, ImageSize ks,
+                    ImagePoint a) {
     double sum = 0;
     const int n = ks.width * ks.height;
     for (int r = 0; r < ks.height; ++r)
@@ -216,6 +217,13 @@ uint8_t float8uRef(const TightSource<uint8_t>& s, int x, int y, const std::vecto
             const double p = s.at(x + (q - (ks.width - 1 - a.x)) * s.c, y + r - (ks.height - 1 - a.y));
             sum = zor::toDouble(sum + p * double(k[size_t(n - 1 - r * ks.width - q)]));
         }
+    return sum;
+}
+
+uint8_t float8uRef(const TightSource<uint8_t>& s, int x, int y, const std::vector<float>& k, ImageSize ks,
+                   ImagePoint a) {
+    zor::DoublePrecisionScope fpu;
+    double sum = kernelSumRef(s, x, y, k, ks, a);
     if (sum > 0) sum = zor::toDouble(sum + 0.5);
     if (sum > 255) return 255;
     if (!(sum >= 0)) return 0;
@@ -225,13 +233,7 @@ uint8_t float8uRef(const TightSource<uint8_t>& s, int x, int y, const std::vecto
 int16_t float16sRef(const TightSource<int16_t>& s, int x, int y, const std::vector<float>& k, ImageSize ks,
                     ImagePoint a) {
     zor::DoublePrecisionScope fpu;
-    double sum = 0;
-    const int n = ks.width * ks.height;
-    for (int r = 0; r < ks.height; ++r)
-        for (int q = 0; q < ks.width; ++q) {
-            const double p = s.at(x + q - (ks.width - 1 - a.x), y + r - (ks.height - 1 - a.y));
-            sum = zor::toDouble(sum + p * double(k[size_t(n - 1 - r * ks.width - q)]));
-        }
+    double sum = kernelSumRef(s, x, y, k, ks, a);
     if (sum > 0) sum = zor::toDouble(sum + 0.5);
     if (sum < 0) sum = zor::toDouble(sum - 0.5);
     if (sum > 32767) return 32767;
