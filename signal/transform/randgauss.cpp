@@ -152,7 +152,20 @@ Status ZOR_CALL zorsRandGauss_32f(float* pDst, int len, void* pState) {
             _mm_storeu_pd(fs + t, _mm_sqrt_pd(_mm_div_pd(_mm_loadu_pd(fs + t), _mm_loadu_pd(qs + t))));
 #endif
         for (; t < want; ++t) fs[t] = std::sqrt(toDouble(fs[t] / qs[t]));
-        for (t = 0; t < want; ++t) {
+        t = 0;
+#if ZOR_SIMD >= 2
+        // Whole pairs two at a time: (u2, u1) of pair t, then of pair t + 1.
+        const int whole = (len - i) / 2 < want ? (len - i) / 2 : want;
+        const __m128d sdV = _mm_set1_pd(sd), meanV = _mm_set1_pd(mean);
+        for (; t + 2 <= whole; t += 2, i += 4) {
+            const __m128d sf = _mm_mul_pd(sdV, _mm_loadu_pd(fs + t));
+            const __m128d v2 = _mm_add_pd(_mm_mul_pd(sf, _mm_loadu_pd(u2s + t)), meanV);
+            const __m128d v1 = _mm_add_pd(_mm_mul_pd(sf, _mm_loadu_pd(u1s + t)), meanV);
+            _mm_storeu_ps(pDst + i, _mm_movelh_ps(_mm_cvtpd_ps(_mm_unpacklo_pd(v2, v1)),
+                                                  _mm_cvtpd_ps(_mm_unpackhi_pd(v2, v1))));
+        }
+#endif
+        for (; t < want; ++t) {
             const double sf = toDouble(sd * fs[t]);
             pDst[i++] = toFloat(toDouble(sf * u2s[t]) + mean);
             if (i < len) {
