@@ -233,19 +233,7 @@ Status medianGather(const T* top, int srcStep, T* dst, int dstStep, ImageSize ro
 
 // ---- maximum and minimum -------------------------------------------------------------
 
-struct MaxOp {
-    static uint8_t pick(uint8_t a, uint8_t b) { return a > b ? a : b; }
-#if ZOR_SIMD >= 2
-    static __m128i pick(__m128i a, __m128i b) { return _mm_max_epu8(a, b); }
-#endif
-};
-struct MinOp {
-    static uint8_t pick(uint8_t a, uint8_t b) { return a < b ? a : b; }
-#if ZOR_SIMD >= 2
-    static __m128i pick(__m128i a, __m128i b) { return _mm_min_epu8(a, b); }
-#endif
-};
-
+// Op: Max8u or Min8u (image/filter/extreme3x3.h).
 // out[x] = pick of p[x .. x + n - 1]
 template <class Op>
 void pickRow(const uint8_t* p, uint8_t* out, int w, int n) {
@@ -294,9 +282,8 @@ Status rankExtreme(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, I
     }
     const uint8_t* top = rowAt(src, srcStep, -anchor.y) - anchor.x;
     if (mask.width == 3 && mask.height == 3) {  // direct, no ring needed
-        using Op8 = std::conditional_t<std::is_same_v<Op, MaxOp>, Max8u, Min8u>;
         for (int y = 0; y < roi.height; ++y)
-            extreme3x3Row<Op8>(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), roi.width);
+            extreme3x3Row<Op>(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), roi.width);
         return StatusOk;
     }
     const size_t stride = (size_t(roi.width) + 31) & ~size_t(31);
@@ -325,55 +312,59 @@ Status rankExtreme(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, I
     return StatusOk;
 }
 
+// The median proper, from the neighbourhood's top-left source sample.
+Status medianFrom(const uint8_t* top, int srcStep, uint8_t* pDst, int dstStep, ImageSize roi, ImageSize mask) {
+#if ZOR_SIMD >= 2
+    if (mask.width == 3 && mask.height == 3 && roi.width >= 16) {
+        median3x3Rows(top, srcStep, pDst, dstStep, roi);
+        return StatusOk;
+    }
+    if (mask.width == 5 && mask.height == 5 && roi.width >= 16) {
+        median5x5Rows(top, srcStep, pDst, dstStep, roi);
+        return StatusOk;
+    }
+#endif
+    for (int y = 0; y < roi.height; ++y)
+        medianRowHistogram(rowAt(top, srcStep, y), srcStep, rowAt(pDst, dstStep, y), roi.width, mask);
+    return StatusOk;
+}
+Status medianFrom(const int16_t* top, int srcStep, int16_t* pDst, int dstStep, ImageSize roi, ImageSize mask) {
+    return medianGather(top, srcStep, pDst, dstStep, roi, mask);
+}
+
+template <class T>
+Status median(const T* pSrc, int srcStep, T* pDst, int dstStep, ImageSize roi, ImageSize mask,
+              ImagePoint anchor) {
+    if (Status s = checkRank(pSrc, srcStep, pDst, dstStep, roi, mask, anchor, true)) return s;
+    if (mask.width == 1 && mask.height == 1) {
+        copyRoi(pSrc, srcStep, pDst, dstStep, roi);
+        return StatusOk;
+    }
+    return medianFrom(rowAt(pSrc, srcStep, -anchor.y) - anchor.x, srcStep, pDst, dstStep, roi, mask);
+}
+
 }  // namespace
 
 Status ZOR_CALL zoriFilterMedian_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst,
                                         int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
                                         ImagePoint anchor) {
-    if (Status s = checkRank(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor, true))
-        return s;
-    if (maskSize.width == 1 && maskSize.height == 1) {
-        copyRoi(pSrc, srcStep, pDst, dstStep, dstRoiSize);
-        return StatusOk;
-    }
-    const uint8_t* top = rowAt(pSrc, srcStep, -anchor.y) - anchor.x;
-#if ZOR_SIMD >= 2
-    if (maskSize.width == 3 && maskSize.height == 3 && dstRoiSize.width >= 16) {
-        median3x3Rows(top, srcStep, pDst, dstStep, dstRoiSize);
-        return StatusOk;
-    }
-    if (maskSize.width == 5 && maskSize.height == 5 && dstRoiSize.width >= 16) {
-        median5x5Rows(top, srcStep, pDst, dstStep, dstRoiSize);
-        return StatusOk;
-    }
-#endif
-    for (int y = 0; y < dstRoiSize.height; ++y)
-        medianRowHistogram(rowAt(top, srcStep, y), srcStep, rowAt(pDst, dstStep, y),
-                           dstRoiSize.width, maskSize);
-    return StatusOk;
+    return median(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
 }
 
 Status ZOR_CALL zoriFilterMedian_16s_C1R(const int16_t* pSrc, int srcStep, int16_t* pDst,
                                          int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
                                          ImagePoint anchor) {
-    if (Status s = checkRank(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor, true))
-        return s;
-    if (maskSize.width == 1 && maskSize.height == 1) {
-        copyRoi(pSrc, srcStep, pDst, dstStep, dstRoiSize);
-        return StatusOk;
-    }
-    const int16_t* top = rowAt(pSrc, srcStep, -anchor.y) - anchor.x;
-    return medianGather(top, srcStep, pDst, dstStep, dstRoiSize, maskSize);
+    return median(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
 }
 
 Status ZOR_CALL zoriFilterMax_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                      ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor) {
-    return rankExtreme<MaxOp>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
+    return rankExtreme<Max8u>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
 }
 
 Status ZOR_CALL zoriFilterMin_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                      ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor) {
-    return rankExtreme<MinOp>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
+    return rankExtreme<Min8u>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
 }
 
 }}  // namespace zor::ZOR_NS
