@@ -199,27 +199,32 @@ public:
     IntKernelTable& operator=(const IntKernelTable&) = delete;
     bool ok() const { return table_ != nullptr; }
 
+    // The 16 samples at p of kernel columns q and q + 1 (0 past the kernel's
+    // width) as four vectors of 16-bit pairs, ready for pmaddwd.
+    void columnPairs(const uint8_t* p, int q, int channels, __m128i v[4]) const {
+        const __m128i zero = _mm_setzero_si128();
+        const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + q * channels));
+        const __m128i b = q + 1 < ks_.width
+                              ? _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + (q + 1) * channels))
+                              : zero;
+        const __m128i alo = _mm_unpacklo_epi8(a, zero), ahi = _mm_unpackhi_epi8(a, zero);
+        const __m128i blo = _mm_unpacklo_epi8(b, zero), bhi = _mm_unpackhi_epi8(b, zero);
+        v[0] = _mm_unpacklo_epi16(alo, blo);
+        v[1] = _mm_unpackhi_epi16(alo, blo);
+        v[2] = _mm_unpacklo_epi16(ahi, bhi);
+        v[3] = _mm_unpackhi_epi16(ahi, bhi);
+    }
+
     // Sums of 16 output samples starting at sample x.
     void sums(const uint8_t* top, int srcStep, int x, int channels, __m128i acc[4]) const {
-        const __m128i zero = _mm_setzero_si128();
-        acc[0] = acc[1] = acc[2] = acc[3] = zero;
+        for (int i = 0; i < 4; ++i) acc[i] = _mm_setzero_si128();
         for (int r = 0; r < ks_.height; ++r) {
             const uint8_t* p = rowAt(top, srcStep, r) + x;
             const __m128i* t = table_ + r * pairs_;
             for (int k = 0; k < pairs_; ++k) {
-                const int q = 2 * k;
-                const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + q * channels));
-                const __m128i b = q + 1 < ks_.width
-                                      ? _mm_loadu_si128(reinterpret_cast<const __m128i*>(
-                                            p + (q + 1) * channels))
-                                      : zero;
-                const __m128i alo = _mm_unpacklo_epi8(a, zero), ahi = _mm_unpackhi_epi8(a, zero);
-                const __m128i blo = _mm_unpacklo_epi8(b, zero), bhi = _mm_unpackhi_epi8(b, zero);
-                const __m128i c = t[k];
-                acc[0] = _mm_add_epi32(acc[0], _mm_madd_epi16(_mm_unpacklo_epi16(alo, blo), c));
-                acc[1] = _mm_add_epi32(acc[1], _mm_madd_epi16(_mm_unpackhi_epi16(alo, blo), c));
-                acc[2] = _mm_add_epi32(acc[2], _mm_madd_epi16(_mm_unpacklo_epi16(ahi, bhi), c));
-                acc[3] = _mm_add_epi32(acc[3], _mm_madd_epi16(_mm_unpackhi_epi16(ahi, bhi), c));
+                __m128i v[4];
+                columnPairs(p, 2 * k, channels, v);
+                for (int i = 0; i < 4; ++i) acc[i] = _mm_add_epi32(acc[i], _mm_madd_epi16(v[i], t[k]));
             }
         }
     }
@@ -235,16 +240,8 @@ public:
             const __m128i* t = table_ + r * pairs_;
             const __m128i* t2 = other.table_ + r * pairs_;
             for (int k = 0; k < pairs_; ++k) {
-                const int q = 2 * k;
-                const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + q * channels));
-                const __m128i b = q + 1 < ks_.width
-                                      ? _mm_loadu_si128(reinterpret_cast<const __m128i*>(
-                                            p + (q + 1) * channels))
-                                      : zero;
-                const __m128i alo = _mm_unpacklo_epi8(a, zero), ahi = _mm_unpackhi_epi8(a, zero);
-                const __m128i blo = _mm_unpacklo_epi8(b, zero), bhi = _mm_unpackhi_epi8(b, zero);
-                const __m128i v[4] = {_mm_unpacklo_epi16(alo, blo), _mm_unpackhi_epi16(alo, blo),
-                                      _mm_unpacklo_epi16(ahi, bhi), _mm_unpackhi_epi16(ahi, bhi)};
+                __m128i v[4];
+                columnPairs(p, 2 * k, channels, v);
                 for (int i = 0; i < 4; ++i) {
                     acc[i] = _mm_add_epi32(acc[i], _mm_madd_epi16(v[i], t[k]));
                     acc2[i] = _mm_add_epi32(acc2[i], _mm_madd_epi16(v[i], t2[k]));
