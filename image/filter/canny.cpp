@@ -230,25 +230,42 @@ inline __m128i abs16(__m128i v) {  // |v| as an unsigned 16-bit value (|-32768| 
 
 constexpr int16_t kBias = -32768;  // the stored form of a cleared magnitude
 
+// Stored magnitudes of 8 pixels into e[0 .. 7]; returns the cleared lanes.
+// A magnitude of 65536 saturates to 65535 here: the suppression, which
+// visits every block that keeps a magnitude, looks for it (with low below
+// 65535 such a block always keeps one).
+inline __m128i codedBlock(const int16_t* dx, const int16_t* dy, int16_t* e, __m128i lowV) {
+    const __m128i a = abs16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(dx)));
+    const __m128i b = abs16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(dy)));
+    const __m128i m = _mm_subs_epu16(_mm_adds_epu16(a, b), lowV);  // M - L above L, else 0
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(e), _mm_xor_si128(m, _mm_set1_epi16(kBias)));
+    return _mm_cmpeq_epi16(m, _mm_setzero_si128());
+}
+
 // Stored magnitudes of one ROI row into e[0 .. w-1], and the list of the
 // blocks of 8 that keep a magnitude (their first columns; a last partial
 // block is always listed, it overlaps the one before).  Returns the count,
-// or -1 when the row holds a magnitude of 65536.
+// or -1 when the scalar tail holds a magnitude of 65536.
 int codedRow(const int16_t* dx, const int16_t* dy, int16_t* e, int w, int low, int32_t* blocks) {
     const __m128i lowV = _mm_set1_epi16(static_cast<int16_t>(low));
-    const __m128i zero = _mm_setzero_si128(), bias = _mm_set1_epi16(kBias);
-    __m128i both = zero;  // bit 15 where |dx| = |dy| = 32768
     int x = 0, count = 0;
-    for (; x + 8 <= w; x += 8) {
-        const __m128i a = abs16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(dx + x)));
-        const __m128i b = abs16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(dy + x)));
-        both = _mm_or_si128(both, _mm_and_si128(a, b));
-        const __m128i m = _mm_subs_epu16(_mm_adds_epu16(a, b), lowV);  // M - L above L, else 0
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(e + x), _mm_xor_si128(m, bias));
-        blocks[count] = x;  // listed without a branch: the kept blocks are few and scattered
-        count += _mm_movemask_epi8(_mm_cmpeq_epi16(m, zero)) != 0xFFFF;
+    // The kept blocks are few and scattered: they are listed without a
+    // branch, two at a time from one mask of 16 cleared flags.
+    for (; x + 16 <= w; x += 16) {
+        const __m128i c0 = codedBlock(dx + x, dy + x, e + x, lowV);
+        const __m128i c1 = codedBlock(dx + x + 8, dy + x + 8, e + x + 8, lowV);
+        const unsigned cleared = static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(c0, c1)));
+        blocks[count] = x;
+        count += (cleared & 0xFFu) != 0xFFu;
+        blocks[count] = x + 8;
+        count += cleared < 0xFF00u;
     }
-    if (_mm_movemask_epi8(both) & 0xAAAA) return -1;
+    if (x + 8 <= w) {
+        const __m128i c0 = codedBlock(dx + x, dy + x, e + x, lowV);
+        blocks[count] = x;
+        count += _mm_movemask_epi8(c0) != 0xFFFF;
+        x += 8;
+    }
     if (x < w) blocks[count++] = x;
     for (; x < w; ++x) {
         const int32_t m = (dx[x] < 0 ? -int32_t(dx[x]) : dx[x]) + (dy[x] < 0 ? -int32_t(dy[x]) : dy[x]);
@@ -258,28 +275,27 @@ int codedRow(const int16_t* dx, const int16_t* dy, int16_t* e, int w, int low, i
     return count;
 }
 
-// Two 64-bit compare masks to four 32-bit ones.
-inline __m128i narrow(__m128d lo, __m128d hi) {
-    return _mm_castps_si128(_mm_shuffle_ps(_mm_castpd_ps(lo), _mm_castpd_ps(hi), _MM_SHUFFLE(2, 0, 2, 0)));
-}
-
-// Direction classes of 8 pixels from |dx| and |dy| (unsigned 16-bit): lanes
-// of c1 where ay < tan 22.5 * ax, of c3 where ay > tan 67.5 * ax, both as
-// double products, the exact operations of the scalar test.
-inline void directionClasses(__m128i ax, __m128i ay, __m128i& c1, __m128i& c3) {
-    const __m128d k22 = _mm_set1_pd(kTan22), k67 = _mm_set1_pd(kTan67);
+// Direction classes of 8 pixels from |dx| and |dy| (unsigned 16-bit): the
+// scalar test's double comparisons in exact integer form.  For ax > 0 the
+// product t * ax (t = tan 22.5 or tan 67.5, the double constants) is never
+// within 2^-15 of an integer, so ay < t * ax holds exactly when
+// ay <= floor(t * ax), and ay > t * ax when ay > floor(t * ax).  Both floors
+// come from F = floor(ax * 0x6A09E667 / 2^32), which equals floor(ax * tan
+// 22.5) and floor(ax * (tan 67.5 - 2)) for every ax up to 32768.  (ax = 0
+// differs only for dx = dy = 0, a magnitude that is always cleared.)
+// c1: the lanes of class 1 (ay < tan 22.5 * ax); notC3: the lanes outside
+// class 3 (ay <= tan 67.5 * ax).
+inline void directionClasses(__m128i ax, __m128i ay, __m128i& c1, __m128i& notC3) {
     const __m128i zero = _mm_setzero_si128();
-    __m128i lt[2], gt[2];
-    for (int h = 0; h < 2; ++h) {
-        const __m128i x32 = h ? _mm_unpackhi_epi16(ax, zero) : _mm_unpacklo_epi16(ax, zero);
-        const __m128i y32 = h ? _mm_unpackhi_epi16(ay, zero) : _mm_unpacklo_epi16(ay, zero);
-        const __m128d x0 = _mm_cvtepi32_pd(x32), x1 = _mm_cvtepi32_pd(_mm_shuffle_epi32(x32, 0xEE));
-        const __m128d y0 = _mm_cvtepi32_pd(y32), y1 = _mm_cvtepi32_pd(_mm_shuffle_epi32(y32, 0xEE));
-        lt[h] = narrow(_mm_cmplt_pd(y0, _mm_mul_pd(k22, x0)), _mm_cmplt_pd(y1, _mm_mul_pd(k22, x1)));
-        gt[h] = narrow(_mm_cmpgt_pd(y0, _mm_mul_pd(k67, x0)), _mm_cmpgt_pd(y1, _mm_mul_pd(k67, x1)));
-    }
-    c1 = _mm_packs_epi32(lt[0], lt[1]);
-    c3 = _mm_packs_epi32(gt[0], gt[1]);
+    const __m128i kHi = _mm_set1_epi16(0x6A09), kLo = _mm_set1_epi16(static_cast<int16_t>(0xE667));
+    // ax * 0x6A09E667 / 2^32 = (ax * 0x6A09 + ax * 0xE667 / 2^16) / 2^16
+    const __m128i hi = _mm_mulhi_epu16(ax, kHi), lo = _mm_mullo_epi16(ax, kHi);
+    const __m128i part = _mm_mulhi_epu16(ax, kLo);
+    const __m128i noCarry = _mm_cmpeq_epi16(_mm_add_epi16(lo, part), _mm_adds_epu16(lo, part));
+    const __m128i f = _mm_add_epi16(_mm_sub_epi16(hi, _mm_set1_epi16(-1)), noCarry);  // hi + carry
+    c1 = _mm_cmpeq_epi16(_mm_subs_epu16(ay, f), zero);
+    // 2 ax + F saturates at 65535 from ax = 16384 on, where ay cannot exceed it anyway
+    notC3 = _mm_cmpeq_epi16(_mm_subs_epu16(ay, _mm_adds_epu16(_mm_adds_epu16(ax, ax), f)), zero);
 }
 
 inline __m128i loadAt(const int16_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
@@ -361,9 +377,11 @@ void growSettled(EdgeStack<Coord>& stack, Waiting& map, uint8_t* dst, int dstSte
     }
 }
 
-// low in 0..65535, width >= 8.  strongFrom: the smallest E that is above
-// the high threshold, or -1 when none is.  dst is already cleared.  Returns
-// false, having written dst in part, when it meets a magnitude of 65536.
+// low in 0..65534, width >= 8.  strongFrom: the smallest E that is above
+// the high threshold, or -1 when none is.  Each dst row is cleared up to the
+// step as its turn comes: the growth only writes rows already visited.
+// Returns false, having written dst in part, when it meets a magnitude of
+// 65536.
 template <class Coord>
 bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, uint8_t* dst, int dstStep,
                  ImageSize roi, int low, int strongFrom, uint8_t* buffer) {
@@ -410,6 +428,7 @@ bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, u
         const int16_t* dxr = rowAt(dx, dxStep, r);
         const int16_t* dyr = rowAt(dy, dyStep, r);
         uint8_t* dstRow = rowAt(dst, dstStep, r);
+        std::memset(dstRow, 0, size_t(dstStep));
         std::memset(map.bits + size_t(r + 1) * map.stride, 0, map.stride);
 
         const int32_t* blocks = blockList[r & 1];
@@ -420,8 +439,10 @@ bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, u
             const __m128i m = loadAt(cur + x);
             const __m128i cleared = _mm_cmpeq_epi16(m, bias);
             const __m128i gx = loadAt(dxr + x), gy = loadAt(dyr + x);
-            __m128i c1, c3;
-            directionClasses(abs16(gx), abs16(gy), c1, c3);
+            const __m128i ax = abs16(gx), ay = abs16(gy);
+            if (_mm_movemask_epi8(_mm_and_si128(ax, ay)) & 0xAAAA) return false;  // a magnitude of 65536
+            __m128i c1, notC3;
+            directionClasses(ax, ay, c1, notC3);
             // a > b and a >= b (= not b > a) on the stored form
             const __m128i k1 = _mm_andnot_si128(_mm_cmpgt_epi16(loadAt(cur + x + 1), m),
                                                 _mm_cmpgt_epi16(m, loadAt(cur + x - 1)));
@@ -431,7 +452,7 @@ bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, u
             const __m128i k4 = _mm_cmpgt_epi16(m, _mm_max_epi16(loadAt(above + x - 1), loadAt(below + x + 1)));
             const __m128i differ = _mm_srai_epi16(_mm_xor_si128(gx, gy), 15);  // signs of dx and dy differ
             const __m128i keep = _mm_andnot_si128(
-                cleared, select(c1, k1, select(c3, k3, select(differ, k2, k4))));
+                cleared, select(c1, k1, select(notC3, select(differ, k2, k4), k3)));
             const __m128i strong = _mm_and_si128(
                 _mm_and_si128(keep, canBeStrong), _mm_xor_si128(_mm_cmpgt_epi16(strongV, m), ones));
             const __m128i strongBytes = _mm_packs_epi16(strong, strong);
@@ -483,9 +504,8 @@ Status ZOR_CALL zoriCanny_16s8u_C1R(const int16_t* pSrcDx, int srcDxStep, const 
     // truncation toward zero; magnitudes never exceed 65536
     const int low = lowThreshold >= 1e9f ? 1000000000 : static_cast<int>(lowThreshold);
     // whole rows up to the step are cleared, deliberately
-    std::memset(pDstEdges, 0, size_t(roiSize.height) * size_t(dstEdgeStep));
 #if ZOR_SIMD >= 2
-    if (roiSize.width >= 8 && low <= 65535) {
+    if (roiSize.width >= 8 && low < 65535) {
         // the smallest stored E = M - L with M > highThreshold (M is an integer)
         const double strongFrom = std::floor(static_cast<double>(highThreshold)) + 1.0 - low;
         const int from = strongFrom <= 65535.0 ? static_cast<int>(strongFrom) : -1;
@@ -496,9 +516,9 @@ Status ZOR_CALL zoriCanny_16s8u_C1R(const int16_t* pSrcDx, int srcDxStep, const 
                 : detectCoded<uint16_t>(pSrcDx, srcDxStep, pSrcDy, srcDyStep, pDstEdges, dstEdgeStep, roiSize, low,
                                         from, pBuffer);
         if (done) return StatusOk;
-        std::memset(pDstEdges, 0, size_t(roiSize.height) * size_t(dstEdgeStep));  // start again
     }
 #endif
+    std::memset(pDstEdges, 0, size_t(roiSize.height) * size_t(dstEdgeStep));
     if (wideCoordinates(roiSize))
         detect<uint32_t>(pSrcDx, srcDxStep, pSrcDy, srcDyStep, pDstEdges, dstEdgeStep, roiSize, low,
                          highThreshold, pBuffer);

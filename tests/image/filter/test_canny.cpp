@@ -255,6 +255,34 @@ TEST_P(Canny, SinglePixelsAndTies) {
     EXPECT_EQ(e[2 * 8 + 0], 255); // 11: kept, touches the edge
 }
 
+// Gradients on both sides of the direction class borders, ay < tan 22.5 ax
+// and ay > tan 67.5 ax as the double products decide them, each beside a
+// larger neighbour that suppresses it only in the class on one side.
+TEST_P(Canny, DirectionClassBorders) {
+    std::mt19937 rng(5 + variant());
+    const double t22 = 0.41421356237309503, t67 = 2.414213562373095;
+    // the largest ay with ay < t * ax, and the smallest with ay > t * ax
+    auto below22 = [&](int ax) { int ay = int(t22 * ax) + 1; while (!(double(ay) < t22 * ax)) --ay; return ay; };
+    auto above67 = [&](int ax) { int ay = int(t67 * ax) - 1; while (!(double(ay) > t67 * ax)) ++ay; return ay; };
+    for (int image = 0; image < 4; ++image) {
+        const int cols = 41, rows = 20;
+        Grad g(3 * cols, 3 * rows);
+        for (int j = 0; j < rows; ++j)
+            for (int i = 0; i < cols; ++i) {
+                const int k = j * cols + i, x = 3 * i, y = 3 * j;
+                const bool vertical = k % 2;
+                int ax = vertical ? 1 + int(rng() % 13500) : 1 + int(rng() % 32768);
+                if (k < 16) ax = vertical ? 1 + k / 2 : 32768 - k / 2;  // the ends of the ranges
+                const int ay = vertical ? above67(ax) - int(k / 2 % 2) : below22(ax) + int(k / 2 % 2);
+                const int sx = rng() % 2 ? 1 : -1, sy = rng() % 2 ? 1 : -1;
+                g.set(x, y, ax == 32768 ? -32768 : sx * ax, sy * ay);
+                if (vertical) g.set(x, y + 1, 32767, 32767);
+                else g.set(x + 1, y, 32767, 32767);
+            }
+        ASSERT_EQ(run(z(), g, 1, 2), reference(g, 1, 2)) << image;
+    }
+}
+
 TEST_P(Canny, HysteresisFollowsEightNeighbours) {
     const auto& z = this->z();
     // a weak chain touching a strong pixel becomes an edge, in every direction
