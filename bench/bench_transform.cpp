@@ -104,6 +104,8 @@ ZB_PAIR(fft_c_1024, "zorsFFTFwd_CToC_32f N=1024", zorFftC<10>, fftwFftC<10>,
         "FFTW split guru plan, MEASURE", 2.0);
 ZB_PAIR(fft_c_4096, "zorsFFTFwd_CToC_32f N=4096", zorFftC<12>, fftwFftC<12>,
         "FFTW split guru plan, MEASURE", 2.0);
+ZB_PAIR(fft_r_512, "zorsFFTFwd_RToCCS_32f N=512", zorFftR<9>, fftwFftR<9>,
+        "FFTW r2c, MEASURE", 2.0);
 ZB_PAIR(fft_r_1024, "zorsFFTFwd_RToCCS_32f N=1024", zorFftR<10>, fftwFftR<10>,
         "FFTW r2c, MEASURE", 2.0);
 ZB_PAIR(fft_r_4096, "zorsFFTFwd_RToCCS_32f N=4096", zorFftR<12>, fftwFftR<12>,

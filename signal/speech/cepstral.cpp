@@ -20,7 +20,13 @@ struct DctLifter {
     int32_t withC0;   // always 0 from the init function here
     float* lifter;    // lenCeps + 1 weights
     float* dct;       // lenCeps + 1 rows of lenDCT cosines
+    // The rows 1 .. lenCeps again, as doubles and side by side in pairs
+    // (row 2p + 1 and row 2p + 2 alternating along j, the last pair padded
+    // with zeros): the vector sums then load two coefficients' terms at once.
+    double* pairs;
 };
+
+inline int64_t pairCount(int64_t lenCeps) { return (lenCeps + 1) / 2; }
 
 }  // namespace
 
@@ -49,56 +55,57 @@ Status ZOR_CALL zorsPreemphasize_32f(float* pSrcDst, int len, float val) {
 }
 #endif
 
-// Cosine transform with lifter: the SSE2 path sums eight coefficients at once.
+#if ZOR_SIMD >= 2
+// G pairs of rows (w: G blocks of n pairs) times x, into sums[0 .. 2G-1].
+template <int G>
+inline void pairSums(const double* w, const float* x, int n, double* sums) {
+    __m128d acc[G];
+    for (int q = 0; q < G; ++q) acc[q] = _mm_setzero_pd();
+    for (int j = 0; j < n; ++j) {
+        const __m128d v = _mm_set1_pd(double(x[j]));
+        for (int q = 0; q < G; ++q)
+            acc[q] = _mm_add_pd(acc[q], _mm_mul_pd(_mm_load_pd(w + (int64_t(q) * n + j) * 2), v));
+    }
+    for (int q = 0; q < G; ++q) _mm_storeu_pd(sums + 2 * q, acc[q]);
+}
+#endif
+
+// Cosine transform with lifter.  Each coefficient's sum runs in increasing
+// j (the products of two floats are exact in double); the SSE2 path runs
+// two coefficients per register and up to eight side by side.
 #if ZOR_VARIANT != 1
 Status ZOR_CALL zorsDCTLifter_32f(const float* pSrc, float* pDst, const void* pDCTLifter) {
     if (Status s = anyNull(pSrc, pDst, pDCTLifter)) return s;
     const DctLifter* d = static_cast<const DctLifter*>(pDCTLifter);
     DoublePrecisionScope precision;
     const int n = d->lenDCT;
-    const float* table = d->dct;
-    auto row = [&](int i) { return table + int64_t(i) * n; };
-    // Several coefficients side by side: independent sums, each still in
-    // increasing j (the products of two floats are exact in double).
-    int i = 1;
-#if ZOR_SIMD >= 2
-    for (; i + 7 <= d->lenCeps; i += 8) {
-        __m128d acc[4] = {_mm_setzero_pd(), _mm_setzero_pd(), _mm_setzero_pd(), _mm_setzero_pd()};
-        for (int j = 0; j < n; ++j) {
-            const __m128d x = _mm_set1_pd(pSrc[j]);
-            for (int q = 0; q < 4; ++q) {
-                const __m128d w = _mm_set_pd(row(i + 2 * q + 1)[j], row(i + 2 * q)[j]);
-                acc[q] = _mm_add_pd(acc[q], _mm_mul_pd(w, x));
-            }
-        }
-        double sums[8];
-        for (int q = 0; q < 4; ++q) _mm_storeu_pd(sums + 2 * q, acc[q]);
-        for (int q = 0; q < 8; ++q) pDst[i + q - 1] = toFloat(sums[q] * double(d->lifter[i + q]));
-    }
-#endif
-    for (; i + 3 <= d->lenCeps; i += 4) {
-        const float *r0 = row(i), *r1 = row(i + 1), *r2 = row(i + 2), *r3 = row(i + 3);
-        double a0 = 0.0, a1 = 0.0, a2 = 0.0, a3 = 0.0;
-        for (int j = 0; j < n; ++j) {
-            const double x = pSrc[j];
-            a0 = toDouble(a0 + double(r0[j]) * x);
-            a1 = toDouble(a1 + double(r1[j]) * x);
-            a2 = toDouble(a2 + double(r2[j]) * x);
-            a3 = toDouble(a3 + double(r3[j]) * x);
-        }
-        pDst[i - 1] = toFloat(a0 * double(d->lifter[i]));
-        pDst[i] = toFloat(a1 * double(d->lifter[i + 1]));
-        pDst[i + 1] = toFloat(a2 * double(d->lifter[i + 2]));
-        pDst[i + 2] = toFloat(a3 * double(d->lifter[i + 3]));
-    }
+    auto finish = [&](int i, double sum) { pDst[i - 1] = toFloat(sum * double(d->lifter[i])); };
     auto coefficient = [&](int k) {
-        const float* r = row(k);
+        const float* r = d->dct + int64_t(k) * n;
         double acc = 0.0;
         for (int j = 0; j < n; ++j) acc = toDouble(acc + double(r[j]) * double(pSrc[j]));
-        return toFloat(acc * double(d->lifter[k]));
+        return acc;
     };
-    for (; i <= d->lenCeps; ++i) pDst[i - 1] = coefficient(i);
-    if (d->withC0) pDst[d->lenCeps] = coefficient(0);
+    int i = 1;
+#if ZOR_SIMD >= 2
+    // Groups of up to four pairs of rows; a pair past lenCeps sums its
+    // zero padding and is dropped.
+    const int64_t pairs = pairCount(d->lenCeps);
+    for (int64_t p = 0; p < pairs; p += 4) {
+        const int group = pairs - p < 4 ? int(pairs - p) : 4;
+        const double* w = d->pairs + p * 2 * n;
+        double sums[8];
+        switch (group) {  // a fixed count keeps the sums in registers
+            case 4: pairSums<4>(w, pSrc, n, sums); break;
+            case 3: pairSums<3>(w, pSrc, n, sums); break;
+            case 2: pairSums<2>(w, pSrc, n, sums); break;
+            default: pairSums<1>(w, pSrc, n, sums); break;
+        }
+        for (int q = 0; q < 2 * group && i <= d->lenCeps; ++q, ++i) finish(i, sums[q]);
+    }
+#endif
+    for (; i <= d->lenCeps; ++i) finish(i, coefficient(i));
+    if (d->withC0) pDst[d->lenCeps] = toFloat(coefficient(0) * double(d->lifter[0]));
     return StatusOk;
 }
 #endif
@@ -118,14 +125,17 @@ Status ZOR_CALL zorsDCTLifterInitAlloc_32f(void** ppDCTLifter, int lenDCT, int l
     if (!(lenDCT > 0 && lenCeps > 0 && nLifter >= 1 && lenDCT >= lenCeps)) return StatusBadSize;
     const int64_t rows = int64_t(lenCeps) + 1;
     const int64_t tableBytes = rows * lenDCT * 4;
-    if (tableBytes > 0x7FFFFFFF) return StatusNoMemory;
+    const int64_t pairBytes = pairCount(lenCeps) * 2 * lenDCT * 8;
+    if (pairBytes > 0x7FFFFFFF) return StatusNoMemory;
     DctLifter* d = static_cast<DctLifter*>(mem::alignedAlloc(sizeof(DctLifter)));
     float* lifter = static_cast<float*>(mem::alignedAlloc(static_cast<uint32_t>(rows * 4)));
     float* dct = static_cast<float*>(mem::alignedAlloc(static_cast<uint32_t>(tableBytes)));
-    if (!d || !lifter || !dct) {
+    double* pairs = static_cast<double*>(mem::alignedAlloc(static_cast<uint32_t>(pairBytes)));
+    if (!d || !lifter || !dct || !pairs) {
         mem::alignedFree(d);
         mem::alignedFree(lifter);
         mem::alignedFree(dct);
+        mem::alignedFree(pairs);
         return StatusNoMemory;
     }
     DoublePrecisionScope precision;
@@ -143,6 +153,13 @@ Status ZOR_CALL zorsDCTLifterInitAlloc_32f(void** ppDCTLifter, int lenDCT, int l
     d->withC0 = 0;
     d->lifter = lifter;
     d->dct = dct;
+    for (int64_t p = 0; p < pairCount(lenCeps); ++p)
+        for (int64_t j = 0; j < lenDCT; ++j)
+            for (int64_t h = 0; h < 2; ++h) {
+                const int64_t row = 2 * p + 1 + h;
+                pairs[(p * lenDCT + j) * 2 + h] = row <= lenCeps ? double(dct[row * lenDCT + j]) : 0.0;
+            }
+    d->pairs = pairs;
     *ppDCTLifter = d;
     return StatusOk;
 }
@@ -150,6 +167,7 @@ Status ZOR_CALL zorsDCTLifterInitAlloc_32f(void** ppDCTLifter, int lenDCT, int l
 Status ZOR_CALL zorsDCTLifterFree_32f(void* pDCTLifter) {
     if (!pDCTLifter) return StatusNullPointer;
     DctLifter* d = static_cast<DctLifter*>(pDCTLifter);
+    mem::alignedFree(d->pairs);
     mem::alignedFree(d->dct);
     mem::alignedFree(d->lifter);
     mem::alignedFree(d);
