@@ -42,6 +42,23 @@ Status ZOR_CALL zorsPreemphasize_32f(float* pSrcDst, int len, float val) {
     int n = len - 1;
 #if ZOR_SIMD >= 2
     const __m128d vv = _mm_set1_pd(v);
+    // Blocks of four from the top, each value converted once: a block's
+    // lowest predecessor comes from the block below it, which is loaded
+    // and converted one step ahead (before this block is stored).
+    if (n >= 7) {
+        auto pairAt = [](const float* p) {
+            return _mm_cvtps_pd(_mm_castsi128_ps(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p))));
+        };
+        __m128d lo = pairAt(x + n - 3), hi = pairAt(x + n - 1);
+        for (; n >= 7; n -= 4) {
+            const __m128d belowLo = pairAt(x + n - 7), belowHi = pairAt(x + n - 5);
+            const __m128d prevLo = _mm_shuffle_pd(belowHi, lo, 1), prevHi = _mm_shuffle_pd(lo, hi, 1);
+            const __m128d a = _mm_sub_pd(lo, _mm_mul_pd(vv, prevLo)), b = _mm_sub_pd(hi, _mm_mul_pd(vv, prevHi));
+            _mm_storeu_ps(x + n - 3, _mm_movelh_ps(_mm_cvtpd_ps(a), _mm_cvtpd_ps(b)));
+            lo = belowLo;
+            hi = belowHi;
+        }
+    }
     for (; n >= 4; n -= 4) {
         const __m128 cur = _mm_loadu_ps(x + n - 3), prev = _mm_loadu_ps(x + n - 4);
         const __m128d lo = _mm_sub_pd(_mm_cvtps_pd(cur), _mm_mul_pd(vv, _mm_cvtps_pd(prev)));
