@@ -663,9 +663,10 @@ public:
 
     // One output row from the pair rows of its source rows (rows[r]: source
     // row r of the neighbourhood), scaled.  P: the number of tap pairs when
-    // known at compile time, 0 otherwise.
+    // known at compile time, 0 otherwise.  Kept out of line: inlined into
+    // the caller, its loop lost registers to the caller's values.
     template <int P, class Scale>
-    void pairedRow(const uint16_t* const* rows, uint8_t* dst, int samples, int channels,
+    [[gnu::noinline]] void pairedRow(const uint16_t* const* rows, uint8_t* dst, int samples, int channels,
                    const Scale& scale) const {
         const int pairs = P ? P : pairs_;
         for (int x0 = 0; x0 < samples; x0 += 16) {
