@@ -499,34 +499,50 @@ inline __m128d lnPair(__m128i e, __m128 d, int o0, int o1) {
 }
 #endif
 
+#if ZOR_SIMD >= 2
+// The logarithms of q[0 .. 3] in place, unless one of them is not a
+// positive normal finite float or lies near a rounding midpoint: then false
+// and nothing is written.
+inline bool lnBlock(float* q) {
+    const __m128i one = _mm_set1_epi32(0x3F800000);
+    const __m128i u = _mm_loadu_si128(reinterpret_cast<const __m128i*>(q));
+    // Round the mantissa to 8 bits: a carry moves into the exponent.
+    // Lanes other than positive normal finite floats compute garbage
+    // harmlessly and are redone element by element.
+    const __m128i t = _mm_add_epi32(u, _mm_set1_epi32(0x4000));
+    const __m128i expo = _mm_and_si128(t, _mm_set1_epi32(0x7F800000));
+    const __m128i kbits = _mm_and_si128(t, _mm_set1_epi32(0x007F8000));
+    const __m128 m = _mm_castsi128_ps(_mm_add_epi32(_mm_sub_epi32(u, expo), one));
+    const __m128 d = _mm_sub_ps(m, _mm_castsi128_ps(_mm_or_si128(kbits, one)));
+    const __m128i e = _mm_sub_epi32(_mm_srli_epi32(expo, 23), _mm_set1_epi32(127));
+    const __m128d y0 = lnPair(e, d, lnRowOffset(q), lnRowOffset(q + 1));
+    const __m128d y1 = lnPair(_mm_shuffle_epi32(e, 0xEE), _mm_movehl_ps(d, d), lnRowOffset(q + 2), lnRowOffset(q + 3));
+    // Not a positive normal finite float: u outside [0x00800000,
+    // 0x7F800000), tested as one signed compare.
+    const __m128i special = _mm_cmpgt_epi32(_mm_add_epi32(u, _mm_set1_epi32(0x7F800000)),
+                                            _mm_set1_epi32(-0x01000001));
+    if (_mm_movemask_epi8(_mm_or_si128(special, nearMidpoint<kLnMargin>(y0, y1))) != 0) return false;
+    _mm_storeu_ps(q, _mm_movelh_ps(_mm_cvtpd_ps(y0), _mm_cvtpd_ps(y1)));
+    return true;
+}
+#endif
+
 [[maybe_unused]] Status lnInPlace(float* p, int n) {
     Status first = StatusOk;
     int i = 0;
 #if ZOR_SIMD >= 2
-    const __m128i one = _mm_set1_epi32(0x3F800000);
-    for (; i + 4 <= n; i += 4) {
-        const __m128i u = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i));
-        // Round the mantissa to 8 bits: a carry moves into the exponent.
-        // Lanes other than positive normal finite floats compute garbage
-        // harmlessly and are redone element by element.
-        const __m128i t = _mm_add_epi32(u, _mm_set1_epi32(0x4000));
-        const __m128i expo = _mm_and_si128(t, _mm_set1_epi32(0x7F800000));
-        const __m128i kbits = _mm_and_si128(t, _mm_set1_epi32(0x007F8000));
-        const __m128 m = _mm_castsi128_ps(_mm_add_epi32(_mm_sub_epi32(u, expo), one));
-        const __m128 d = _mm_sub_ps(m, _mm_castsi128_ps(_mm_or_si128(kbits, one)));
-        const __m128i e = _mm_sub_epi32(_mm_srli_epi32(expo, 23), _mm_set1_epi32(127));
-        const __m128d y0 = lnPair(e, d, lnRowOffset(p + i), lnRowOffset(p + i + 1));
-        const __m128d y1 = lnPair(_mm_shuffle_epi32(e, 0xEE), _mm_movehl_ps(d, d),
-                                  lnRowOffset(p + i + 2), lnRowOffset(p + i + 3));
-        // Not a positive normal finite float: u outside [0x00800000,
-        // 0x7F800000), tested as one signed compare.
-        const __m128i special = _mm_cmpgt_epi32(_mm_add_epi32(u, _mm_set1_epi32(0x7F800000)),
-                                                _mm_set1_epi32(-0x01000001));
-        if (_mm_movemask_epi8(_mm_or_si128(special, nearMidpoint<kLnMargin>(y0, y1))) == 0) {
-            _mm_storeu_ps(p + i, _mm_movelh_ps(_mm_cvtpd_ps(y0), _mm_cvtpd_ps(y1)));
-            continue;
+    for (; i + 4 <= n; i += 4)
+        if (!lnBlock(p + i))
+            for (int j = i; j < i + 4; ++j) p[j] = lnElement(p[j], first);
+    // The last one to three elements as a block padded with ones, so that
+    // short vectors avoid the library too.
+    if (i < n) {
+        float q[4] = {1.0f, 1.0f, 1.0f, 1.0f};
+        std::memcpy(q, p + i, sizeof(float) * size_t(n - i));
+        if (lnBlock(q)) {
+            std::memcpy(p + i, q, sizeof(float) * size_t(n - i));
+            i = n;
         }
-        for (int j = i; j < i + 4; ++j) p[j] = lnElement(p[j], first);
     }
 #else
     DoublePrecisionScope precision;
