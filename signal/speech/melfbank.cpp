@@ -4,6 +4,7 @@
 #include "frame/status.h"
 #include "frame/fpu.h"
 #include "frame/memory.h"
+#include "signal/transform/fft_internal.h"
 
 #include <cmath>
 #include <cstring>
@@ -210,9 +211,13 @@ Status ZOR_CALL zorsEvalFBank_32f(const float* pSrc, float* pDst, void* pFBank) 
     if (b->mode & kSpectrum) {
         // The transform writes every one of the fftLen + 2 floats; the
         // magnitudes then replace the bins in place.
-        if (Status st = zorsFFTFwd_RToCCS_32f(pSrc, b->spectrum, b->fftSpec, nullptr)) return st;
-        vec::zorsMagnitude_32fc(reinterpret_cast<const Complex32f*>(b->spectrum), b->spectrum,
-                                b->fftLen / 2 + 1);
+        // Lengths up to 1024 take the transform's own magnitudes, without
+        // the CCS round trip through memory; same values.
+        if (!realTransformMagnitudes(b->fftSpec, pSrc, b->spectrum)) {
+            if (Status st = zorsFFTFwd_RToCCS_32f(pSrc, b->spectrum, b->fftSpec, nullptr)) return st;
+            vec::zorsMagnitude_32fc(reinterpret_cast<const Complex32f*>(b->spectrum), b->spectrum,
+                                    b->fftLen / 2 + 1);
+        }
         s = b->spectrum;
     }
     // The rising and falling sums of a filter are independent chains: run

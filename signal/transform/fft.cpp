@@ -15,6 +15,8 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/memory.h"
+#include "frame/fpu.h"
+#include "signal/transform/fft_internal.h"
 
 #include <cmath>
 #include <cstring>
@@ -389,10 +391,13 @@ Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const floa
     return StatusOk;
 }
 
-// CCS from the half-length transform Z (zr, zi; m = N/2 values):
+// The spectrum from the half-length transform Z (zr, zi; m = N/2 values):
 // X[k] = E + T, X[m-k] = conj(E - T) with E = (Z[k] + conj Z[m-k]) / 2,
-// T = w^k (Z[k] - conj Z[m-k]) / 2i.
-void recombine(const FftSpec* s, const float* zr, const float* zi, float* dst, int m) {
+// T = w^k (Z[k] - conj Z[m-k]) / 2i.  The sink takes bins k .. k+3 in lane
+// order (up), bins m-k-3 .. m-k with lane l holding bin m-k-l (down), and
+// X[0], X[m], both real (ends).
+template <class Sink>
+void recombine(const FftSpec* s, const float* zr, const float* zi, int m, Sink& out) {
     const float* rc = s->realTwiddles;
     const float* rs = s->realTwiddles2;
     const V half = splat(0.5f);
@@ -404,17 +409,62 @@ void recombine(const FftSpec* s, const float* zr, const float* zi, float* dst, i
         const V dr = ar - br, di = ai + bi;
         const V c = ld(rc + k), sn = ld(rs + k);
         const V tr = c * di + sn * dr, ti = sn * di - c * dr;
-        stPairs(dst + 2 * k, er + tr, ei + ti);
-        // conj(E - T) for m-k, m-k-1, .. : written in reverse lane order
-        const V xr = reversed(er - tr), xi = reversed(ti - ei);
-        stPairs(dst + 2 * (m - k - 3), xr, xi);
+        out.up(k, er + tr, ei + ti);
+        out.down(m - k - 3, er - tr, ti - ei);
     }
     const float r0 = zr[0], i0 = zi[0];
-    dst[0] = r0 + i0;
-    dst[1] = 0.0f;
-    dst[2 * m] = r0 - i0;
-    dst[2 * m + 1] = 0.0f;
+    out.ends(r0 + i0, r0 - i0, m);
 }
+
+// Writes the CCS layout.
+struct CcsSink {
+    float* dst;
+    void up(int k, V re, V im) { stPairs(dst + 2 * k, re, im); }
+    void down(int k, V re, V im) { stPairs(dst + 2 * k, reversed(re), reversed(im)); }
+    void ends(float x0, float xm, int m) {
+        dst[0] = x0;
+        dst[1] = 0.0f;
+        dst[2 * m] = xm;
+        dst[2 * m + 1] = 0.0f;
+    }
+};
+
+// Writes the magnitudes of the bins, each the float nearest the double
+// square root of re^2 + im^2 formed in double: the values the CCS output
+// followed by the complex magnitude gives.
+struct MagnitudeSink {
+    float* mag;
+#if ZOR_SIMD >= 2
+    static V magnitudes(V re, V im) {
+        auto half = [](__m128 r, __m128 i) {
+            const __m128d a = _mm_cvtps_pd(r), b = _mm_cvtps_pd(i);
+            return _mm_cvtpd_ps(_mm_sqrt_pd(_mm_add_pd(_mm_mul_pd(a, a), _mm_mul_pd(b, b))));
+        };
+        return {_mm_movelh_ps(half(re.v, im.v), half(_mm_movehl_ps(re.v, re.v), _mm_movehl_ps(im.v, im.v)))};
+    }
+#else
+    static V magnitudes(V re, V im) {
+        alignas(16) float r[4], i[4], out[4];
+        st(r, re);
+        st(i, im);
+        for (int l = 0; l < 4; ++l) {
+            const double a = r[l], b = i[l];
+            out[l] = toFloat(std::sqrt(toDouble(a * a + b * b)));
+        }
+        return ld(out);
+    }
+#endif
+    static float magnitude(float x) {
+        const double a = x;
+        return toFloat(std::sqrt(toDouble(a * a + 0.0)));
+    }
+    void up(int k, V re, V im) { st(mag + k, magnitudes(re, im)); }
+    void down(int k, V re, V im) { st(mag + k, reversed(magnitudes(re, im))); }
+    void ends(float x0, float xm, int m) {
+        mag[0] = magnitude(x0);
+        mag[m] = magnitude(xm);
+    }
+};
 
 Status forwardReal(const FftSpec* s, const float* src, float* dst, uint8_t* pBuffer) {
     const int order = s->order;
@@ -443,16 +493,44 @@ Status forwardReal(const FftSpec* s, const float* src, float* dst, uint8_t* pBuf
         }
         float* w = reinterpret_cast<float*>((reinterpret_cast<uintptr_t>(pBuffer) + 31) & ~uintptr_t(31));
         runComplex(s, in, w, w + m, w, w + m);
-        recombine(s, w, w + m, dst, m);
+        CcsSink out{dst};
+        recombine(s, w, w + m, m, out);
         mem::alignedFree(own);
     } else {
         alignas(16) float w[1 << kSmallOrder];
         runComplex(s, in, w, w + m, w, w + m);
-        recombine(s, w, w + m, dst, m);
+        CcsSink out{dst};
+        recombine(s, w, w + m, m, out);
     }
     if (scaled) scaleArray(dst, n + 2, s->scale);
     return StatusOk;
 }
+
+}  // namespace
+
+// The magnitudes of the forward real transform without the CCS in between
+// (for the filter bank's own transform): mag[0 .. N/2] as the transform
+// followed by the complex magnitude would give them.  False, with nothing
+// written, for the specs it does not cover (short, long or scaled ones).
+// Not where the arithmetic runs on the x87 unit: there, values kept in its
+// registers would skip the rounding to float that the CCS store makes.
+bool realTransformMagnitudes(const void* pSpec, const float* src, float* mag) {
+#if ZOR_X87_MATH
+    (void)pSpec, (void)src, (void)mag;
+    return false;
+#else
+    const FftSpec* s = static_cast<const FftSpec*>(pSpec);
+    if (s->id != kIdReal || s->order < 5 || s->order > kSmallOrder || s->forwardScaled) return false;
+    const int m = 1 << (s->order - 1);
+    alignas(16) float w[1 << kSmallOrder];
+    runComplex(s, PairInput{src}, w, w + m, w, w + m);
+    MagnitudeSink out{mag};
+    recombine(s, w, w + m, m, out);
+    return true;
+#endif
+}
+
+namespace {
 
 Status initSpec(void** ppSpec, int order, int flag, int hint, bool real) {
     if (!ppSpec) return StatusNullPointer;
