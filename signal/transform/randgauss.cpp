@@ -42,14 +42,11 @@ struct Generator {
         const uint32_t tp = top ? t - 18u : t;
         w1 = static_cast<int32_t>(tp + m + 1013904243u);
         const uint32_t s = a - b - top;
-        uint32_t an;
-        if (static_cast<int32_t>(s) < 0) {
-            borrow = 0xFFFFFFFFu;
-            an = s - 18u;
-        } else {
-            borrow = 0;
-            an = s;
-        }
+        // s < 0 as a signed word: borrow, and 18 less; without a branch, as
+        // the sign is a coin toss
+        const uint32_t negative = static_cast<uint32_t>(static_cast<int32_t>(s) >> 31);
+        borrow = negative;
+        const uint32_t an = s - (negative & 18u);
         c = a;
         b = tp;
         a = an;
