@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <cstring>
 #include <random>
+#include <type_traits>
 #include <vector>
 
 #include "tests/image/pixel/pixel_test_util.h"
@@ -329,24 +330,19 @@ TEST_P(SetFill, EveryForm) {
 TEST_P(SetFill, LongRows) {
     std::mt19937 rng(52);
     for (zpt::Layout l : {zpt::Layout{0, false}, zpt::Layout{5, true}}) {
-        {
-            const ImageSize roi = {1500, 3};
-            auto dst = image<uint8_t>(roi, 3, l, rng);
-            const uint8_t v[3] = {7, 8, 9};
-            ASSERT_EQ(z().zoriSet_8u_C3R(v, dst->roi(), dst->step(), roi), StatusOk);
-            const std::vector<uint8_t> c = contents(*dst);
+        // three-channel fill: every pixel holds v, nothing outside the ROI moves
+        auto setC3 = [&](auto set, ImageSize roi, const auto (&v)[3]) {
+            using T = std::remove_const_t<std::remove_reference_t<decltype(v[0])>>;
+            auto dst = image<T>(roi, 3, l, rng);
+            ASSERT_EQ(set(v, dst->roi(), dst->step(), roi), StatusOk);
+            const std::vector<T> c = contents(*dst);
             for (size_t i = 0; i < c.size(); ++i) ASSERT_EQ(c[i], v[i % 3]) << i;
             ASSERT_TRUE(dst->outsideIntact());
-        }
-        {
-            const ImageSize roi = {1100, 2};
-            auto dst = image<int16_t>(roi, 3, l, rng);
-            const int16_t v[3] = {-2, 300, -32768};
-            ASSERT_EQ(z().zoriSet_16s_C3R(v, dst->roi(), dst->step(), roi), StatusOk);
-            const std::vector<int16_t> c = contents(*dst);
-            for (size_t i = 0; i < c.size(); ++i) ASSERT_EQ(c[i], v[i % 3]) << i;
-            ASSERT_TRUE(dst->outsideIntact());
-        }
+        };
+        const uint8_t v8[3] = {7, 8, 9};
+        setC3(z().zoriSet_8u_C3R, ImageSize{1500, 3}, v8);
+        const int16_t v16[3] = {-2, 300, -32768};
+        setC3(z().zoriSet_16s_C3R, ImageSize{1100, 2}, v16);
         {
             const ImageSize roi = {2001, 2};
             auto dst = image<int16_t>(roi, 1, l, rng);
