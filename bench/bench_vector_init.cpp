@@ -87,6 +87,34 @@ void loopHamming(benchmark::State& state) {
         benchmark::ClobberMemory();
     }
 }
+// Alternating two lengths: every call rebuilds its weights, which is what a
+// window applied once costs.
+void zorHammingAlternating(benchmark::State& state) {
+    const std::vector<float> src = ramp<float>(kWin, 1.0);
+    std::vector<float> dst(kWin);
+    int n = kWin;
+    for (auto _ : state) {
+        zorsWinHamming_32f(src.data(), dst.data(), n);
+        n = 2 * kWin - 1 - n;
+        benchmark::DoNotOptimize(dst.data());
+    }
+}
+void loopHammingAlternating(benchmark::State& state) {
+    const std::vector<float> src = ramp<float>(kWin, 1.0);
+    const std::vector<float> w[2] = {hammingTable(kWin), hammingTable(kWin - 1)};
+    std::vector<float> dst(kWin);
+    int k = 0;
+    for (auto _ : state) {
+        const int n = kWin - k;
+        const float* s = src.data();
+        const float* pw = w[k].data();
+        float* d = dst.data();
+        for (int i = 0; i < n; ++i) d[i] = s[i] * pw[i];
+        k ^= 1;
+        benchmark::DoNotOptimize(dst.data());
+        benchmark::ClobberMemory();
+    }
+}
 void cvHamming(benchmark::State& state) {
     const std::vector<float> src = ramp<float>(kWin, 1.0), w = hammingTable(kWin);
     std::vector<float> dst(kWin);
@@ -107,5 +135,7 @@ ZB_PAIR(cvt_16s32f, "zorsConvert_16s32f 64Ki", zorConvert16s32f, cvConvert16s32f
         "cv::Mat::convertTo(CV_32F)", 1.0);
 ZB_PAIR(win_hamming, "zorsWinHamming_32f 1024", zorHamming, loopHamming,
         "loop over a precomputed window", 2.0);
+ZB_PAIR(win_hamming_fresh, "zorsWinHamming_32f 1024/1023 alternating", zorHammingAlternating,
+        loopHammingAlternating, "loop over two precomputed windows", 0);
 ZB_PAIR(win_hamming_cv, "zorsWinHamming_32f 1024 (vs cv)", zorHamming, cvHamming,
         "cv::multiply by a precomputed window", 0);

@@ -8,10 +8,15 @@
 // the middle element keeps its value (its weight is 1); with N even the two
 // middle elements take the weight of the angle after the last round.
 //
-// Every result depends on the exact sequence of roundings in the
-// recurrence, a serial chain of one multiply and one add per round: that
-// chain, not the data, bounds the speed, so one generic entry serves every
-// processor.
+// Every weight depends on the exact sequence of roundings in the
+// recurrence, a serial chain of one multiply and one add per round, which
+// takes far longer than the multiplications it feeds.  Callers apply the
+// same window to frame after frame, so the SSE2 variants keep the weights of
+// the last window they built (kind, length and the floating-point control
+// state they were computed under) and apply them as a table: the products
+// are the same double multiplies rounded once, so the bits do not change.
+// The generic variant, and any call that finds the table in use by another
+// thread or too long to keep, runs the recurrence as it goes.
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
@@ -22,15 +27,17 @@
 
 namespace zor { namespace ZOR_NS {
 
-#if ZOR_VARIANT == 0
+#if ZOR_VARIANT != 1
 namespace {
 
 constexpr double kTwoPi = 6.283185307179586;
 
 struct Hamming {
+    static constexpr int id = 1;
     static double weight(double cosine) { return 0.54 - 0.46 * cosine; }
 };
 struct Hann {
+    static constexpr int id = 2;
     static double weight(double cosine) { return 0.5 * (1.0 - cosine); }
 };
 
@@ -52,10 +59,11 @@ inline C weigh(const C& v, double w) {
     return C{weigh(v.re, w), weigh(v.im, w)};
 }
 
-template <class Kind, class T>
-Status applyWindow(const T* pSrc, T* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), len < 3 ? StatusBadSize : StatusOk)) return s;
-
+// Runs the recurrence, handing each round's weight to visit(front, back, w)
+// and, for even N, the middle pair's weight last.  visit runs inside the
+// 53-bit precision scope.
+template <class Kind, class Visit>
+void walkWeights(int len, Visit&& visit) {
     // The angle step is rounded to double before the cosine sees it; the
     // cosine itself runs with the caller's FPU settings in every variant.
     double step;
@@ -70,21 +78,119 @@ Status applyWindow(const T* pSrc, T* pDst, int len) {
     double cosine = 1.0, sine = 0.0;
     int front = 0, back = len - 1;
     for (const int rounds = (len - 1) / 2; front < rounds; ++front, --back) {
-        const double w = Kind::weight(cosine);
-        pDst[front] = weigh(pSrc[front], w);
-        pDst[back] = weigh(pSrc[back], w);
+        visit(front, back, Kind::weight(cosine));
         const double nextCos = cosine * c - sine * s;
         sine = sine * c + cosine * s;
         cosine = nextCos;
     }
-    if (len & 1) {
-        // The middle keeps its bits (no trip through the FPU).
-        if (pDst != pSrc) std::memcpy(pDst + front, pSrc + front, sizeof(T));
-    } else {
-        const double w = Kind::weight(cosine);
+    if (!(len & 1)) visit(front, back, Kind::weight(cosine));
+}
+
+template <class Kind, class T>
+void streamWindow(const T* pSrc, T* pDst, int len) {
+    walkWeights<Kind>(len, [&](int front, int back, double w) {
         pDst[front] = weigh(pSrc[front], w);
         pDst[back] = weigh(pSrc[back], w);
+    });
+    // The middle keeps its bits (no trip through the FPU).
+    if ((len & 1) && pDst != pSrc) std::memcpy(pDst + len / 2, pSrc + len / 2, sizeof(T));
+}
+
+#  if ZOR_SIMD >= 2
+// ---- the kept table -------------------------------------------------------------
+
+constexpr int kKeptMax = 4096;
+
+// Zero-initialised static storage: busy is a spin-free try-lock, kind 0
+// matches no window.
+struct KeptWeights {
+    int busy;
+    int kind, len;
+    uint32_t state;
+    alignas(16) double w[kKeptMax];
+};
+KeptWeights kept;
+
+// Everything the recurrence's roundings depend on: the SSE control bits
+// (rounding, flush-to-zero, denormals-are-zero, not the sticky flags) and
+// the x87 control word, which the library cosine may use.
+inline uint32_t arithmeticState() {
+    uint16_t cw;
+    __asm__ volatile("fnstcw %0" : "=m"(cw));
+    return (_mm_getcsr() & 0xFFC0u) | (uint32_t(cw) << 16);
+}
+
+// Weights in frame order; the odd middle's 1 is a placeholder, as that
+// element is restored bit for bit.
+template <class Kind>
+void fillWeights(int len, double* w) {
+    walkWeights<Kind>(len, [w](int front, int back, double weight) { w[front] = w[back] = weight; });
+    if (len & 1) w[len / 2] = 1.0;
+}
+
+template <class T>
+void applyWeights(const T* s, T* d, int n, const double* w) {
+    for (int i = 0; i < n; ++i) d[i] = weigh(s[i], w[i]);
+}
+// Two floats widened straight from memory; this form keeps the widening
+// off the shuffle unit, which is what bounds these loops.
+inline __m128d widen2(const void* p) {
+    return _mm_cvtps_pd(_mm_castpd_ps(_mm_load_sd(static_cast<const double*>(p))));
+}
+inline void narrowStore4(void* p, __m128d lo, __m128d hi) {
+    _mm_storeu_ps(static_cast<float*>(p), _mm_movelh_ps(_mm_cvtpd_ps(lo), _mm_cvtpd_ps(hi)));
+}
+void applyWeights(const float* s, float* d, int n, const double* w) {
+    int i = 0;
+    for (; i + 4 <= n; i += 4)
+        narrowStore4(d + i, _mm_mul_pd(widen2(s + i), _mm_load_pd(w + i)),
+                     _mm_mul_pd(widen2(s + i + 2), _mm_load_pd(w + i + 2)));
+    for (; i < n; ++i) d[i] = weigh(s[i], w[i]);
+}
+void applyWeights(const Complex32f* s, Complex32f* d, int n, const double* w) {
+    int k = 0;
+    for (; k + 2 <= n; k += 2)
+        narrowStore4(d + k, _mm_mul_pd(widen2(s + k), _mm_set1_pd(w[k])),
+                     _mm_mul_pd(widen2(s + k + 1), _mm_set1_pd(w[k + 1])));
+    for (; k < n; ++k) d[k] = weigh(s[k], w[k]);
+}
+void applyWeights(const double* s, double* d, int n, const double* w) {
+    int i = 0;
+    for (; i + 2 <= n; i += 2) _mm_storeu_pd(d + i, _mm_mul_pd(_mm_loadu_pd(s + i), _mm_load_pd(w + i)));
+    for (; i < n; ++i) d[i] = weigh(s[i], w[i]);
+}
+void applyWeights(const Complex64f* s, Complex64f* d, int n, const double* w) {
+    for (int k = 0; k < n; ++k) _mm_storeu_pd(&d[k].re, _mm_mul_pd(_mm_loadu_pd(&s[k].re), _mm_set1_pd(w[k])));
+}
+
+// Applies the kept table, rebuilding it first if it belongs to another
+// window; false when another thread holds it or the frame is too long.
+template <class Kind, class T>
+bool keptWindow(const T* pSrc, T* pDst, int len) {
+    if (len > kKeptMax || __atomic_exchange_n(&kept.busy, 1, __ATOMIC_ACQUIRE)) return false;
+    const uint32_t state = arithmeticState();
+    if (kept.kind != Kind::id || kept.len != len || kept.state != state) {
+        fillWeights<Kind>(len, kept.w);
+        kept.kind = Kind::id;
+        kept.len = len;
+        kept.state = state;
     }
+    T middle;
+    std::memcpy(&middle, pSrc + len / 2, sizeof(T));
+    applyWeights(pSrc, pDst, len, kept.w);
+    if (len & 1) std::memcpy(pDst + len / 2, &middle, sizeof(T));
+    __atomic_store_n(&kept.busy, 0, __ATOMIC_RELEASE);
+    return true;
+}
+#  endif
+
+template <class Kind, class T>
+Status applyWindow(const T* pSrc, T* pDst, int len) {
+    if (Status s = checkFirst(anyNull(pSrc, pDst), len < 3 ? StatusBadSize : StatusOk)) return s;
+#  if ZOR_SIMD >= 2
+    if (keptWindow<Kind>(pSrc, pDst, len)) return StatusOk;
+#  endif
+    streamWindow<Kind>(pSrc, pDst, len);
     return StatusOk;
 }
 
@@ -129,6 +235,6 @@ Status ZOR_CALL zorsWinHamming_64fc_I(Complex64f* pSrcDst, int len) {
 Status ZOR_CALL zorsWinHann_32f_I(float* pSrcDst, int len) {
     return applyWindow<Hann>(pSrcDst, pSrcDst, len);
 }
-#endif  // ZOR_VARIANT == 0
+#endif  // ZOR_VARIANT != 1
 
 }}  // namespace zor::ZOR_NS

@@ -1,12 +1,16 @@
 // Hamming and Hann windows, on every variant's entries.
 #include <gtest/gtest.h>
 
+#include <cfenv>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
 #include <functional>
 #include <random>
 #include <vector>
+#if !defined(_WIN32)
+#  include <thread>
+#endif
 
 #include "frame/fpu.h"
 #include "tests/support/guarded.h"
@@ -262,6 +266,63 @@ TEST_P(Window, MiddleElements) {
         for (int k = 1; k < n / 2; ++k) ASSERT_GT(v[k], v[k - 1]);
     }
 }
+
+// A window applied again must not reuse weights built for another length,
+// another kind or another rounding mode: each call is checked against the
+// recurrence run under the mode in force.
+TEST_P(Window, RepeatedCallsFollowLengthKindAndRounding) {
+    const zt::Api& z = this->z();
+    struct Step { int n; bool hann; int mode; };
+    const Step steps[] = {{1024, false, FE_TONEAREST}, {1024, false, FE_TONEAREST}, {1024, true, FE_TONEAREST},
+                          {1024, false, FE_TONEAREST}, {1023, false, FE_TONEAREST}, {1024, false, FE_DOWNWARD},
+                          {1024, false, FE_DOWNWARD},  {1024, false, FE_UPWARD},    {1024, false, FE_TONEAREST},
+                          {5000, false, FE_TONEAREST}, {5000, false, FE_TONEAREST}, {1024, false, FE_TONEAREST}};
+    std::mt19937 rng(21);
+    std::uniform_real_distribution<float> u(-3.0f, 3.0f);
+    std::vector<float> src(5000);
+    for (float& x : src) x = u(rng);
+    std::vector<float> nearest;
+    for (const Step& st : steps) {
+        SCOPED_TRACE(testing::Message() << st.n << (st.hann ? " Hann " : " Hamming ") << st.mode);
+        std::vector<float> got(src.begin(), src.begin() + st.n), want(st.n);
+        ASSERT_EQ(std::fesetround(st.mode), 0);
+        const std::vector<double> w = recurrenceWeights(st.n, st.hann);
+        for (int k = 0; k < st.n; ++k) want[k] = expect32f(src[k], w[k]);
+        want[st.n / 2] = (st.n & 1) ? src[st.n / 2] : want[st.n / 2];
+        const Status status = st.hann ? z.zorsWinHann_32f_I(got.data(), st.n) : z.zorsWinHamming_32f_I(got.data(), st.n);
+        std::fesetround(FE_TONEAREST);
+        ASSERT_EQ(status, StatusOk);
+        for (int k = 0; k < st.n; ++k) ASSERT_TRUE(sameBits(got[k], want[k])) << k;
+        if (st.n == 1024 && !st.hann) {
+            if (st.mode == FE_TONEAREST) nearest = want;
+            else EXPECT_NE(want, nearest);  // the modes really give other weights
+        }
+    }
+}
+
+#if !defined(_WIN32)
+// Two threads applying different windows at once each get their own.
+TEST_P(Window, ConcurrentCallsKeepTheirOwnWeights) {
+    const zt::Api& z = this->z();
+    auto worker = [&z](int n, bool* ok) {
+        const std::vector<double> w = recurrenceWeights(n, false);
+        std::vector<float> src(n), want(n), got(n);
+        for (int k = 0; k < n; ++k) {
+            src[k] = float(k % 7) - 3.0f;
+            want[k] = (n & 1) && k == n / 2 ? src[k] : expect32f(src[k], w[k]);
+        }
+        for (int round = 0; round < 300 && *ok; ++round) {
+            *ok = z.zorsWinHamming_32f(src.data(), got.data(), n) == StatusOk && got == want;
+        }
+    };
+    bool okA = true, okB = true;
+    std::thread a(worker, 1000, &okA), b(worker, 777, &okB);
+    a.join();
+    b.join();
+    EXPECT_TRUE(okA);
+    EXPECT_TRUE(okB);
+}
+#endif
 
 // Every variant gives the generic entry's bits.
 TEST_P(Window, AgreesWithGeneric) {
