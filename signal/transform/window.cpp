@@ -135,7 +135,7 @@ void applyWeights(const T* s, T* d, int n, const double* w) {
 // Two floats widened straight from memory; this form keeps the widening
 // off the shuffle unit, which is what bounds these loops.
 inline __m128d widen2(const void* p) {
-    return _mm_cvtps_pd(_mm_castpd_ps(_mm_load_sd(static_cast<const double*>(p))));
+    return _mm_cvtps_pd(_mm_castsi128_ps(_mm_loadl_epi64(static_cast<const __m128i*>(p))));
 }
 inline void narrowStore4(void* p, __m128d lo, __m128d hi) {
     _mm_storeu_ps(static_cast<float*>(p), _mm_movelh_ps(_mm_cvtpd_ps(lo), _mm_cvtpd_ps(hi)));
