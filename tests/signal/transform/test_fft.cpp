@@ -206,6 +206,27 @@ TEST_P(Fft, InPlaceBuffersAndUnalignedPointers) {
     }
 }
 
+// Every variant gives the generic entry's bits: the passes do the same
+// float operations in the same order, whatever code carries them.
+TEST_P(Fft, AgreesWithGenericBitForBit) {
+    const zt::Api& g = zt::api(0);
+    for (int order = 4; order <= 13; ++order) {
+        const size_t n = size_t(1) << order;
+        const std::vector<float> xr = randomFloats(n, 40 + order), xi = randomFloats(n, 80 + order);
+        Spec mine(z(), false, order, 8), ref(g, false, order, 8);
+        std::vector<float> ar(n), ai(n), br(n), bi(n);
+        ASSERT_EQ(z().zorsFFTFwd_CToC_32f(xr.data(), xi.data(), ar.data(), ai.data(), mine.p, nullptr), StatusOk);
+        ASSERT_EQ(g.zorsFFTFwd_CToC_32f(xr.data(), xi.data(), br.data(), bi.data(), ref.p, nullptr), StatusOk);
+        EXPECT_EQ(0, std::memcmp(ar.data(), br.data(), n * 4)) << order;
+        EXPECT_EQ(0, std::memcmp(ai.data(), bi.data(), n * 4)) << order;
+        Spec mineR(z(), true, order, 8), refR(g, true, order, 8);
+        std::vector<float> ca(n + 2), cb(n + 2);
+        ASSERT_EQ(z().zorsFFTFwd_RToCCS_32f(xr.data(), ca.data(), mineR.p, nullptr), StatusOk);
+        ASSERT_EQ(g.zorsFFTFwd_RToCCS_32f(xr.data(), cb.data(), refR.p, nullptr), StatusOk);
+        EXPECT_EQ(0, std::memcmp(ca.data(), cb.data(), (n + 2) * 4)) << order;
+    }
+}
+
 TEST_P(Fft, ChecksAndIdentifiers) {
     void* p = nullptr;
     const auto& a = z();
