@@ -207,9 +207,16 @@ TEST_P(Fft, InPlaceBuffersAndUnalignedPointers) {
 }
 
 // Every variant gives the generic entry's bits: the passes do the same
-// float operations in the same order, whatever code carries them.
+// float operations in the same order, whatever code carries them.  The
+// 32-bit generic variant computes on the x87 unit, whose float sums are not
+// rounded alike, so there the SSE variant is the reference.
 TEST_P(Fft, AgreesWithGenericBitForBit) {
+#if defined(__i386__)
+    if (GetParam() == 0) GTEST_SKIP() << "x87 sums";
+    const zt::Api& g = zt::api(1);
+#else
     const zt::Api& g = zt::api(0);
+#endif
     for (int order = 4; order <= 13; ++order) {
         const size_t n = size_t(1) << order;
         const std::vector<float> xr = randomFloats(n, 40 + order), xi = randomFloats(n, 80 + order);
