@@ -256,28 +256,51 @@ inline void packStore(D* d, __m128i a, __m128i b, __m128i c, __m128i e) {
     }
 }
 
-// Float sources, unscaled, 16 elements.  The clamps reproduce convertOne:
-// min(hi, x) keeps a NaN (the second operand wins), which the conversion
-// turns into 0x80000000 and the signed packs into the lowest value; max(x, 0)
-// turns a NaN into 0 for unsigned destinations.  Below the range, the
-// conversion or the pack saturates.  For 32s the conversion's 0x80000000 at
-// and above 2^31 is flipped to 0x7fffffff.  Ties to even come from the
+// Float sources, unscaled, 16 elements.  Ties to even come from the
 // conversion itself (round to nearest, as float sources are exact).
-template <class D>
-inline void narrowFloatBlock(const float* s, D* d, bool nearest) {
+//
+// cvtps2dq (and cvttps2dq) give INT_MIN for NaN and for everything outside
+// the int32 range.  For 8-bit and signed 16-bit destinations the packs then
+// saturate INT_MIN to the lowest value (0 for 8u), which is the rule for NaN
+// and for values below the range; negative values reach 0 for 8u through
+// the unsigned pack.  Only values at or above 2^31 come out wrong, so those
+// destinations convert without a clamp and a block holding such a value (or
+// a positive NaN, which takes the same test) is converted again clamped.
+// 16u packs through a bias that INT_MIN would wrap, so it always clamps.
+// The clamps: min(hi, x) keeps a NaN (the second operand wins), which the
+// conversion turns into INT_MIN; max(x, 0) turns a NaN into 0 for unsigned
+// destinations.  For 32s the conversion's INT_MIN at and above 2^31 is
+// flipped to INT_MAX.
+
+// Whether one of the 16 floats is at or above 2^31 or a positive NaN.  The
+// upper 16 bits of a float, as a signed word, order non-negative floats and
+// are negative for negative ones; the signed word maximum runs over the
+// lower halves too, and the mask keeps the upper ones.
+inline bool reachesInt32Top(const __m128 (&x)[4]) {
+    const __m128i m = _mm_max_epi16(_mm_max_epi16(_mm_castps_si128(x[0]), _mm_castps_si128(x[1])),
+                                    _mm_max_epi16(_mm_castps_si128(x[2]), _mm_castps_si128(x[3])));
+    return (_mm_movemask_epi8(_mm_cmpgt_epi16(m, _mm_set1_epi16(0x4EFF))) & 0xCCCC) != 0;
+}
+
+template <class D, bool Nearest>
+inline void narrowFloatBlock(const float* s, D* d) {
     using L = std::numeric_limits<D>;
+    __m128 x[4];
     __m128i r[4];
-    for (int k = 0; k < 4; ++k) {
-        __m128 x = _mm_loadu_ps(s + 4 * k);
-        if constexpr (sizeof(D) == 4) {
-            const __m128 over = _mm_cmpge_ps(x, _mm_set1_ps(2147483648.0f));
-            r[k] = nearest ? _mm_cvtps_epi32(x) : _mm_cvttps_epi32(x);
-            r[k] = _mm_xor_si128(r[k], _mm_castps_si128(over));
-        } else {
-            if constexpr (!std::is_signed_v<D>) x = _mm_max_ps(x, _mm_setzero_ps());
-            x = _mm_min_ps(_mm_set1_ps(float(L::max())), x);
-            r[k] = nearest ? _mm_cvtps_epi32(x) : _mm_cvttps_epi32(x);
+    for (int k = 0; k < 4; ++k) x[k] = _mm_loadu_ps(s + 4 * k);
+    if constexpr (sizeof(D) == 4) {
+        for (int k = 0; k < 4; ++k) {
+            const __m128 over = _mm_cmpge_ps(x[k], _mm_set1_ps(2147483648.0f));
+            r[k] = _mm_xor_si128(Nearest ? _mm_cvtps_epi32(x[k]) : _mm_cvttps_epi32(x[k]), _mm_castps_si128(over));
         }
+    } else {
+        if (std::is_same_v<D, uint16_t> || reachesInt32Top(x)) {
+            for (int k = 0; k < 4; ++k) {
+                if constexpr (!std::is_signed_v<D>) x[k] = _mm_max_ps(x[k], _mm_setzero_ps());
+                x[k] = _mm_min_ps(_mm_set1_ps(float(L::max())), x[k]);
+            }
+        }
+        for (int k = 0; k < 4; ++k) r[k] = Nearest ? _mm_cvtps_epi32(x[k]) : _mm_cvttps_epi32(x[k]);
     }
     packStore(d, r[0], r[1], r[2], r[3]);
 }
@@ -349,7 +372,10 @@ Status narrowVector(const S* pSrc, D* pDst, int len, int rndMode, int scaleFacto
     bool done = false;
     if constexpr (std::is_same_v<S, float>) {
         if (!one.scaled) {
-            for (; i + 16 <= len; i += 16) narrowFloatBlock(pSrc + i, pDst + i, one.nearest);
+            if (one.nearest)
+                for (; i + 16 <= len; i += 16) narrowFloatBlock<D, true>(pSrc + i, pDst + i);
+            else
+                for (; i + 16 <= len; i += 16) narrowFloatBlock<D, false>(pSrc + i, pDst + i);
             done = true;
         }
     }

@@ -505,6 +505,37 @@ TEST_P(VecConvert, Float32sBoundDependsOnScale) {
     EXPECT_EQ(out[2], INT32_MIN);
 }
 
+// The narrow destinations convert without a clamp unless a block holds a
+// value at or above 2^31: each such value (and the float just below) alone
+// among ordinary ones, in every lane of a 16-element block.
+TEST_P(VecConvert, LoneValueNearTwoToThe31) {
+    const zt::Api& z = this->z();
+    const float probes[] = {2147483648.0f, std::nextafter(2147483648.0f, 0.0f), 3e9f, kInff, kNaNf, -kNaNf, -3e9f};
+    for (float probe : probes) {
+        for (int at = 0; at < 16; ++at) {
+            std::vector<float> src(32, -7.0f);
+            src[16 + at] = probe;
+            SCOPED_TRACE(testing::Message() << probe << " at " << at);
+            for (int mode : {int(RoundNear), int(RoundZero)}) {
+                std::vector<uint8_t> u8(32);
+                std::vector<int8_t> s8(32);
+                std::vector<uint16_t> u16(32);
+                std::vector<int16_t> s16(32);
+                ASSERT_EQ(z.zorsConvert_32f8u_Sfs(src.data(), u8.data(), 32, mode, 0), StatusOk);
+                ASSERT_EQ(z.zorsConvert_32f8s_Sfs(src.data(), s8.data(), 32, mode, 0), StatusOk);
+                ASSERT_EQ(z.zorsConvert_32f16u_Sfs(src.data(), u16.data(), 32, mode, 0), StatusOk);
+                ASSERT_EQ(z.zorsConvert_32f16s_Sfs(src.data(), s16.data(), 32, mode, 0), StatusOk);
+                for (int i = 0; i < 32; ++i) {
+                    ASSERT_EQ(u8[i], expectNarrow<uint8_t>(src[i], mode, 0)) << i;
+                    ASSERT_EQ(s8[i], expectNarrow<int8_t>(src[i], mode, 0)) << i;
+                    ASSERT_EQ(u16[i], expectNarrow<uint16_t>(src[i], mode, 0)) << i;
+                    ASSERT_EQ(s16[i], expectNarrow<int16_t>(src[i], mode, 0)) << i;
+                }
+            }
+        }
+    }
+}
+
 // The half-away-then-back rule, replayed on doubles: 0.5 + 2^-53 sums to
 // exactly 1.0, which is odd and equal to the sum, so it steps back to 0.
 TEST_P(VecConvert, DoubleSourceKeepsTheTieCorrection) {
