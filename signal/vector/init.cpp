@@ -9,7 +9,9 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
+#include "frame/mxcsr.h"
 
+#include <algorithm>
 #include <cstring>
 #include <limits>
 #include <type_traits>
@@ -259,50 +261,57 @@ inline void packStore(D* d, __m128i a, __m128i b, __m128i c, __m128i e) {
 // Float sources, unscaled, 16 elements.  Ties to even come from the
 // conversion itself (round to nearest, as float sources are exact).
 //
-// cvtps2dq (and cvttps2dq) give INT_MIN for NaN and for everything outside
-// the int32 range.  For 8-bit and signed 16-bit destinations the packs then
-// saturate INT_MIN to the lowest value (0 for 8u), which is the rule for NaN
-// and for values below the range; negative values reach 0 for 8u through
-// the unsigned pack.  Only values at or above 2^31 come out wrong, so those
-// destinations convert without a clamp and a block holding such a value (or
-// a positive NaN, which takes the same test) is converted again clamped.
-// 16u packs through a bias that INT_MIN would wrap, so it always clamps.
+// Unclamped, cvtps2dq (or cvttps2dq) is right for every input it can
+// represent, and the packs saturate to D's range; negative values reach 0
+// for 8u through the unsigned pack and for 16u through the biased one.  The
+// inputs it cannot represent (NaN, values outside the int32 range) raise
+// the invalid flag, and their elements are converted again clamped.
+//
 // The clamps: min(hi, x) keeps a NaN (the second operand wins), which the
-// conversion turns into INT_MIN; max(x, 0) turns a NaN into 0 for unsigned
-// destinations.  For 32s the conversion's INT_MIN at and above 2^31 is
-// flipped to INT_MAX.
-
-// Whether one of the 16 floats is at or above 2^31 or a positive NaN.  The
-// upper 16 bits of a float, as a signed word, order non-negative floats and
-// are negative for negative ones; the signed word maximum runs over the
-// lower halves too, and the mask keeps the upper ones.
-inline bool reachesInt32Top(const __m128 (&x)[4]) {
-    const __m128i m = _mm_max_epi16(_mm_max_epi16(_mm_castps_si128(x[0]), _mm_castps_si128(x[1])),
-                                    _mm_max_epi16(_mm_castps_si128(x[2]), _mm_castps_si128(x[3])));
-    return (_mm_movemask_epi8(_mm_cmpgt_epi16(m, _mm_set1_epi16(0x4EFF))) & 0xCCCC) != 0;
-}
-
-template <class D, bool Nearest>
+// conversion turns into INT_MIN and the signed packs into the lowest value;
+// max(x, 0) turns a NaN into 0 for unsigned destinations.  For 32s the
+// conversion's INT_MIN at and above 2^31 is flipped to INT_MAX.
+template <class D, bool Nearest, bool Clamp>
 inline void narrowFloatBlock(const float* s, D* d) {
     using L = std::numeric_limits<D>;
-    __m128 x[4];
     __m128i r[4];
-    for (int k = 0; k < 4; ++k) x[k] = _mm_loadu_ps(s + 4 * k);
-    if constexpr (sizeof(D) == 4) {
-        for (int k = 0; k < 4; ++k) {
-            const __m128 over = _mm_cmpge_ps(x[k], _mm_set1_ps(2147483648.0f));
-            r[k] = _mm_xor_si128(Nearest ? _mm_cvtps_epi32(x[k]) : _mm_cvttps_epi32(x[k]), _mm_castps_si128(over));
+    for (int k = 0; k < 4; ++k) {
+        __m128 x = _mm_loadu_ps(s + 4 * k);
+        __m128 over = _mm_setzero_ps();
+        if constexpr (Clamp && sizeof(D) == 4) {
+            over = _mm_cmpge_ps(x, _mm_set1_ps(2147483648.0f));
+        } else if constexpr (Clamp) {
+            if constexpr (!std::is_signed_v<D>) x = _mm_max_ps(x, _mm_setzero_ps());
+            x = _mm_min_ps(_mm_set1_ps(float(L::max())), x);
         }
-    } else {
-        if (std::is_same_v<D, uint16_t> || reachesInt32Top(x)) {
-            for (int k = 0; k < 4; ++k) {
-                if constexpr (!std::is_signed_v<D>) x[k] = _mm_max_ps(x[k], _mm_setzero_ps());
-                x[k] = _mm_min_ps(_mm_set1_ps(float(L::max())), x[k]);
-            }
-        }
-        for (int k = 0; k < 4; ++k) r[k] = Nearest ? _mm_cvtps_epi32(x[k]) : _mm_cvttps_epi32(x[k]);
+        r[k] = Nearest ? _mm_cvtps_epi32(x) : _mm_cvttps_epi32(x);
+        if constexpr (Clamp && sizeof(D) == 4) r[k] = _mm_xor_si128(r[k], _mm_castps_si128(over));
     }
     packStore(d, r[0], r[1], r[2], r[3]);
+}
+
+template <class D, bool Nearest, bool Clamp>
+[[gnu::noinline]] void narrowFloatRun(const float* s, D* d, int n) {
+    for (int i = 0; i + 16 <= n; i += 16) narrowFloatBlock<D, Nearest, Clamp>(s + i, d + i);
+}
+
+// The first n elements (a multiple of 16), in runs of 1024: each run fast,
+// and again clamped if it met an input the fast form cannot take.  With the
+// invalid exception unmasked, where a SIMD conversion of such an input would
+// trap, nothing is done here and the caller's element loop does it all.
+template <class D, bool Nearest>
+int narrowFloats(const float* s, D* d, int n) {
+    ConversionScope csr;
+    if (!csr.armed()) return 0;
+    for (int i = 0; i < n; i += 1024) {
+        const int m = std::min(1024, n - i);
+        narrowFloatRun<D, Nearest, false>(s + i, d + i, m);
+        if (csr.tripped()) {
+            narrowFloatRun<D, Nearest, true>(s + i, d + i, m);
+            csr.settle();
+        }
+    }
+    return n;
 }
 
 // Two doubles to two 32-bit integers (low half) by convertOne's rule.  x is
@@ -372,10 +381,8 @@ Status narrowVector(const S* pSrc, D* pDst, int len, int rndMode, int scaleFacto
     bool done = false;
     if constexpr (std::is_same_v<S, float>) {
         if (!one.scaled) {
-            if (one.nearest)
-                for (; i + 16 <= len; i += 16) narrowFloatBlock<D, true>(pSrc + i, pDst + i);
-            else
-                for (; i + 16 <= len; i += 16) narrowFloatBlock<D, false>(pSrc + i, pDst + i);
+            i = one.nearest ? narrowFloats<D, true>(pSrc, pDst, len & ~15)
+                            : narrowFloats<D, false>(pSrc, pDst, len & ~15);
             done = true;
         }
     }

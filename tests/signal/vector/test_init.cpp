@@ -1,6 +1,7 @@
 // Vector zero, set, copy and conversions, on every variant's entries.
 #include <gtest/gtest.h>
 
+#include <cfenv>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
@@ -535,6 +536,74 @@ TEST_P(VecConvert, LoneValueNearTwoToThe31) {
         }
     }
 }
+
+// Round-to-nearest conversions give ties to even whatever rounding mode the
+// caller has set, and leave that mode and the caller's raised flags as they
+// were.
+TEST_P(VecConvert, FloatToIntegerKeepsTheCallersFloatingPointState) {
+    const zt::Api& z = this->z();
+    std::mt19937 rng(8);
+    const std::vector<float> src = specialSources<float>(rng, 35000);
+    const int n = static_cast<int>(src.size());
+    for (int fe : {FE_UPWARD, FE_DOWNWARD, FE_TOWARDZERO}) {
+        for (int mode : {int(RoundNear), int(RoundZero)}) {
+            std::vector<int16_t> s16(n);
+            std::vector<uint8_t> u8(n);
+            std::vector<int32_t> s32(n);
+            std::feclearexcept(FE_ALL_EXCEPT);
+            std::feraiseexcept(FE_INVALID);
+            ASSERT_EQ(std::fesetround(fe), 0);
+            const Status a = z.zorsConvert_32f16s_Sfs(src.data(), s16.data(), n, mode, 0);
+            const Status b = z.zorsConvert_32f8u_Sfs(src.data(), u8.data(), n, mode, 0);
+            const Status c = z.zorsConvert_32f32s_Sfs(src.data(), s32.data(), n, mode, 0);
+            const int after = std::fegetround();
+            const bool invalidKept = std::fetestexcept(FE_INVALID) != 0;
+            std::fesetround(FE_TONEAREST);
+            ASSERT_EQ(a, StatusOk);
+            ASSERT_EQ(b, StatusOk);
+            ASSERT_EQ(c, StatusOk);
+            EXPECT_EQ(after, fe);
+            EXPECT_TRUE(invalidKept);
+            for (int i = 0; i < n; ++i) {
+                ASSERT_EQ(s16[i], expectNarrow<int16_t>(src[i], mode, 0)) << fe << " " << src[i];
+                ASSERT_EQ(u8[i], expectNarrow<uint8_t>(src[i], mode, 0)) << fe << " " << src[i];
+                ASSERT_EQ(s32[i], expectNarrow<int32_t>(src[i], mode, 0)) << fe << " " << src[i];
+            }
+        }
+    }
+    // Values the rule saturates raise nothing; a flag raised before stays.
+    std::vector<float> plain(100, 2.5f);
+    plain[50] = 3e9f;
+    std::vector<int16_t> out(100);
+    for (bool raised : {false, true}) {
+        std::feclearexcept(FE_ALL_EXCEPT);
+        if (raised) std::feraiseexcept(FE_INVALID);
+        ASSERT_EQ(z.zorsConvert_32f16s_Sfs(plain.data(), out.data(), 100, RoundNear, 0), StatusOk);
+        EXPECT_EQ(std::fetestexcept(FE_INVALID) != 0, raised);
+        EXPECT_EQ(out[50], 32767);
+    }
+    std::feclearexcept(FE_ALL_EXCEPT);
+}
+
+#if defined(__GLIBC__)
+// A caller that unmasks the invalid-operation exception gets no trap from
+// values the rule saturates (NaN aside, which is invalid in any case).
+TEST_P(VecConvert, NoTrapWithTheInvalidExceptionUnmasked) {
+    const zt::Api& z = this->z();
+    std::vector<float> src(64, 7.0f);
+    src[20] = 3e9f;
+    src[41] = -1e30f;
+    std::vector<int16_t> out(64);
+    std::feclearexcept(FE_ALL_EXCEPT);
+    feenableexcept(FE_INVALID);
+    const Status s = z.zorsConvert_32f16s_Sfs(src.data(), out.data(), 64, RoundNear, 0);
+    fedisableexcept(FE_INVALID);
+    ASSERT_EQ(s, StatusOk);
+    EXPECT_EQ(out[20], 32767);
+    EXPECT_EQ(out[41], -32768);
+    EXPECT_EQ(out[0], 7);
+}
+#endif
 
 // The half-away-then-back rule, replayed on doubles: 0.5 + 2^-53 sums to
 // exactly 1.0, which is odd and equal to the sum, so it steps back to 0.

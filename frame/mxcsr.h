@@ -1,0 +1,66 @@
+// The SSE control and status register around float-to-integer conversions.
+//
+// cvtps2dq rounds by the mode that MXCSR holds, and it raises the sticky
+// invalid-operation flag exactly for the inputs it cannot represent: NaN and
+// values outside the int32 range, for which it returns INT_MIN.
+// ConversionScope uses both:
+//
+// - While it lives, conversions round to nearest with ties to even, whatever
+//   mode the caller left.
+// - A loop may convert without clamps (fast for the usual inputs), then ask
+//   tripped() whether such an input went by; if so it redoes the same
+//   elements the clamped way and calls settle().  Each fast pass must be a
+//   call of its own (a non-inlined function): a call cannot be reordered
+//   with the reads of MXCSR.
+//
+// On exit the caller's rounding mode is back, and the invalid flag is raised
+// if it was on entry or a clamped pass raised it, as clamped code alone would
+// leave it.  With the invalid exception unmasked a fast pass could trap, so
+// then armed() is false and the caller takes its element-by-element path.
+#pragma once
+
+#include "frame/abi.h"
+
+#if ZOR_SIMD >= 2
+#  include <emmintrin.h>
+
+namespace zor { inline namespace ZOR_INLINE_NS {
+
+class ConversionScope {
+public:
+    ConversionScope() : entry_(_mm_getcsr()) {
+        const unsigned want = entry_ & ~kRounding & (armed() ? ~kInvalid : ~0u);
+        if (want != entry_) _mm_setcsr(want);
+    }
+    ~ConversionScope() {
+        const unsigned now = _mm_getcsr();
+        const unsigned back = (now & ~kRounding) | (entry_ & (kRounding | kInvalid)) | kept_;
+        if (back != now) _mm_setcsr(back);
+    }
+    ConversionScope(const ConversionScope&) = delete;
+    ConversionScope& operator=(const ConversionScope&) = delete;
+
+    bool armed() const { return (entry_ & kInvalidMask) != 0; }
+    // After a fast pass: whether it met an input that needs the clamped pass.
+    bool tripped() { return take() != 0; }
+    // After a clamped pass: keeps what it raised for the caller.
+    void settle() { kept_ |= take(); }
+
+private:
+    static constexpr unsigned kInvalid = 0x0001, kInvalidMask = 0x0080, kRounding = 0x6000;
+
+    // The invalid flag as it stands, cleared for the next pass.
+    unsigned take() {
+        if (!armed()) return 0;
+        const unsigned c = _mm_getcsr();
+        if (!(c & kInvalid)) return 0;
+        _mm_setcsr(c & ~kInvalid);
+        return kInvalid;
+    }
+
+    const unsigned entry_;
+    unsigned kept_ = 0;
+};
+
+}}  // namespace zor::ZOR_INLINE_NS
+#endif
