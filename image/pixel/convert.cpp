@@ -8,6 +8,7 @@
 // generic entries.
 #include "frame/variant.h"
 #include "frame/status.h"
+#include "frame/mxcsr.h"
 #include "image/pixel/rows.h"
 
 #if ZOR_VARIANT != 1
@@ -35,23 +36,6 @@ inline uint16_t shiftFactor(uint32_t s) { return s > 15 ? 0 : static_cast<uint16
 // ---- SIMD ------------------------------------------------------------------------
 
 #if ZOR_SIMD >= 2
-// Forces round-to-nearest for cvtps2dq while a conversion runs, whatever the
-// caller left in MXCSR.
-class NearestRounding {
-public:
-    NearestRounding() : saved_(_mm_getcsr()) {
-        if (saved_ & 0x6000u) _mm_setcsr(saved_ & ~0x6000u);
-    }
-    ~NearestRounding() {
-        if (saved_ & 0x6000u) _mm_setcsr(saved_);
-    }
-    NearestRounding(const NearestRounding&) = delete;
-    NearestRounding& operator=(const NearestRounding&) = delete;
-
-private:
-    unsigned saved_;
-};
-
 ptrdiff_t widen8u16uSimd(const uint8_t* s, uint16_t* d, ptrdiff_t n) {
     const __m128i z = _mm_setzero_si128();
     return eachBlock<16>(n, [&](ptrdiff_t x) {
@@ -97,20 +81,17 @@ ptrdiff_t s16ToFloatSimd(const int16_t* s, float* d, ptrdiff_t n) {
     });
 }
 
-// Float to 8 bits, sixteen values at a time.  cvtps2dq (or cvttps2dq) turns
-// NaN and everything outside the int32 range into INT_MIN, which the signed
-// pack saturates to -32768 and the unsigned pack to 0: right for NaN, -inf
-// and large negative values, wrong only for 2^31 and above.  So the fast
-// form converts without any clamp, and a block whose signed packs hold
-// -32768 (such a value, or one at or below -32768: rare in images) is done
-// again with the upper clamp in float first.  min returns its second operand
-// when one is NaN, so NaN stays NaN there and still ends as 0; 255 and above
-// end as 255.
+// Float to 8 bits, sixteen values at a time.  Unclamped, cvtps2dq (or
+// cvttps2dq) is right for every input it can represent, and the packs
+// saturate: negative values end as 0, large ones as 255.  The inputs it
+// cannot represent (NaN, values outside the int32 range) raise the invalid
+// flag, and the row is converted again with the upper clamp in float first:
+// min returns its second operand when one is NaN, so NaN stays NaN, becomes
+// INT_MIN and ends as 0; 255 and above end as 255.
 //
 // With Aligned the loads fold into the conversions (legacy SSE takes only
 // aligned memory operands), which leaves more room in the out-of-order
-// window for loads in flight.  The clamped form stays out of line so that
-// the compiler keeps no loaded value around for it.
+// window for loads in flight.
 template <bool Nearest, bool Clamp, bool Aligned>
 inline __m128i floatToInt(const float* s) {
     __m128 v = Aligned ? _mm_load_ps(s) : _mm_loadu_ps(s);
@@ -122,20 +103,26 @@ inline __m128i floatToI16x8(const float* s) {
     return _mm_packs_epi32(floatToInt<Nearest, Clamp, Aligned>(s), floatToInt<Nearest, Clamp, Aligned>(s + 4));
 }
 
-template <bool Nearest>
-[[gnu::noinline, gnu::cold]] __m128i clampedToU8x16(const float* s) {
-    return _mm_packus_epi16(floatToI16x8<Nearest, true, false>(s), floatToI16x8<Nearest, true, false>(s + 8));
+template <bool Nearest, bool Clamp, bool Aligned>
+[[gnu::noinline]] ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
+    return eachBlock<16>(n, [&](ptrdiff_t x) {
+        store16(d + x, _mm_packus_epi16(floatToI16x8<Nearest, Clamp, Aligned>(s + x),
+                                        floatToI16x8<Nearest, Clamp, Aligned>(s + x + 8)));
+    });
 }
 
+// The blocks of a row: fast, and again clamped if the fast pass met an
+// input it cannot take.  With the invalid exception unmasked, where a SIMD
+// conversion of such an input would trap, the row goes element by element.
 template <bool Nearest, bool Aligned>
-ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
-    const __m128i outOfRange = _mm_set1_epi16(-32768);
-    return eachBlock<16>(n, [&](ptrdiff_t x) {
-        const __m128i lo = floatToI16x8<Nearest, false, Aligned>(s + x);
-        const __m128i hi = floatToI16x8<Nearest, false, Aligned>(s + x + 8);
-        const bool redo = _mm_movemask_epi8(_mm_cmpeq_epi16(_mm_min_epi16(lo, hi), outOfRange)) != 0;
-        store16(d + x, redo ? clampedToU8x16<Nearest>(s + x) : _mm_packus_epi16(lo, hi));
-    });
+ptrdiff_t floatToU8Blocks(const float* s, uint8_t* d, ptrdiff_t n, ConversionScope& csr) {
+    if (!csr.armed()) return 0;
+    const ptrdiff_t done = floatToU8Simd<Nearest, false, Aligned>(s, d, n);
+    if (csr.tripped()) {
+        floatToU8Simd<Nearest, true, Aligned>(s, d, n);
+        csr.settle();
+    }
+    return done;
 }
 
 // Multiplies 24 words (three registers) by a repeating pattern of factors.
@@ -182,22 +169,31 @@ void toFloatRow(const S* s, float* d, ptrdiff_t n) {
     for (; x < n; ++x) d[x] = static_cast<float>(s[x]);  // exact: |s| < 2^24
 }
 
-template <bool Nearest>
-void toU8Row(const float* s, uint8_t* d, ptrdiff_t n) {
-    ptrdiff_t x = 0;
 #if ZOR_SIMD >= 2
-    // a few values one by one until the source is 16-byte aligned (possible
-    // when it is at least float aligned), then aligned blocks
+using RowScope = ConversionScope;
+#else
+struct RowScope {};  // the generic rule needs no state
+#endif
+
+// The blocks start where the source is 16-byte aligned (when it is at least
+// float aligned).  The elements before and after them go one by one, after
+// the blocks: their comparisons flag a NaN as invalid too, which must not
+// count against the blocks.
+template <bool Nearest>
+void toU8Row(const float* s, uint8_t* d, ptrdiff_t n, [[maybe_unused]] RowScope& csr) {
+    ptrdiff_t head = 0, end = 0;
+#if ZOR_SIMD >= 2
     const uintptr_t a = reinterpret_cast<uintptr_t>(s);
-    const ptrdiff_t head = static_cast<ptrdiff_t>((16 - (a & 15)) & 15) / 4;
+    head = static_cast<ptrdiff_t>((16 - (a & 15)) & 15) / 4;
     if ((a & 3) == 0 && n >= head + 16) {
-        for (; x < head; ++x) d[x] = floatToU8(s[x], Nearest);
-        x += floatToU8Simd<Nearest, true>(s + x, d + x, n - x);
+        end = head + floatToU8Blocks<Nearest, true>(s + head, d + head, n - head, csr);
     } else {
-        x = floatToU8Simd<Nearest, false>(s, d, n);
+        head = 0;
+        end = floatToU8Blocks<Nearest, false>(s, d, n, csr);
     }
 #endif
-    for (; x < n; ++x) d[x] = floatToU8(s[x], Nearest);
+    for (ptrdiff_t x = 0; x < head; ++x) d[x] = floatToU8(s[x], Nearest);
+    for (ptrdiff_t x = end; x < n; ++x) d[x] = floatToU8(s[x], Nearest);
 }
 
 // In-place shift of a C-element image (C = 1, 3 or 4; for 4 the last
@@ -255,12 +251,13 @@ Status ZOR_CALL zoriConvert_16s32f_C1R(const int16_t* pSrc, int srcStep, float* 
 }
 Status ZOR_CALL zoriConvert_32f8u_C1R(const float* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                       ImageSize roiSize, int roundMode) {
-#if ZOR_SIMD >= 2
-    NearestRounding nearest;
-#endif
+    RowScope csr;
     // mode 1 rounds to nearest with ties to even; any other value truncates
-    return roundMode == 1 ? convert<float, uint8_t, 1>(pSrc, srcStep, pDst, dstStep, roiSize, toU8Row<true>)
-                          : convert<float, uint8_t, 1>(pSrc, srcStep, pDst, dstStep, roiSize, toU8Row<false>);
+    if (roundMode == 1)
+        return convert<float, uint8_t, 1>(pSrc, srcStep, pDst, dstStep, roiSize,
+                                          [&](const float* s, uint8_t* d, ptrdiff_t n) { toU8Row<true>(s, d, n, csr); });
+    return convert<float, uint8_t, 1>(pSrc, srcStep, pDst, dstStep, roiSize,
+                                      [&](const float* s, uint8_t* d, ptrdiff_t n) { toU8Row<false>(s, d, n, csr); });
 }
 
 Status ZOR_CALL zoriLShiftC_16u_C1IR(uint32_t value, uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize) {

@@ -1,6 +1,7 @@
 // Type conversions and 16-bit left shifts on every variant.
 #include <gtest/gtest.h>
 
+#include <cfenv>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
@@ -147,6 +148,40 @@ TEST_P(Convert, FloatTo8uRareOutOfRangeValues) {
                 ASSERT_EQ(out[i], refU8(v[i], mode)) << "offset " << offset << " mode " << mode << " element " << i;
         }
     }
+}
+
+// Mode 1 gives ties to even whatever rounding mode the caller has set, and
+// leaves that mode and the caller's raised flags as they were; with the
+// invalid exception unmasked, out-of-range values do not trap.
+TEST_P(Convert, FloatTo8uKeepsTheCallersFloatingPointState) {
+    std::mt19937 rng(13);
+    const ImageSize roi = {203, 3};
+    std::vector<float> v = floatSamples(rng, size_t(roi.width) * roi.height);
+    for (int fe : {FE_UPWARD, FE_DOWNWARD, FE_TOWARDZERO}) {
+        std::vector<uint8_t> out(v.size());
+        std::feclearexcept(FE_ALL_EXCEPT);
+        std::feraiseexcept(FE_INVALID);
+        ASSERT_EQ(std::fesetround(fe), 0);
+        const Status s = z().zoriConvert_32f8u_C1R(v.data(), roi.width * 4, out.data(), roi.width, roi, 1);
+        const int after = std::fegetround();
+        const bool invalidKept = std::fetestexcept(FE_INVALID) != 0;
+        std::fesetround(FE_TONEAREST);
+        ASSERT_EQ(s, StatusOk);
+        EXPECT_EQ(after, fe);
+        EXPECT_TRUE(invalidKept);
+        for (size_t i = 0; i < v.size(); ++i) ASSERT_EQ(out[i], refU8(v[i], 1)) << fe << " element " << i;
+    }
+    std::feclearexcept(FE_ALL_EXCEPT);
+#if defined(__GLIBC__)
+    for (float& x : v)
+        if (std::isnan(x)) x = 3e9f;  // a NaN is invalid in any case
+    std::vector<uint8_t> out(v.size());
+    feenableexcept(FE_INVALID);
+    const Status s = z().zoriConvert_32f8u_C1R(v.data(), roi.width * 4, out.data(), roi.width, roi, 1);
+    fedisableexcept(FE_INVALID);
+    ASSERT_EQ(s, StatusOk);
+    for (size_t i = 0; i < v.size(); ++i) ASSERT_EQ(out[i], refU8(v[i], 1)) << "element " << i;
+#endif
 }
 
 TEST_P(Convert, Checks) {
