@@ -7,11 +7,11 @@
 //
 // - While it lives, conversions round to nearest with ties to even, whatever
 //   mode the caller left.
-// - A loop may convert without clamps (fast for the usual inputs), then ask
-//   tripped() whether such an input went by; if so it redoes the same
-//   elements the clamped way and calls settle().  Each fast pass must be a
-//   call of its own (a non-inlined function): a call cannot be reordered
-//   with the reads of MXCSR.
+// - run(pass) converts a stretch without clamps, pass(false), fast for the
+//   usual inputs, and only if such an input went by again the clamped way,
+//   pass(true).  The pass must do its converting in calls of their own
+//   (non-inlined functions): a call cannot be reordered with the reads of
+//   MXCSR.
 //
 // On exit the caller's rounding mode is back, and the invalid flag is raised
 // if it was on entry or a clamped pass raised it, as clamped code alone would
@@ -41,10 +41,17 @@ public:
     ConversionScope& operator=(const ConversionScope&) = delete;
 
     bool armed() const { return (entry_ & kInvalidMask) != 0; }
-    // After a fast pass: whether it met an input that needs the clamped pass.
-    bool tripped() { return take() != 0; }
-    // After a clamped pass: keeps what it raised for the caller.
-    void settle() { kept_ |= take(); }
+
+    // Only while armed(): the flags of the clamped pass are kept for the
+    // caller, those of the unclamped one are not.
+    template <class Pass>
+    void run(Pass&& pass) {
+        pass(false);
+        if (take()) {
+            pass(true);
+            kept_ |= take();
+        }
+    }
 
 private:
     static constexpr unsigned kInvalid = 0x0001, kInvalidMask = 0x0080, kRounding = 0x6000;

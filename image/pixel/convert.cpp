@@ -117,11 +117,10 @@ template <bool Nearest, bool Clamp, bool Aligned>
 template <bool Nearest, bool Aligned>
 ptrdiff_t floatToU8Blocks(const float* s, uint8_t* d, ptrdiff_t n, ConversionScope& csr) {
     if (!csr.armed()) return 0;
-    const ptrdiff_t done = floatToU8Simd<Nearest, false, Aligned>(s, d, n);
-    if (csr.tripped()) {
-        floatToU8Simd<Nearest, true, Aligned>(s, d, n);
-        csr.settle();
-    }
+    ptrdiff_t done = 0;
+    csr.run([&](bool clamp) {
+        done = clamp ? floatToU8Simd<Nearest, true, Aligned>(s, d, n) : floatToU8Simd<Nearest, false, Aligned>(s, d, n);
+    });
     return done;
 }
 

@@ -305,11 +305,10 @@ int narrowFloats(const float* s, D* d, int n) {
     if (!csr.armed()) return 0;
     for (int i = 0; i < n; i += 1024) {
         const int m = std::min(1024, n - i);
-        narrowFloatRun<D, Nearest, false>(s + i, d + i, m);
-        if (csr.tripped()) {
-            narrowFloatRun<D, Nearest, true>(s + i, d + i, m);
-            csr.settle();
-        }
+        csr.run([&](bool clamp) {
+            if (clamp) narrowFloatRun<D, Nearest, true>(s + i, d + i, m);
+            else narrowFloatRun<D, Nearest, false>(s + i, d + i, m);
+        });
     }
     return n;
 }
