@@ -54,10 +54,7 @@ extern "C" {
 #undef ZOR_FN
 }
 
-// Column maps of the manifest.
-#define ZOR_ALL 0, 1, 2, 3, 4
-#define ZOR_GENERIC 0, 0, 0, 0, 0
-#define ZOR_SSE2UP 0, 0, 2, 3, 4
+#include "frame/columns.h"
 
 #define ZOR_COL_(k, name) reinterpret_cast<Entry>(&zor::v##k::name)
 #define ZOR_ROW_(m0, m1, m2, m3, m4, name)                                       \

@@ -48,5 +48,13 @@
 #  include <tmmintrin.h>
 #endif
 
+#include "frame/columns.h"
+
+// True when this variant compiles the entries of the rows whose map is
+// `map`: every variant for ZOR_ALL, only the generic one for ZOR_GENERIC,
+// all but SSE for ZOR_SSE2UP (the SSE column borrows the generic entry).
+// Wrap a family's entries of such rows in #if ZOR_DEFINES_ENTRIES_OF(map).
+#define ZOR_DEFINES_ENTRIES_OF(map) (ZOR_COLUMN(ZOR_VARIANT, map) == ZOR_VARIANT)
+
 #define ZOR_ENTRY_NS ZOR_NS
 #include "frame/entries.h"

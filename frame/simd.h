@@ -1,0 +1,965 @@
+// Typed lane operations: the one SIMD vocabulary of the family kernels.
+//
+// simd::Vec<T> is a register of lanes of type T (uint8_t ... int64_t, float,
+// double) at the column's native width; Vec<T>::kLanes says how many.  The
+// operations are free functions (and the arithmetic and bitwise operators)
+// over Vec<T, Bytes>; each forwards to Isa<Bytes>, the one place that spells
+// instructions.  A kernel written against the vocabulary names no width, so
+// it compiles for every width that has an Isa: today the 16-byte (SSE)
+// registers, later wider ones, with no second copy of the kernel.
+//
+//     using V = simd::Vec<int16_t>;
+//     for (; i + V::kLanes <= n; i += V::kLanes)
+//         store(d + i, addSat(load<V>(a + i), load<V>(b + i)));
+//
+// What exists in which column:
+//   ZOR_SIMD >= 1  float lanes
+//   ZOR_SIMD >= 2  every lane type
+//   ZOR_SIMD >= 4  shuffleBytes, alignBytes, mulAddPairs on bytes, mulHiRound
+//                  (and abs/sign without emulation)
+// simd::kHas<T> tells a template whether Vec<T> exists in this column.
+//
+// Lane order.  Operations act lane by lane and keep lane order, except those
+// marked "per 16-byte block": widenLo/widenHi, narrow*, zipLo/zipHi,
+// shuffleBytes, alignBytes and shiftBytes* work within each 16-byte block
+// of a wider register, as the hardware does.  widenLo/widenHi followed by
+// narrow* restores the original order at every width, so kernels that widen,
+// compute and narrow back need not care.
+//
+// Every operation is exact and defined for every input; float operations
+// follow IEEE rules lane by lane (min/max: the second operand when either is
+// NaN, as the instructions do; see min()).
+//
+// Include after frame/variant.h.
+#pragma once
+
+#include "frame/abi.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <limits>
+#include <type_traits>
+
+namespace zor { inline namespace ZOR_INLINE_NS { namespace simd {
+
+// ---- scalar twins -------------------------------------------------------------
+// The same names on plain lanes, so that an operation written once as a
+// generic lambda serves the vector body and the scalar tail (see mapLanes).
+
+// a < b ? a : b  and  a > b ? a : b: like the instructions, the second
+// operand when the comparison fails (NaN included).
+template <class T>
+constexpr T min(T a, T b) { return a < b ? a : b; }
+template <class T>
+constexpr T max(T a, T b) { return a > b ? a : b; }
+
+template <class T>
+constexpr T addSat(T a, T b) {
+    static_assert(std::is_integral_v<T> && sizeof(T) <= 2, "saturating add of 8/16-bit lanes");
+    using L = std::numeric_limits<T>;
+    const int r = int(a) + int(b);
+    return T(r < int(L::min()) ? L::min() : r > int(L::max()) ? L::max() : r);
+}
+template <class T>
+constexpr T subSat(T a, T b) {
+    static_assert(std::is_integral_v<T> && sizeof(T) <= 2, "saturating subtract of 8/16-bit lanes");
+    using L = std::numeric_limits<T>;
+    const int r = int(a) - int(b);
+    return T(r < int(L::min()) ? L::min() : r > int(L::max()) ? L::max() : r);
+}
+// (a + b + 1) >> 1 of unsigned lanes.
+template <class T>
+constexpr T avg(T a, T b) {
+    static_assert(std::is_unsigned_v<T> && sizeof(T) <= 2, "rounding average of unsigned lanes");
+    return T((unsigned(a) + unsigned(b) + 1) >> 1);
+}
+// |a - b| of unsigned lanes.
+template <class T>
+constexpr T absDiff(T a, T b) {
+    static_assert(std::is_unsigned_v<T>, "absolute difference of unsigned lanes");
+    return a > b ? T(a - b) : T(b - a);
+}
+// |a| of signed lanes; the lowest value stays as it is.
+template <class T>
+constexpr T abs(T a) {
+    static_assert(std::is_signed_v<T>, "absolute value of signed lanes");
+    if constexpr (std::is_integral_v<T>) return a < 0 ? T(0u - static_cast<std::make_unsigned_t<T>>(a)) : a;
+    else return a < 0 ? -a : a;
+}
+// Comparisons give bool on lanes, masks on registers; select takes either.
+template <class T>
+constexpr bool eq(T a, T b) { return a == b; }
+template <class T>
+constexpr bool gt(T a, T b) { return a > b; }
+template <class T>
+constexpr bool lt(T a, T b) { return a < b; }
+template <class T>
+constexpr bool ge(T a, T b) { return a >= b; }
+template <class T>
+constexpr bool le(T a, T b) { return a <= b; }
+template <class T>
+constexpr T select(bool mask, T a, T b) { return mask ? a : b; }
+// Shifts: logical for unsigned lanes, arithmetic for signed ones.
+template <int N, class T>
+constexpr T shl(T a) { return T(static_cast<std::make_unsigned_t<T>>(a) << N); }
+template <int N, class T>
+constexpr T shr(T a) { return T(a >> N); }
+
+// ---- registers --------------------------------------------------------------
+
+template <class T, int Bytes, class Enable = void>
+struct RawOf {  // no register of this lane type at this width
+    static constexpr bool kExists = false;
+};
+
+#if ZOR_SIMD >= 1
+constexpr int kNativeBytes = 16;
+template <>
+struct RawOf<float, 16> {
+    using type = __m128;
+    static constexpr bool kExists = true;
+};
+#else
+constexpr int kNativeBytes = 0;
+#endif
+#if ZOR_SIMD >= 2
+template <>
+struct RawOf<double, 16> {
+    using type = __m128d;
+    static constexpr bool kExists = true;
+};
+template <class T>
+struct RawOf<T, 16, std::enable_if_t<std::is_integral_v<T> && !std::is_same_v<T, bool>>> {
+    using type = __m128i;
+    static constexpr bool kExists = true;
+};
+#endif
+
+// Whether Vec<T> exists in this column.
+template <class T>
+constexpr bool kHas = RawOf<T, kNativeBytes>::kExists;
+
+template <class T, int Bytes = kNativeBytes>
+struct Vec {
+    using Lane = T;
+    using Raw = typename RawOf<T, Bytes>::type;
+    static constexpr int kBytes = Bytes;
+    static constexpr int kLanes = Bytes / int(sizeof(T));
+    Raw raw;
+};
+
+template <int Bytes>
+struct Isa;  // the instructions of one register width
+
+#if ZOR_SIMD >= 1
+// ---- 16-byte registers: SSE ... SSSE3 ---------------------------------------
+template <>
+struct Isa<16> {
+    template <class T>
+    using R = typename RawOf<T, 16>::type;
+
+    template <class T>
+    static constexpr bool isF = std::is_same_v<T, float>;
+    template <class T>
+    static constexpr bool isD = std::is_same_v<T, double>;
+    template <class T>
+    static constexpr bool isInt = std::is_integral_v<T>;
+
+    // -- memory
+    template <class T>
+    static R<T> zero() {
+        if constexpr (isF<T>) return _mm_setzero_ps();
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_setzero_pd();
+        else return _mm_setzero_si128();
+#  endif
+    }
+    template <class T>
+    static R<T> set1(T x) {
+        if constexpr (isF<T>) return _mm_set1_ps(x);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_set1_pd(x);
+        else if constexpr (sizeof(T) == 1) return _mm_set1_epi8(static_cast<char>(x));
+        else if constexpr (sizeof(T) == 2) return _mm_set1_epi16(static_cast<short>(x));
+        else if constexpr (sizeof(T) == 4) return _mm_set1_epi32(static_cast<int>(x));
+        else return _mm_set1_epi64x(static_cast<long long>(x));
+#  endif
+    }
+    template <class T>
+    static R<T> load(const T* p) {
+        if constexpr (isF<T>) return _mm_loadu_ps(p);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_loadu_pd(p);
+        else return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+#  endif
+    }
+    template <class T>
+    static R<T> loadAligned(const T* p) {
+        if constexpr (isF<T>) return _mm_load_ps(p);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_load_pd(p);
+        else return _mm_load_si128(reinterpret_cast<const __m128i*>(p));
+#  endif
+    }
+    // The lower half of a register from memory, the upper half zero.
+    template <class T>
+    static R<T> loadHalf(const T* p) {
+        if constexpr (isF<T>)
+            return _mm_loadl_pi(_mm_setzero_ps(), reinterpret_cast<const __m64*>(p));
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_load_sd(p);
+        else return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(p));
+#  endif
+    }
+    template <class T>
+    static void store(T* p, R<T> v) {
+        if constexpr (isF<T>) _mm_storeu_ps(p, v);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) _mm_storeu_pd(p, v);
+        else _mm_storeu_si128(reinterpret_cast<__m128i*>(p), v);
+#  endif
+    }
+    template <class T>
+    static void storeAligned(T* p, R<T> v) {
+        if constexpr (isF<T>) _mm_store_ps(p, v);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) _mm_store_pd(p, v);
+        else _mm_store_si128(reinterpret_cast<__m128i*>(p), v);
+#  endif
+    }
+    template <class T>
+    static void storeHalf(T* p, R<T> v) {
+        if constexpr (isF<T>) _mm_storel_pi(reinterpret_cast<__m64*>(p), v);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) _mm_store_sd(p, v);
+        else _mm_storel_epi64(reinterpret_cast<__m128i*>(p), v);
+#  endif
+    }
+    // Non-temporal store to 16-byte aligned memory.
+    template <class T>
+    static void stream(T* p, R<T> v) {
+        if constexpr (isF<T>) _mm_stream_ps(p, v);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) _mm_stream_pd(p, v);
+        else _mm_stream_si128(reinterpret_cast<__m128i*>(p), v);
+#  endif
+    }
+
+    // -- bitwise (any lane type)
+    template <class T>
+    static R<T> allOnes() {
+        if constexpr (isF<T>) return _mm_cmpeq_ps(_mm_setzero_ps(), _mm_setzero_ps());
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_cmpeq_pd(_mm_setzero_pd(), _mm_setzero_pd());
+        else return _mm_set1_epi32(-1);
+#  endif
+    }
+    template <class T>
+    static R<T> bitAnd(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_and_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_and_pd(a, b);
+        else return _mm_and_si128(a, b);
+#  endif
+    }
+    template <class T>
+    static R<T> bitOr(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_or_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_or_pd(a, b);
+        else return _mm_or_si128(a, b);
+#  endif
+    }
+    template <class T>
+    static R<T> bitXor(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_xor_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_xor_pd(a, b);
+        else return _mm_xor_si128(a, b);
+#  endif
+    }
+    // ~a & b
+    template <class T>
+    static R<T> andNot(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_andnot_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_andnot_pd(a, b);
+        else return _mm_andnot_si128(a, b);
+#  endif
+    }
+
+    // -- float arithmetic (SSE) and the rest (SSE2)
+    template <class T>
+    static R<T> add(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_add_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_add_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_add_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_add_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_add_epi32(a, b);
+        else return _mm_add_epi64(a, b);
+#  endif
+    }
+    template <class T>
+    static R<T> sub(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_sub_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_sub_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_sub_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_sub_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_sub_epi32(a, b);
+        else return _mm_sub_epi64(a, b);
+#  endif
+    }
+    // Low half of the product for integer lanes (16 and 32 bits).
+    template <class T>
+    static R<T> mul(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_mul_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_mul_pd(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_mullo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) {
+            const __m128i even = _mm_mul_epu32(a, b);
+            const __m128i odd = _mm_mul_epu32(_mm_srli_epi64(a, 32), _mm_srli_epi64(b, 32));
+            return _mm_unpacklo_epi32(_mm_shuffle_epi32(even, 0x08), _mm_shuffle_epi32(odd, 0x08));
+        }
+#  endif
+        else static_assert(sizeof(T) == 0, "no lane multiply for this type");
+    }
+    template <class T>
+    static R<T> div(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_div_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_div_pd(a, b);
+#  endif
+        else static_assert(sizeof(T) == 0, "division of float lanes only");
+    }
+    template <class T>
+    static R<T> sqrt(R<T> a) {
+        if constexpr (isF<T>) return _mm_sqrt_ps(a);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_sqrt_pd(a);
+#  endif
+        else static_assert(sizeof(T) == 0, "square root of float lanes only");
+    }
+
+#  if ZOR_SIMD >= 2
+    // The sign bit of each lane: flipping it maps unsigned order onto signed.
+    template <class T>
+    static __m128i signBits() {
+        if constexpr (sizeof(T) == 1) return _mm_set1_epi8(char(0x80));
+        else if constexpr (sizeof(T) == 2) return _mm_set1_epi16(short(0x8000));
+        else return _mm_set1_epi32(int(0x80000000u));
+    }
+#  endif
+
+    // -- comparisons: all ones where the relation holds, else zero
+    template <class T>
+    static R<T> eq(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_cmpeq_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_cmpeq_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_cmpeq_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_cmpeq_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_cmpeq_epi32(a, b);
+#  endif
+        else static_assert(sizeof(T) == 0, "no 64-bit integer compare");
+    }
+    // a > b
+    template <class T>
+    static R<T> gt(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_cmpgt_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_cmpgt_pd(a, b);
+        else if constexpr (std::is_unsigned_v<T> && sizeof(T) <= 4) {
+            const __m128i s = signBits<T>();
+            return gt<std::make_signed_t<T>>(_mm_xor_si128(a, s), _mm_xor_si128(b, s));
+        } else if constexpr (sizeof(T) == 1) return _mm_cmpgt_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_cmpgt_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_cmpgt_epi32(a, b);
+#  endif
+        else static_assert(sizeof(T) == 0, "no 64-bit integer compare");
+    }
+    // a >= b (false for NaN lanes)
+    template <class T>
+    static R<T> ge(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_cmpge_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_cmpge_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm_cmpeq_epi8(_mm_max_epu8(a, b), a);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_cmpeq_epi16(_mm_max_epi16(a, b), a);
+        else return _mm_xor_si128(gt<T>(b, a), _mm_set1_epi32(-1));
+#  endif
+    }
+
+    // -- min / max: for floats the second operand when either is NaN
+    template <class T>
+    static R<T> min(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_min_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_min_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm_min_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_min_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm_sub_epi16(a, _mm_subs_epu16(a, b));
+        else return select<T>(gt<T>(a, b), b, a);
+#  endif
+    }
+    template <class T>
+    static R<T> max(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_max_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_max_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm_max_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_max_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm_add_epi16(b, _mm_subs_epu16(a, b));
+        else return select<T>(gt<T>(a, b), a, b);
+#  endif
+    }
+    // mask ? a : b, bit by bit.
+    template <class T>
+    static R<T> select(R<T> mask, R<T> a, R<T> b) {
+        return bitOr<T>(bitAnd<T>(mask, a), andNot<T>(mask, b));
+    }
+
+#  if ZOR_SIMD >= 2
+    // -- integer lanes only
+    template <class T>
+    static __m128i addSat(__m128i a, __m128i b) {
+        if constexpr (std::is_same_v<T, uint8_t>) return _mm_adds_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm_adds_epi8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm_adds_epu16(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_adds_epi16(a, b);
+        else static_assert(sizeof(T) == 0, "saturating add of 8/16-bit lanes");
+    }
+    template <class T>
+    static __m128i subSat(__m128i a, __m128i b) {
+        if constexpr (std::is_same_v<T, uint8_t>) return _mm_subs_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm_subs_epi8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm_subs_epu16(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_subs_epi16(a, b);
+        else static_assert(sizeof(T) == 0, "saturating subtract of 8/16-bit lanes");
+    }
+    template <class T>
+    static __m128i avg(__m128i a, __m128i b) {
+        if constexpr (std::is_same_v<T, uint8_t>) return _mm_avg_epu8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm_avg_epu16(a, b);
+        else static_assert(sizeof(T) == 0, "rounding average of unsigned 8/16-bit lanes");
+    }
+    // High half of the 16 x 16-bit product.
+    template <class T>
+    static __m128i mulHi(__m128i a, __m128i b) {
+        if constexpr (std::is_same_v<T, int16_t>) return _mm_mulhi_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm_mulhi_epu16(a, b);
+        else static_assert(sizeof(T) == 0, "high product of 16-bit lanes");
+    }
+    // Shifts by a constant: logical for unsigned lanes, arithmetic for signed.
+    template <class T, int N>
+    static __m128i shl(__m128i a) {
+        if constexpr (sizeof(T) == 1)
+            return _mm_and_si128(_mm_slli_epi16(a, N), _mm_set1_epi8(char((0xFF << N) & 0xFF)));
+        else if constexpr (sizeof(T) == 2) return _mm_slli_epi16(a, N);
+        else if constexpr (sizeof(T) == 4) return _mm_slli_epi32(a, N);
+        else return _mm_slli_epi64(a, N);
+    }
+    template <class T, int N>
+    static __m128i shr(__m128i a) {
+        if constexpr (std::is_same_v<T, uint8_t>)
+            return _mm_and_si128(_mm_srli_epi16(a, N), _mm_set1_epi8(char(0xFF >> N)));
+        else if constexpr (std::is_same_v<T, int8_t>) {
+            const __m128i lo = _mm_srai_epi16(_mm_slli_epi16(a, 8), N + 8);
+            const __m128i hi = _mm_srai_epi16(a, N);
+            return _mm_or_si128(_mm_and_si128(lo, _mm_set1_epi16(0x00FF)),
+                                _mm_andnot_si128(_mm_set1_epi16(0x00FF), hi));
+        } else if constexpr (std::is_same_v<T, uint16_t>) return _mm_srli_epi16(a, N);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_srai_epi16(a, N);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm_srli_epi32(a, N);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm_srai_epi32(a, N);
+        else if constexpr (std::is_same_v<T, uint64_t>) return _mm_srli_epi64(a, N);
+        else static_assert(sizeof(T) == 0, "no arithmetic shift of 64-bit lanes");
+    }
+    // Shifts by a run-time count (16, 32 and 64-bit lanes).
+    template <class T>
+    static __m128i shl(__m128i a, int n) {
+        const __m128i c = _mm_cvtsi32_si128(n);
+        if constexpr (sizeof(T) == 2) return _mm_sll_epi16(a, c);
+        else if constexpr (sizeof(T) == 4) return _mm_sll_epi32(a, c);
+        else if constexpr (sizeof(T) == 8) return _mm_sll_epi64(a, c);
+        else static_assert(sizeof(T) == 0, "run-time shifts of 16/32/64-bit lanes");
+    }
+    template <class T>
+    static __m128i shr(__m128i a, int n) {
+        const __m128i c = _mm_cvtsi32_si128(n);
+        if constexpr (std::is_same_v<T, uint16_t>) return _mm_srl_epi16(a, c);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm_sra_epi16(a, c);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm_srl_epi32(a, c);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm_sra_epi32(a, c);
+        else if constexpr (std::is_same_v<T, uint64_t>) return _mm_srl_epi64(a, c);
+        else static_assert(sizeof(T) == 0, "run-time shifts of 16/32/64-bit lanes");
+    }
+
+    // -- widening and narrowing, per 16-byte block
+    // Lanes 0 .. n/2-1 (lo) or n/2 .. n-1 (hi) of a, widened to twice their
+    // size: zero-extended from unsigned, sign-extended from signed lanes.
+    template <class T>
+    static __m128i extension(__m128i a) {
+        if constexpr (std::is_unsigned_v<T>) return _mm_setzero_si128();
+        else if constexpr (sizeof(T) == 1) return _mm_cmpgt_epi8(_mm_setzero_si128(), a);
+        else if constexpr (sizeof(T) == 2) return _mm_srai_epi16(a, 15);
+        else return _mm_srai_epi32(a, 31);
+    }
+    template <class T>
+    static __m128i widenLo(__m128i a) {
+        const __m128i e = extension<T>(a);
+        if constexpr (sizeof(T) == 1) return _mm_unpacklo_epi8(a, e);
+        else if constexpr (sizeof(T) == 2) return _mm_unpacklo_epi16(a, e);
+        else return _mm_unpacklo_epi32(a, e);
+    }
+    template <class T>
+    static __m128i widenHi(__m128i a) {
+        const __m128i e = extension<T>(a);
+        if constexpr (sizeof(T) == 1) return _mm_unpackhi_epi8(a, e);
+        else if constexpr (sizeof(T) == 2) return _mm_unpackhi_epi16(a, e);
+        else return _mm_unpackhi_epi32(a, e);
+    }
+    // Saturating narrowing of two registers of From lanes into To lanes.
+    template <class To, class From>
+    static __m128i narrowSat(__m128i lo, __m128i hi) {
+        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>)
+            return _mm_packus_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>)
+            return _mm_packs_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, uint16_t> && std::is_same_v<To, uint8_t>) {
+            const __m128i top = _mm_set1_epi16(255);
+            return _mm_packus_epi16(min<uint16_t>(lo, top), min<uint16_t>(hi, top));
+        } else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>)
+            return _mm_packs_epi32(lo, hi);
+        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, uint16_t>) {
+            // clamp to 0..65535, move into the signed range, pack, move back
+            const __m128i bias = _mm_set1_epi32(32768), zero = _mm_setzero_si128();
+            const __m128i l = _mm_sub_epi32(select<int32_t>(_mm_cmpgt_epi32(lo, zero), lo, zero), bias);
+            const __m128i h = _mm_sub_epi32(select<int32_t>(_mm_cmpgt_epi32(hi, zero), hi, zero), bias);
+            return _mm_xor_si128(_mm_packs_epi32(l, h), _mm_set1_epi16(short(0x8000)));
+        } else static_assert(sizeof(To) == 0, "no such saturating narrowing");
+    }
+    // Narrowing that keeps the low bits of each lane.
+    template <class To, class From>
+    static __m128i narrowTrunc(__m128i lo, __m128i hi) {
+        if constexpr (sizeof(From) == 2 && sizeof(To) == 1) {
+            const __m128i m = _mm_set1_epi16(0x00FF);
+            return _mm_packus_epi16(_mm_and_si128(lo, m), _mm_and_si128(hi, m));
+        } else if constexpr (sizeof(From) == 4 && sizeof(To) == 2) {
+            const __m128i l = _mm_srai_epi32(_mm_slli_epi32(lo, 16), 16);
+            const __m128i h = _mm_srai_epi32(_mm_slli_epi32(hi, 16), 16);
+            return _mm_packs_epi32(l, h);
+        } else static_assert(sizeof(To) == 0, "no such truncating narrowing");
+    }
+    // Interleaves the lower (upper) halves of a and b: a0 b0 a1 b1 ...
+    template <class T>
+    static R<T> zipLo(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_unpacklo_ps(a, b);
+        else if constexpr (isD<T>) return _mm_unpacklo_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_unpacklo_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_unpacklo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_unpacklo_epi32(a, b);
+        else return _mm_unpacklo_epi64(a, b);
+    }
+    template <class T>
+    static R<T> zipHi(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_unpackhi_ps(a, b);
+        else if constexpr (isD<T>) return _mm_unpackhi_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_unpackhi_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_unpackhi_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_unpackhi_epi32(a, b);
+        else return _mm_unpackhi_epi64(a, b);
+    }
+    // pmaddwd: a0 b0 + a1 b1 of neighbouring 16-bit lanes, as 32-bit lanes.
+    static __m128i mulAddPairs16(__m128i a, __m128i b) { return _mm_madd_epi16(a, b); }
+    // psadbw: per 8 bytes the sum of |a - b|, in the low 16 bits of a 64-bit lane.
+    static __m128i sumAbsDiff8(__m128i a, __m128i b) { return _mm_sad_epu8(a, b); }
+    // Byte shifts of the whole register (per 16-byte block).
+    template <int N>
+    static __m128i shiftBytesUp(__m128i a) { return _mm_slli_si128(a, N); }
+    template <int N>
+    static __m128i shiftBytesDown(__m128i a) { return _mm_srli_si128(a, N); }
+    // One bit per byte, lane order.
+    static int byteMask(__m128i a) { return _mm_movemask_epi8(a); }
+
+    // -- conversions
+    static __m128 int32ToFloat(__m128i a) { return _mm_cvtepi32_ps(a); }
+    // By the rounding mode that MXCSR holds (nearest-even unless changed);
+    // INT_MIN for NaN and out-of-range lanes.
+    static __m128i floatToInt32(__m128 a) { return _mm_cvtps_epi32(a); }
+    static __m128i floatToInt32Trunc(__m128 a) { return _mm_cvttps_epi32(a); }
+    static __m128d floatToDoubleLo(__m128 a) { return _mm_cvtps_pd(a); }
+    static __m128d floatToDoubleHi(__m128 a) { return _mm_cvtps_pd(_mm_movehl_ps(a, a)); }
+    static __m128 doubleToFloat(__m128d lo, __m128d hi) {
+        return _mm_movelh_ps(_mm_cvtpd_ps(lo), _mm_cvtpd_ps(hi));
+    }
+    static __m128d int32ToDoubleLo(__m128i a) { return _mm_cvtepi32_pd(a); }
+    static __m128d int32ToDoubleHi(__m128i a) { return _mm_cvtepi32_pd(_mm_shuffle_epi32(a, 0x0E)); }
+    static __m128i doubleToInt32(__m128d lo, __m128d hi) {
+        return _mm_unpacklo_epi64(_mm_cvtpd_epi32(lo), _mm_cvtpd_epi32(hi));
+    }
+#  endif  // ZOR_SIMD >= 2
+
+    // One bit per lane of 32 or 64-bit lanes (their sign bits).
+    template <class T>
+    static int laneMask(R<T> a) {
+        if constexpr (isF<T>) return _mm_movemask_ps(a);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_movemask_pd(a);
+        else if constexpr (sizeof(T) == 4) return _mm_movemask_ps(_mm_castsi128_ps(a));
+        else if constexpr (sizeof(T) == 8) return _mm_movemask_pd(_mm_castsi128_pd(a));
+        else if constexpr (sizeof(T) == 2) return _mm_movemask_epi8(_mm_packs_epi16(a, _mm_setzero_si128()));
+        else return _mm_movemask_epi8(a);
+#  endif
+    }
+
+    // Reinterprets the bits.
+    template <class To, class From>
+    static R<To> bitcast(R<From> a) {
+        if constexpr (std::is_same_v<R<To>, R<From>>) return a;
+#  if ZOR_SIMD >= 2
+        else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);
+        else if constexpr (isD<To> && isF<From>) return _mm_castps_pd(a);
+        else if constexpr (isF<To>) return _mm_castsi128_ps(a);
+        else if constexpr (isD<To>) return _mm_castsi128_pd(a);
+        else if constexpr (isF<From>) return _mm_castps_si128(a);
+        else return _mm_castpd_si128(a);
+#  endif
+    }
+
+#  if ZOR_SIMD >= 4
+    // -- SSSE3
+    // pshufb: byte i of the result is table[idx[i] & 15], or 0 where idx[i]
+    // has its top bit set (per 16-byte block).
+    static __m128i shuffleBytes(__m128i table, __m128i idx) { return _mm_shuffle_epi8(table, idx); }
+    // palignr: bytes N .. N+15 of the 32-byte value hi:lo (per 16-byte block).
+    template <int N>
+    static __m128i alignBytes(__m128i hi, __m128i lo) { return _mm_alignr_epi8(hi, lo, N); }
+    // pmaddubsw: u0 s0 + u1 s1 of neighbouring bytes (unsigned times signed),
+    // saturated to 16 bits.
+    static __m128i mulAddPairs8(__m128i u, __m128i s) { return _mm_maddubs_epi16(u, s); }
+    // pmulhrsw: (a b + 2^14) >> 15 of 16-bit lanes.
+    static __m128i mulHiRound(__m128i a, __m128i b) { return _mm_mulhrs_epi16(a, b); }
+#  endif
+#  if ZOR_SIMD >= 2
+    template <class T>
+    static __m128i abs(__m128i a) {
+#    if ZOR_SIMD >= 4
+        if constexpr (sizeof(T) == 1) return _mm_abs_epi8(a);
+        else if constexpr (sizeof(T) == 2) return _mm_abs_epi16(a);
+        else return _mm_abs_epi32(a);
+#    else
+        // (a ^ s) - s with s the lane's sign spread over it; -MIN stays MIN
+        const __m128i s = extension<T>(a);
+        return sub<T>(_mm_xor_si128(a, s), s);
+#    endif
+    }
+#  endif
+};
+#endif  // ZOR_SIMD >= 1
+
+// ---- the vocabulary -----------------------------------------------------------
+// Free functions over Vec<T, B>; each forwards to Isa<B>.
+
+template <class V>
+inline V zero() { return {Isa<V::kBytes>::template zero<typename V::Lane>()}; }
+template <class V>
+inline V set1(typename V::Lane x) { return {Isa<V::kBytes>::template set1<typename V::Lane>(x)}; }
+// Loads V::kLanes lanes from p (any alignment).
+template <class V>
+inline V load(const typename V::Lane* p) { return {Isa<V::kBytes>::template load<typename V::Lane>(p)}; }
+template <class V>
+inline V loadAligned(const typename V::Lane* p) {
+    return {Isa<V::kBytes>::template loadAligned<typename V::Lane>(p)};
+}
+// The lower half of the lanes from p, the rest zero.
+template <class V>
+inline V loadHalf(const typename V::Lane* p) {
+    return {Isa<V::kBytes>::template loadHalf<typename V::Lane>(p)};
+}
+template <class T, int B>
+inline void store(T* p, Vec<T, B> v) { Isa<B>::template store<T>(p, v.raw); }
+template <class T, int B>
+inline void storeAligned(T* p, Vec<T, B> v) { Isa<B>::template storeAligned<T>(p, v.raw); }
+// Stores the lower half of the lanes.
+template <class T, int B>
+inline void storeHalf(T* p, Vec<T, B> v) { Isa<B>::template storeHalf<T>(p, v.raw); }
+// Non-temporal store to memory aligned to the register width.
+template <class T, int B>
+inline void stream(T* p, Vec<T, B> v) { Isa<B>::template stream<T>(p, v.raw); }
+
+// Loads from (and stores to) memory of any lane type: for moving bytes.
+template <class V, class U>
+inline V loadFrom(const U* p) { return load<V>(reinterpret_cast<const typename V::Lane*>(p)); }
+template <class T, int B, class U>
+inline void storeTo(U* p, Vec<T, B> v) { store(reinterpret_cast<T*>(p), v); }
+
+template <class T, int B>
+inline Vec<T, B> operator+(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template add<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator-(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template sub<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator*(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template mul<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator/(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template div<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator&(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template bitAnd<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator|(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template bitOr<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator^(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template bitXor<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B>& operator+=(Vec<T, B>& a, Vec<T, B> b) { return a = a + b; }
+template <class T, int B>
+inline Vec<T, B>& operator-=(Vec<T, B>& a, Vec<T, B> b) { return a = a - b; }
+template <class T, int B>
+inline Vec<T, B>& operator|=(Vec<T, B>& a, Vec<T, B> b) { return a = a | b; }
+// ~a & b
+template <class T, int B>
+inline Vec<T, B> andNot(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template andNot<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> operator~(Vec<T, B> a) { return andNot(a, Vec<T, B>{Isa<B>::template allOnes<T>()}); }
+
+template <class T, int B>
+inline Vec<T, B> sqrt(Vec<T, B> a) { return {Isa<B>::template sqrt<T>(a.raw)}; }
+template <class T, int B>
+inline Vec<T, B> min(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template min<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> max(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template max<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> addSat(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template addSat<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> subSat(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template subSat<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> avg(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template avg<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> absDiff(Vec<T, B> a, Vec<T, B> b) {
+    static_assert(std::is_unsigned_v<T> && sizeof(T) <= 2, "absolute difference of unsigned 8/16-bit lanes");
+    return subSat(a, b) | subSat(b, a);
+}
+// |a| of signed lanes; the lowest value stays as it is.
+template <class T, int B>
+inline Vec<T, B> abs(Vec<T, B> a) {
+    if constexpr (std::is_floating_point_v<T>) return andNot(set1<Vec<T, B>>(T(-0.0)), a);
+    else return {Isa<B>::template abs<T>(a.raw)};
+}
+template <class T, int B>
+inline Vec<T, B> mulHi(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template mulHi<T>(a.raw, b.raw)}; }
+
+// Comparisons give masks: every bit of a lane set where the relation holds.
+template <class T, int B>
+inline Vec<T, B> eq(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template eq<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> gt(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template gt<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> lt(Vec<T, B> a, Vec<T, B> b) { return gt(b, a); }
+template <class T, int B>
+inline Vec<T, B> ge(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template ge<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> le(Vec<T, B> a, Vec<T, B> b) { return ge(b, a); }
+// mask ? a : b, lane by lane (mask lanes all ones or all zeros).
+template <class T, int B>
+inline Vec<T, B> select(Vec<T, B> mask, Vec<T, B> a, Vec<T, B> b) {
+    return {Isa<B>::template select<T>(mask.raw, a.raw, b.raw)};
+}
+// Bit k set when lane k's top bit is set (lanes of 16 bits or more: the
+// lane's sign; bytes: one bit per byte).
+template <class T, int B>
+inline int laneMask(Vec<T, B> a) { return Isa<B>::template laneMask<T>(a.raw); }
+template <class T, int B>
+inline bool anyTrue(Vec<T, B> mask) { return laneMask(mask) != 0; }
+
+template <int N, class T, int B>
+inline Vec<T, B> shl(Vec<T, B> a) { return {Isa<B>::template shl<T, N>(a.raw)}; }
+// Logical for unsigned lanes, arithmetic for signed ones.
+template <int N, class T, int B>
+inline Vec<T, B> shr(Vec<T, B> a) { return {Isa<B>::template shr<T, N>(a.raw)}; }
+template <class T, int B>
+inline Vec<T, B> shl(Vec<T, B> a, int n) { return {Isa<B>::template shl<T>(a.raw, n)}; }
+template <class T, int B>
+inline Vec<T, B> shr(Vec<T, B> a, int n) { return {Isa<B>::template shr<T>(a.raw, n)}; }
+
+template <class To, class From, int B>
+inline Vec<To, B> bitcast(Vec<From, B> a) { return {Isa<B>::template bitcast<To, From>(a.raw)}; }
+
+// The lane type twice as wide, keeping signedness.
+template <class T>
+using Wider = std::conditional_t<
+    std::is_same_v<T, float>, double,
+    std::conditional_t<std::is_signed_v<T>,
+                       std::conditional_t<sizeof(T) == 1, int16_t, std::conditional_t<sizeof(T) == 2, int32_t, int64_t>>,
+                       std::conditional_t<sizeof(T) == 1, uint16_t, std::conditional_t<sizeof(T) == 2, uint32_t, uint64_t>>>>;
+
+// Per 16-byte block: the lower (upper) half of the lanes, widened (zero- or
+// sign-extended by T's signedness; floats to double).  Use bitcast for the
+// other signedness of the result.
+template <class T, int B>
+inline Vec<Wider<T>, B> widenLo(Vec<T, B> a) {
+    if constexpr (std::is_same_v<T, float>) return {Isa<B>::floatToDoubleLo(a.raw)};
+    else return {Isa<B>::template widenLo<T>(a.raw)};
+}
+template <class T, int B>
+inline Vec<Wider<T>, B> widenHi(Vec<T, B> a) {
+    if constexpr (std::is_same_v<T, float>) return {Isa<B>::floatToDoubleHi(a.raw)};
+    else return {Isa<B>::template widenHi<T>(a.raw)};
+}
+// Per 16-byte block: narrows lo and hi into one register of To lanes,
+// saturating to To's range (the inverse of widenLo/widenHi).  double to
+// float rounds by the current mode.
+template <class To, class From, int B>
+inline Vec<To, B> narrowSat(Vec<From, B> lo, Vec<From, B> hi) {
+    if constexpr (std::is_same_v<From, double>) return {Isa<B>::doubleToFloat(lo.raw, hi.raw)};
+    else return {Isa<B>::template narrowSat<To, From>(lo.raw, hi.raw)};
+}
+// Per 16-byte block: keeps the low bits of every lane.
+template <class To, class From, int B>
+inline Vec<To, B> narrowTrunc(Vec<From, B> lo, Vec<From, B> hi) {
+    return {Isa<B>::template narrowTrunc<To, From>(lo.raw, hi.raw)};
+}
+// Per 16-byte block: a0 b0 a1 b1 ... of the lower (upper) halves.
+template <class T, int B>
+inline Vec<T, B> zipLo(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template zipLo<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> zipHi(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template zipHi<T>(a.raw, b.raw)}; }
+
+template <int B>
+inline Vec<float, B> toFloat(Vec<int32_t, B> a) { return {Isa<B>::int32ToFloat(a.raw)}; }
+// Rounds by MXCSR (hold a ConversionScope for nearest-even); INT_MIN for NaN
+// and out-of-range lanes.
+template <int B>
+inline Vec<int32_t, B> toInt32(Vec<float, B> a) { return {Isa<B>::floatToInt32(a.raw)}; }
+template <int B>
+inline Vec<int32_t, B> toInt32Trunc(Vec<float, B> a) { return {Isa<B>::floatToInt32Trunc(a.raw)}; }
+// Lanes 0 .. n/2-1 (Lo) or n/2 .. n-1 (Hi) of 32-bit integers as doubles.
+template <int B>
+inline Vec<double, B> toDoubleLo(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleLo(a.raw)}; }
+template <int B>
+inline Vec<double, B> toDoubleHi(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleHi(a.raw)}; }
+// Two registers of doubles into one of 32-bit integers (rounded by MXCSR).
+template <int B>
+inline Vec<int32_t, B> toInt32(Vec<double, B> lo, Vec<double, B> hi) {
+    return {Isa<B>::doubleToInt32(lo.raw, hi.raw)};
+}
+
+// Neighbouring 16-bit lanes multiplied and summed into 32-bit lanes.
+template <int B>
+inline Vec<int32_t, B> mulAddPairs(Vec<int16_t, B> a, Vec<int16_t, B> b) {
+    return {Isa<B>::mulAddPairs16(a.raw, b.raw)};
+}
+// Unsigned times signed neighbouring bytes, summed and saturated to 16 bits.
+template <int B>
+inline Vec<int16_t, B> mulAddPairs(Vec<uint8_t, B> u, Vec<int8_t, B> s) {
+    return {Isa<B>::mulAddPairs8(u.raw, s.raw)};
+}
+// (a b + 2^14) >> 15
+template <int B>
+inline Vec<int16_t, B> mulHiRound(Vec<int16_t, B> a, Vec<int16_t, B> b) {
+    return {Isa<B>::mulHiRound(a.raw, b.raw)};
+}
+// Per 8 bytes the sum of |a - b| into a 64-bit lane.
+template <int B>
+inline Vec<uint64_t, B> sumAbsDiff(Vec<uint8_t, B> a, Vec<uint8_t, B> b) {
+    return {Isa<B>::sumAbsDiff8(a.raw, b.raw)};
+}
+// Per 16-byte block: byte i is table[idx[i] & 15], zero where idx[i] >= 128.
+template <int B>
+inline Vec<uint8_t, B> shuffleBytes(Vec<uint8_t, B> table, Vec<uint8_t, B> idx) {
+    return {Isa<B>::shuffleBytes(table.raw, idx.raw)};
+}
+// Per 16-byte block: bytes N .. N+15 of hi:lo.
+template <int N, class T, int B>
+inline Vec<T, B> alignBytes(Vec<T, B> hi, Vec<T, B> lo) {
+    return {Isa<B>::template alignBytes<N>(hi.raw, lo.raw)};
+}
+// Per 16-byte block: moves the bytes N places up (towards the last lane),
+// shifting in zeros; shiftBytesDown the other way.
+template <int N, class T, int B>
+inline Vec<T, B> shiftBytesUp(Vec<T, B> a) { return {Isa<B>::template shiftBytesUp<N>(a.raw)}; }
+template <int N, class T, int B>
+inline Vec<T, B> shiftBytesDown(Vec<T, B> a) { return {Isa<B>::template shiftBytesDown<N>(a.raw)}; }
+
+// A constant register from a table of lanes (kLanes entries).
+template <class V>
+inline V fromLanes(const typename V::Lane (&lanes)[V::kLanes]) { return load<V>(lanes); }
+
+// ---- horizontal reductions ----------------------------------------------------
+// Integer sums wrap around in the lane type.  Float sums add in a fixed
+// order: lane i and lane i + n/2, halving until one is left, so four lanes
+// give (l0 + l2) + (l1 + l3).  Widen first where a sum needs more range.
+
+template <class T, int B>
+inline T reduceAdd(Vec<T, B> v) {
+    alignas(64) T l[Vec<T, B>::kLanes];
+    storeAligned(l, v);
+    for (int half = Vec<T, B>::kLanes / 2; half >= 1; half /= 2)
+        for (int i = 0; i < half; ++i) l[i] = T(l[i] + l[i + half]);
+    return l[0];
+}
+template <class T, int B>
+inline T reduceMin(Vec<T, B> v) {
+    alignas(64) T l[Vec<T, B>::kLanes];
+    storeAligned(l, v);
+    T r = l[0];
+    for (int i = 1; i < Vec<T, B>::kLanes; ++i) r = min(l[i], r);
+    return r;
+}
+template <class T, int B>
+inline T reduceMax(Vec<T, B> v) {
+    alignas(64) T l[Vec<T, B>::kLanes];
+    storeAligned(l, v);
+    T r = l[0];
+    for (int i = 1; i < Vec<T, B>::kLanes; ++i) r = max(l[i], r);
+    return r;
+}
+
+// ---- loops --------------------------------------------------------------------
+// d[i] = op(s[i]) for i < n: whole registers while they fit (two at a time),
+// then one element at a time.  op is called with Vec<S> and with S (a generic
+// lambda over the names above serves both) and gives Vec<D> / D; D and S
+// must have the same size.  Reads every source element before the store of
+// its register, so d == s works.
+template <class D, class S, class Op>
+inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
+    ptrdiff_t i = 0;
+    if constexpr (kHas<S> && kHas<D>) {
+        static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
+        using V = Vec<S>;
+        constexpr int L = V::kLanes;
+        for (; i + 2 * L <= n; i += 2 * L) {
+            const V a = load<V>(s + i), b = load<V>(s + i + L);
+            store(d + i, op(a));
+            store(d + i + L, op(b));
+        }
+        if (i + L <= n) {
+            store(d + i, op(load<V>(s + i)));
+            i += L;
+        }
+    }
+    for (; i < n; ++i) d[i] = op(s[i]);
+}
+// d[i] = op(a[i], b[i]).
+template <class D, class S, class Op>
+inline void mapLanes(const S* a, const S* b, D* d, ptrdiff_t n, Op op) {
+    ptrdiff_t i = 0;
+    if constexpr (kHas<S> && kHas<D>) {
+        static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
+        using V = Vec<S>;
+        constexpr int L = V::kLanes;
+        for (; i + 2 * L <= n; i += 2 * L) {
+            const V a0 = load<V>(a + i), b0 = load<V>(b + i);
+            const V a1 = load<V>(a + i + L), b1 = load<V>(b + i + L);
+            store(d + i, op(a0, b0));
+            store(d + i + L, op(a1, b1));
+        }
+        if (i + L <= n) {
+            store(d + i, op(load<V>(a + i), load<V>(b + i)));
+            i += L;
+        }
+    }
+    for (; i < n; ++i) d[i] = op(a[i], b[i]);
+}
+
+}}}  // namespace zor::ZOR_INLINE_NS::simd

@@ -1,0 +1,106 @@
+// The lane vocabulary against its scalar twins, compiled as the SSE2 column
+// (where most operations are emulated) and run on random lanes.
+#include "frame/variant.h"
+#include "frame/simd.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <random>
+#include <vector>
+
+namespace {
+using namespace zor::simd;
+
+template <class T>
+std::vector<T> randomLanes(std::mt19937& rng, int n) {
+    std::vector<T> v(n);
+    for (auto& x : v) {
+        const uint64_t bits = (uint64_t(rng()) << 32) | rng();
+        std::memcpy(&x, &bits, sizeof(T));
+        if (rng() % 8 == 0) x = T(rng() % 3);  // ties and small values
+    }
+    return v;
+}
+
+// op over whole registers (and the tail) equals op on each lane.
+template <class T, class Op>
+void agreesLaneByLane(Op op, const char* what) {
+    std::mt19937 rng(7);
+    const int n = 3 * Vec<T>::kLanes + 1;
+    for (int round = 0; round < 50; ++round) {
+        const auto a = randomLanes<T>(rng, n), b = randomLanes<T>(rng, n);
+        std::vector<T> got(n);
+        mapLanes(a.data(), b.data(), got.data(), n, op);
+        for (int i = 0; i < n; ++i)
+            ASSERT_EQ(got[i], op(a[i], b[i])) << what << " lane " << i << " of " << sizeof(T) * 8 << "-bit";
+    }
+}
+
+template <class T>
+void integerOps() {
+    agreesLaneByLane<T>([](auto a, auto b) { return min(a, b); }, "min");
+    agreesLaneByLane<T>([](auto a, auto b) { return max(a, b); }, "max");
+    agreesLaneByLane<T>([](auto a, auto b) { return select(gt(a, b), a, b); }, "gt");
+    agreesLaneByLane<T>([](auto a, auto b) { return select(ge(a, b), b, a); }, "ge");
+    agreesLaneByLane<T>([](auto a, auto b) { return select(le(a, b), a, b); }, "le");
+    agreesLaneByLane<T>([](auto a, auto) { return shr<3>(a); }, "shr");
+    agreesLaneByLane<T>([](auto a, auto) { return shl<5>(a); }, "shl");
+    if constexpr (sizeof(T) <= 2) {
+        agreesLaneByLane<T>([](auto a, auto b) { return addSat(a, b); }, "addSat");
+        agreesLaneByLane<T>([](auto a, auto b) { return subSat(a, b); }, "subSat");
+    }
+    if constexpr (std::is_signed_v<T>) agreesLaneByLane<T>([](auto a, auto) { return abs(a); }, "abs");
+}
+
+TEST(SimdLanes, IntegerOperationsMatchTheirScalarTwins) {
+    integerOps<uint8_t>();
+    integerOps<int8_t>();
+    integerOps<uint16_t>();
+    integerOps<int16_t>();
+    integerOps<uint32_t>();
+    integerOps<int32_t>();
+    agreesLaneByLane<uint8_t>([](auto a, auto b) { return avg(a, b); }, "avg");
+    agreesLaneByLane<uint16_t>([](auto a, auto b) { return absDiff(a, b); }, "absDiff");
+    agreesLaneByLane<uint32_t>([](auto a, auto b) { return a * b; }, "mul");
+}
+
+TEST(SimdLanes, WidenThenNarrowRestoresOrderAndSaturates) {
+    std::mt19937 rng(3);
+    const auto a = randomLanes<int32_t>(rng, 8);
+    using V = Vec<int32_t>;
+    const auto u16 = narrowSat<uint16_t>(load<V>(a.data()), load<V>(a.data() + 4));
+    const auto s16 = narrowSat<int16_t>(load<V>(a.data()), load<V>(a.data() + 4));
+    uint16_t gotU[8];
+    int16_t gotS[8];
+    store(gotU, u16);
+    store(gotS, s16);
+    for (int i = 0; i < 8; ++i) {
+        EXPECT_EQ(gotU[i], a[i] < 0 ? 0 : a[i] > 65535 ? 65535 : a[i]) << i;
+        EXPECT_EQ(gotS[i], a[i] < -32768 ? -32768 : a[i] > 32767 ? 32767 : a[i]) << i;
+    }
+    const auto bytes = randomLanes<int8_t>(rng, 16);
+    const auto v = load<Vec<int8_t>>(bytes.data());
+    int8_t back[16];
+    store(back, narrowSat<int8_t>(widenLo(v), widenHi(v)));
+    EXPECT_EQ(0, std::memcmp(back, bytes.data(), 16));
+    int16_t wide[8];
+    store(wide, widenHi(v));
+    for (int i = 0; i < 8; ++i) EXPECT_EQ(wide[i], bytes[8 + i]);
+}
+
+TEST(SimdLanes, FloatReductionOrderAndSelect) {
+    const float l[4] = {1e8f, 1.0f, -1e8f, 1.0f};
+    // (l0 + l2) + (l1 + l3) = 2; left to right would give 1
+    EXPECT_EQ(reduceAdd(load<Vec<float>>(l)), 2.0f);
+    const float nan = std::numeric_limits<float>::quiet_NaN();
+    const float x[4] = {nan, -0.0f, 3.0f, -2.0f}, y[4] = {1.0f, 0.0f, nan, 5.0f};
+    float got[4];
+    store(got, min(load<Vec<float>>(x), load<Vec<float>>(y)));
+    for (int i = 0; i < 4; ++i) EXPECT_EQ(std::memcmp(&got[i], &y[i] , 4) == 0, i != 3) << i;
+    store(got, abs(load<Vec<float>>(x)));
+    EXPECT_TRUE(got[0] != got[0]);
+    EXPECT_EQ(got[3], 2.0f);
+}
+
+}  // namespace
