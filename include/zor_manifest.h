@@ -416,3 +416,31 @@ ZOR_FN(ZOR_GENERIC, Status, zorsNormEnergy_32f,
 ZOR_FN(ZOR_GENERIC, Status, zorsSignChangeRate_16s, (const int16_t* pSrc, int len, int32_t* pRes))
 ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
        (const int16_t* pSrc, int len, int lowerLag, int upperLag, int32_t* pMax, int* pMaxLag))
+
+/* ---- frame/adapters ---- */
+
+/* ---- image/filter/floodfill ---- */
+
+/* ---- matrix/qr ---- */
+
+/* ---- image/stats/reductions ---- */
+
+/* ---- image/stats/histogram ---- */
+
+/* ---- image/stats/moments ---- */
+
+/* ---- image/geometry/resize ---- */
+
+/* ---- image/geometry/rotate ---- */
+
+/* ---- image/geometry/warp ---- */
+
+/* ---- image/filter/smoothing ---- */
+
+/* ---- image/pixel/arith ---- */
+
+/* ---- image/color/color ---- */
+
+/* ---- image/color/jpeg ---- */
+
+/* ---- signal/transform/dft2d ---- */

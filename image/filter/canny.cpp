@@ -20,7 +20,7 @@
 // after it (a plateau keeps its left or upper pixel); along diagonals it must
 // beat both.
 #include "frame/variant.h"
-#include "frame/rows.h"
+#include "frame/row_address.h"
 #include "frame/status.h"
 
 #include <climits>

@@ -15,7 +15,7 @@
 // The 16s integer form scales the kernel by the float reciprocal of the
 // divisor and runs the float-kernel 16s filter.
 #include "frame/variant.h"
-#include "frame/rows.h"
+#include "frame/row_address.h"
 #include "frame/fpu.h"
 #include "frame/memory.h"
 #include "frame/status.h"

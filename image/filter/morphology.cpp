@@ -7,7 +7,7 @@
 // computed.  The 3x3 forms are the case ay = 1 (two buffers); the masked
 // forms use ay + 1 buffers.  The caller supplies the border pixels.
 #include "frame/variant.h"
-#include "frame/rows.h"
+#include "frame/row_address.h"
 #include "frame/memory.h"
 #include "frame/status.h"
 #include "image/filter/extreme3x3.h"

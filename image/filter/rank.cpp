@@ -12,7 +12,7 @@
 // Maximum and minimum are separable: a row pass over the mW values of each
 // neighbourhood row into a ring of mH rows, then a column pass over the ring.
 #include "frame/variant.h"
-#include "frame/rows.h"
+#include "frame/row_address.h"
 #include "frame/memory.h"
 #include "frame/status.h"
 #include "image/filter/extreme3x3.h"

@@ -19,7 +19,7 @@
 // ROI; the border forms read only the ROI and synthesise the rest in the
 // caller's buffer (border types documented in zor_manifest.h).
 #include "frame/variant.h"
-#include "frame/rows.h"
+#include "frame/row_address.h"
 #include "frame/fpu.h"
 #include "frame/memory.h"
 #include "frame/status.h"

@@ -10,7 +10,7 @@
 #include <type_traits>
 
 #include "frame/abi.h"
-#include "frame/rows.h"
+#include "frame/row_address.h"
 #include "zor.h"
 
 namespace zor { inline namespace ZOR_INLINE_NS {

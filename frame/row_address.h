@@ -1,4 +1,4 @@
-// Row addressing shared by the image families.
+// Row addressing shared by the image families: rowAt(base, step, row).
 #pragma once
 
 #include <cstddef>
