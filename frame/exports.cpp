@@ -1,10 +1,8 @@
-// The export stubs, their slots and the dispatch table, all expanded from the
-// manifest.
+// The export slots and the dispatch table, expanded from the manifest.
 //
-// A stub is a naked function whose whole body is one indirect jump through
-// its slot: the caller's arguments and return address stay where they are,
-// so the bound entry (which has the export's exact signature and calling
-// convention) runs as if it had been called directly.
+// Each export is a stub in frame/stubs.S that jumps through its slot
+// zor_slot_<name>; the load-time binding copies one column of the table
+// below into the slots.
 #include "frame/dispatch.h"
 
 #define ZOR_ENTRY_NS v0
@@ -29,27 +27,6 @@ using zor::dispatch::Entry;
 // Slots: null until the load-time binding fills them.
 extern "C" {
 #define ZOR_FN(map, ret, name, params) ZOR_HIDDEN Entry zor_slot_##name = nullptr;
-#include "zor_manifest.h"
-#undef ZOR_FN
-}
-
-#define ZOR_STR2_(x) #x
-#define ZOR_STR_(x) ZOR_STR2_(x)
-#define ZOR_SYM_(s) ZOR_STR_(__USER_LABEL_PREFIX__) s
-
-#if defined(__x86_64__)
-#  define ZOR_JUMP_(name) __asm__("jmp *" ZOR_SYM_("zor_slot_" #name) "(%rip)");
-#elif defined(__i386__)
-#  define ZOR_JUMP_(name) __asm__("jmp *" ZOR_SYM_("zor_slot_" #name));
-#else
-#  error "zor's export stubs are written for x86"
-#endif
-
-// The stubs never name their parameters: the jump leaves them to the entry.
-#pragma GCC diagnostic ignored "-Wunused-parameter"
-extern "C" {
-#define ZOR_FN(map, ret, name, params) \
-    __attribute__((naked)) ret ZOR_CALL name params { ZOR_JUMP_(name) }
 #include "zor_manifest.h"
 #undef ZOR_FN
 }
