@@ -476,10 +476,12 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
  * pBuffer: with a null pBuffer the call allocates its work area itself
  * (-9 when that fails).  A caller's buffer needs bufferSize bytes (the
  * record field; 0: the call needs none) and is rounded up to 32 bytes
- * inside; 256 max(W, H) + 4096 bytes is always enough.
+ * inside; 1024 max(W, H) + 4096 bytes is always enough.
  * Accuracy as the 1-D FFT's: within float rounding of the exact
  * transform, for every size (sizes with a prime factor above 31 go through
- * a chirp convolution).  Every variant gives the same bits. */
+ * a chirp convolution).  Every variant gives the same bits, except where
+ * intermediate values leave float's normal range (denormal or overflowing
+ * values; the 32-bit generic variant keeps them with the x87 exponent). */
 ZOR_FN(ZOR_ALL, Status, zoriDFTInitAlloc_R_32f, (void** ppSpec, ImageSize roiSize, int flag, int hint))
 ZOR_FN(ZOR_ALL, Status, zoriDFTFree_R_32f, (void* pSpec))
 ZOR_FN(ZOR_ALL, Status, zoriDFTFwd_RToPack_32f_C1R,

@@ -143,15 +143,16 @@ TEST_P(Dft2d, RoundTripsWithEveryFlag) {
 void* failingAlloc(size_t) { return nullptr; }
 
 TEST_P(Dft2d, BuffersAndAllocationFailure) {
-    for (const auto& s : {std::pair<int, int>{3, 200}, {300, 2}, {16, 16}}) {
+    for (const auto& s : {std::pair<int, int>{3, 200}, {300, 2}, {16, 16}, {67, 5}, {1, 331}}) {
         const int w = s.first, h = s.second;
         const auto x = noise(size_t(w) * h, 9);
         Spec spec(z(), w, h, 4);
         std::vector<float> a(x.size()), b(x.size(), 7.0f);
-        std::vector<uint8_t> buf(256 * std::max(w, h) + 4096 + 1);
+        std::vector<uint8_t> buf(1024 * std::max(w, h) + 4096 + 1);
         ASSERT_EQ(z().zoriDFTFwd_RToPack_32f_C1R(x.data(), w * 4, a.data(), w * 4, spec.p, buf.data() + 1), 0);
         int32_t need;
         std::memcpy(&need, static_cast<uint8_t*>(spec.p) + 28, 4);
+        EXPECT_LE(need, 1024 * std::max(w, h) + 4096);
         if (need > 0) {
             zor::mem::rawAlloc = failingAlloc;
             EXPECT_EQ(z().zoriDFTFwd_RToPack_32f_C1R(x.data(), w * 4, b.data(), w * 4, spec.p, nullptr), StatusNoMemory);
@@ -174,6 +175,7 @@ TEST_P(Dft2d, Checks) {
     zor::mem::rawAlloc = failingAlloc;
     EXPECT_EQ(a.zoriDFTInitAlloc_R_32f(&p, {4, 4}, 8, 0), StatusNoMemory);
     zor::mem::rawAlloc = std::malloc;
+    EXPECT_EQ(a.zoriDFTInitAlloc_R_32f(&p, {0x7FFFFFFF, 3}, 8, 0), StatusNoMemory);  // no 32-bit sizes
     EXPECT_EQ(a.zoriDFTFree_R_32f(nullptr), StatusNullPointer);
 
     Spec spec(a, 6, 5, 2);
