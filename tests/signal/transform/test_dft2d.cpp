@@ -61,13 +61,7 @@ std::vector<double> pack(const std::vector<cd>& y, int w, int h) {
     return out;
 }
 
-std::vector<float> noise(size_t n, unsigned seed) {
-    std::mt19937 g(seed);
-    std::uniform_real_distribution<float> d(-1.0f, 1.0f);
-    std::vector<float> v(n);
-    for (float& x : v) x = d(g);
-    return v;
-}
+std::vector<float> noise(size_t n, unsigned seed) { return zt::randomFloats(n, seed, 1.0f); }
 
 // Relative RMS distance of an image (rows `step` bytes apart) from ref * f.
 double relErr(const float* img, int step, const std::vector<double>& ref, int w, int h, double f) {
