@@ -130,6 +130,7 @@ struct Span {
 template <class V>
 struct Radix2 {
     static constexpr int kP = 2;
+    static constexpr bool kFixed = true;
     void operator()(Cx<V>* a) const {
         const Cx<V> a0 = a[0];
         a[0] = a0 + a[1];
@@ -140,6 +141,7 @@ struct Radix2 {
 template <class V>
 struct Radix4 {
     static constexpr int kP = 4;
+    static constexpr bool kFixed = true;
     void operator()(Cx<V>* a) const {
         const Cx<V> s02 = a[0] + a[2], d02 = a[0] - a[2], s13 = a[1] + a[3], d13 = a[1] - a[3];
         a[0] = s02 + s13;
@@ -156,6 +158,7 @@ struct Radix4 {
 template <class V, int P>
 struct RadixOdd {
     static constexpr int kP = P ? P : kMaxOddRadix;
+    static constexpr bool kFixed = P != 0;
     static constexpr int kH = (kP - 1) / 2;
     int p, h;
     V cosines[kH][kH], sines[kH][kH];  // [v - 1][s - 1]
@@ -195,8 +198,9 @@ struct RadixOdd {
 // x[q r + v r' + k] (r = n / span, r' = r / p) times w^(v q) give outputs
 // y[q r' + s span r' + k].
 template <class V, class Butterfly>
-void runStage(Span<V> x, Span<V> y, int n, int span, int p, const float* tw, const Butterfly& bf) {
+void runStage(Span<V> x, Span<V> y, int n, int span, int radix, const float* tw, const Butterfly& bf) {
     constexpr int kP = Butterfly::kP;
+    const int p = Butterfly::kFixed ? kP : radix;  // a constant where it can be: loops unroll
     const ptrdiff_t rOut = n / (ptrdiff_t(span) * p), outStride = ptrdiff_t(span) * rOut;
     Cx<V> a[kP];
     for (int q = 0; q < span; ++q) {
