@@ -5,7 +5,8 @@
 // Where a result is defined as "computed in double and rounded once", those
 // variants set the x87 precision control to 53 bits for the duration of the
 // loop (DoublePrecisionScope), and round to float through a store
-// (toFloat), so every variant gives the same bits.  Everywhere else (x86-64,
+// (toFloat), so every variant gives the same bits; float kernels hold a
+// SinglePrecisionScope instead.  Everywhere else (x86-64,
 // and the 32-bit SSE2+ variants, which use SSE arithmetic) both are no-ops.
 #pragma once
 
@@ -21,24 +22,38 @@ namespace zor { inline namespace ZOR_INLINE_NS {
 #  define ZOR_X87_MATH 0
 #endif
 
-class DoublePrecisionScope {
+// Sets the x87 precision control (PcBits: 0x0200 for 53 bits, 0 for 24
+// bits) for the lifetime of the scope and restores the caller's afterwards.
+template <unsigned PcBits>
+class PrecisionControlScope {
 public:
 #if ZOR_X87_MATH
-    DoublePrecisionScope() {
+    PrecisionControlScope() {
         __asm__ volatile("fnstcw %0" : "=m"(saved_));
-        const uint16_t cw = static_cast<uint16_t>((saved_ & ~0x0300u) | 0x0200u);  // PC = 53 bits
+        const uint16_t cw = static_cast<uint16_t>((saved_ & ~0x0300u) | PcBits);
         __asm__ volatile("fldcw %0" : : "m"(cw));
     }
-    ~DoublePrecisionScope() { __asm__ volatile("fldcw %0" : : "m"(saved_)); }
+    ~PrecisionControlScope() { __asm__ volatile("fldcw %0" : : "m"(saved_)); }
 
 private:
     uint16_t saved_;
 #else
-    DoublePrecisionScope() {}
+    PrecisionControlScope() {}
 #endif
-    DoublePrecisionScope(const DoublePrecisionScope&) = delete;
-    DoublePrecisionScope& operator=(const DoublePrecisionScope&) = delete;
+    PrecisionControlScope(const PrecisionControlScope&) = delete;
+    PrecisionControlScope& operator=(const PrecisionControlScope&) = delete;
 };
+
+// Results defined as double arithmetic rounded once.
+using DoublePrecisionScope = PrecisionControlScope<0x0200u>;
+
+// Results defined as a sequence of float operations (the float kernels
+// that SSE runs lane by lane): every x87 operation then rounds its
+// significand to 24 bits as SSE does, also where the compiler keeps the
+// value in a register.  Equal to SSE for results in float's normal range
+// (x87 registers keep their wider exponent, so overflow and denormal
+// results may differ).
+using SinglePrecisionScope = PrecisionControlScope<0x0000u>;
 
 // Rounds a double to float exactly once, even where the compiler would keep
 // the value in an x87 register.

@@ -106,6 +106,32 @@ constexpr T shl(T a) { return T(static_cast<std::make_unsigned_t<T>>(a) << N); }
 template <int N, class T>
 constexpr T shr(T a) { return T(a >> N); }
 
+// A plain lane stands for a register of one lane, so that a kernel written
+// over a register type V serves the generic variant with V = float:
+// load<float>(p), store(p, x), set1<float>(x), zero<float>(), lanesOf<V>,
+// and the lane-order shuffles further down (deinterleave, interleave,
+// transpose), which are identities on one lane.
+template <class V>
+inline std::enable_if_t<std::is_arithmetic_v<V>, V> load(const V* p) { return *p; }
+template <class T>
+inline std::enable_if_t<std::is_arithmetic_v<T>> store(T* p, T v) { *p = v; }
+template <class V>
+inline std::enable_if_t<std::is_arithmetic_v<V>, V> set1(V x) { return x; }
+template <class V>
+inline std::enable_if_t<std::is_arithmetic_v<V>, V> zero() { return V(0); }
+template <class T>
+inline std::enable_if_t<std::is_arithmetic_v<T>> deinterleave(T a, T b, T& even, T& odd) {
+    even = a;
+    odd = b;
+}
+template <class T>
+inline std::enable_if_t<std::is_arithmetic_v<T>> interleave(T even, T odd, T& lo, T& hi) {
+    lo = even;
+    hi = odd;
+}
+template <class T>
+inline std::enable_if_t<std::is_arithmetic_v<T>> transpose(T (&)[1]) {}
+
 // ---- registers --------------------------------------------------------------
 
 template <class T, int Bytes, class Enable = void>
@@ -148,6 +174,13 @@ struct Vec {
     static constexpr int kLanes = Bytes / int(sizeof(T));
     Raw raw;
 };
+
+// Lanes of a register type; 1 for a plain lane.
+template <class V>
+constexpr int lanesOf() {
+    if constexpr (std::is_arithmetic_v<V>) return 1;
+    else return V::kLanes;
+}
 
 template <int Bytes>
 struct Isa;  // the instructions of one register width
@@ -603,6 +636,18 @@ struct Isa<16> {
     }
 #  endif  // ZOR_SIMD >= 2
 
+    // Even and odd lanes of the run a0 .. a3 b0 .. b3 (float lanes).
+    static void deinterleave(__m128 a, __m128 b, __m128& even, __m128& odd) {
+        even = _mm_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+        odd = _mm_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+    }
+    static void interleave(__m128 even, __m128 odd, __m128& lo, __m128& hi) {
+        lo = _mm_unpacklo_ps(even, odd);
+        hi = _mm_unpackhi_ps(even, odd);
+    }
+    // Four registers of four float lanes as the rows of a square, transposed.
+    static void transpose(__m128 (&r)[4]) { _MM_TRANSPOSE4_PS(r[0], r[1], r[2], r[3]); }
+
     // One bit per lane of 32 or 64-bit lanes (their sign bits).
     template <class T>
     static int laneMask(R<T> a) {
@@ -665,7 +710,7 @@ struct Isa<16> {
 // Free functions over Vec<T, B>; each forwards to Isa<B>.
 
 template <class V>
-inline V zero() { return {Isa<V::kBytes>::template zero<typename V::Lane>()}; }
+inline std::enable_if_t<!std::is_arithmetic_v<V>, V> zero() { return {Isa<V::kBytes>::template zero<typename V::Lane>()}; }
 template <class V>
 inline V set1(typename V::Lane x) { return {Isa<V::kBytes>::template set1<typename V::Lane>(x)}; }
 // Loads V::kLanes lanes from p (any alignment).
@@ -880,6 +925,27 @@ template <int N, class T, int B>
 inline Vec<T, B> shiftBytesUp(Vec<T, B> a) { return {Isa<B>::template shiftBytesUp<N>(a.raw)}; }
 template <int N, class T, int B>
 inline Vec<T, B> shiftBytesDown(Vec<T, B> a) { return {Isa<B>::template shiftBytesDown<N>(a.raw)}; }
+
+// Lane order over the whole register (not per 16-byte block), float lanes:
+// deinterleave reads a then b as one run of 2n lanes and returns its even
+// lanes (a0 a2 ... b0 b2 ...) and its odd lanes; interleave undoes it
+// (lo = e0 o0 e1 o1 ..., hi = the second half of that run).  transpose
+// takes kLanes registers as the rows of a square and transposes it.
+template <int B>
+inline void deinterleave(Vec<float, B> a, Vec<float, B> b, Vec<float, B>& even, Vec<float, B>& odd) {
+    Isa<B>::deinterleave(a.raw, b.raw, even.raw, odd.raw);
+}
+template <int B>
+inline void interleave(Vec<float, B> even, Vec<float, B> odd, Vec<float, B>& lo, Vec<float, B>& hi) {
+    Isa<B>::interleave(even.raw, odd.raw, lo.raw, hi.raw);
+}
+template <int B>
+inline void transpose(Vec<float, B> (&rows)[Vec<float, B>::kLanes]) {
+    typename Vec<float, B>::Raw r[Vec<float, B>::kLanes];
+    for (int i = 0; i < Vec<float, B>::kLanes; ++i) r[i] = rows[i].raw;
+    Isa<B>::transpose(r);
+    for (int i = 0; i < Vec<float, B>::kLanes; ++i) rows[i].raw = r[i];
+}
 
 // A constant register from a table of lanes (kLanes entries).
 template <class V>

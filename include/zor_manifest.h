@@ -443,4 +443,48 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
 
 /* ---- image/color/jpeg ---- */
 
-/* ---- signal/transform/dft2d ---- */
+/* ---- signal/transform/dft2d ----
+ * Two-dimensional DFT of a real float image of any width W >= 1 and height
+ * H >= 1: Y(u, v) = sum over rows y and columns x of
+ * src(x, y) exp(-2 pi i (u y / H + v x / W)).
+ * zoriDFTInitAlloc_R_32f makes a spec for images of roiSize; its record
+ * starts with these 32-bit fields (byte offsets): 0 identifier (7), 4 width,
+ * 8 height, 12 forwardScaled, 16 inverseScaled, 20 scale (float),
+ * 24 hint, 28 bufferSize, 32 allocated (1).
+ * flag: 8 no normalisation, 1 forward divided by W H, 2 inverse divided by
+ * W H, 4 both divided by sqrt(W H); hint is kept and changes nothing.
+ * Checks, first failure wins, nothing written on failure:
+ *   InitAlloc: null ppSpec -8, W or H < 1 -6, other flag -16, allocation
+ *   failure -9 (nothing kept).  Free: null -8, identifier not 7 -17.
+ *   Fwd, Inv: null pSpec -8, identifier not 7 -17, null image -8, a step
+ *   below 4 W -14, a step that is no multiple of 4 -108.
+ * Packed layout, the one cv::dft gives for a real 2-D input without
+ * DFT_COMPLEX_OUTPUT (CCS), W x H floats, element (column, row):
+ *   column 0 runs down the CCS of spectrum column 0: Re Y(0,0), Re Y(1,0),
+ *   Im Y(1,0), Re Y(2,0), Im Y(2,0) ... ending with Re Y(H/2,0) when H is
+ *   even (Im Y(0,0) and Im Y(H/2,0), always 0, are not stored);
+ *   for even W, column W-1 holds spectrum column W/2 the same way;
+ *   columns 2k-1 and 2k, 0 < k < W/2, hold Re Y(u,k) and Im Y(u,k) in row
+ *   u, u = 0 .. H-1.  A single row is thus the 1-D CCS Re Y0, Re Y1,
+ *   Im Y1, ... and a single column the same down the column.
+ * The inverse reads that layout as the spectrum of a real image (the
+ * missing half by conjugate symmetry) and writes the sum of
+ * Y(u, v) exp(+2 pi i (u y / H + v x / W)) times the inverse scale:
+ * forward then inverse gives the image back with flags 1, 2 and 4, and
+ * W H times the image with flag 8.
+ * In place: pSrc == pDst with equal steps.
+ * pBuffer: with a null pBuffer the call allocates its work area itself
+ * (-9 when that fails).  A caller's buffer needs bufferSize bytes (the
+ * record field; 0: the call needs none) and is rounded up to 32 bytes
+ * inside; 1024 max(W, H) + 4096 bytes is always enough.
+ * Accuracy as the 1-D FFT's: within float rounding of the exact
+ * transform, for every size (sizes with a prime factor above 31 go through
+ * a chirp convolution).  Every variant gives the same bits, except where
+ * intermediate values leave float's normal range (denormal or overflowing
+ * values; the 32-bit generic variant keeps them with the x87 exponent). */
+ZOR_FN(ZOR_ALL, Status, zoriDFTInitAlloc_R_32f, (void** ppSpec, ImageSize roiSize, int flag, int hint))
+ZOR_FN(ZOR_ALL, Status, zoriDFTFree_R_32f, (void* pSpec))
+ZOR_FN(ZOR_ALL, Status, zoriDFTFwd_RToPack_32f_C1R,
+       (const float* pSrc, int srcStep, float* pDst, int dstStep, const void* pSpec, uint8_t* pBuffer))
+ZOR_FN(ZOR_ALL, Status, zoriDFTInv_PackToR_32f_C1R,
+       (const float* pSrc, int srcStep, float* pDst, int dstStep, const void* pSpec, uint8_t* pBuffer))

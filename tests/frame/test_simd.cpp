@@ -103,4 +103,29 @@ TEST(SimdLanes, FloatReductionOrderAndSelect) {
     EXPECT_EQ(got[3], 2.0f);
 }
 
+// Lane order over the whole register: the even/odd split of a run of two
+// registers, its inverse, and the transpose of a square of registers.
+TEST(SimdLanes, DeinterleaveInterleaveAndTransposeKeepLaneOrder) {
+    using V = Vec<float>;
+    constexpr int n = V::kLanes;
+    float run[2 * n], sq[n * n], even[n], odd[n];
+    for (int i = 0; i < n * n; ++i) sq[i] = float(i);
+    std::memcpy(run, sq, sizeof run);
+    V e, o, lo, hi, rows[n];
+    deinterleave(load<V>(run), load<V>(run + n), e, o);
+    store(even, e);
+    store(odd, o);
+    for (int i = 0; i < n; ++i) EXPECT_TRUE(even[i] == run[2 * i] && odd[i] == run[2 * i + 1]) << i;
+    interleave(e, o, lo, hi);
+    store(run, lo);
+    store(run + n, hi);
+    for (int i = 0; i < 2 * n; ++i) EXPECT_EQ(run[i], float(i));
+    for (int i = 0; i < n; ++i) rows[i] = load<V>(sq + i * n);
+    transpose(rows);
+    for (int i = 0; i < n; ++i) {
+        store(even, rows[i]);
+        for (int j = 0; j < n; ++j) EXPECT_EQ(even[j], sq[j * n + i]) << i << " " << j;
+    }
+}
+
 }  // namespace
