@@ -63,34 +63,41 @@ Status withAlphaType(int alphaType, F f) {
 // ---- 8-bit arithmetic -----------------------------------------------------------------
 #if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
-Status ZOR_CALL zoriAdd_8u_C1RSfs(const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step,
-                                  uint8_t* pDst, int dstStep, ImageSize roiSize, int scaleFactor) {
+namespace {
+// The two-source scaled forms: `unscaled` on bytes for a scale factor of 0,
+// else `exact` (the integer result in 16-bit lanes) scaled.
+template <class Unscaled, class Exact>
+Status scaledPair(const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst,
+                  int dstStep, ImageSize roiSize, int scaleFactor, Unscaled unscaled, Exact exact) {
     if (Status s = checkImages(pSrc1, src1Step, pSrc2, src2Step, pDst, dstStep, roiSize)) return s;
     const Plane s1{pSrc1, src1Step}, s2{pSrc2, src2Step};
     const Plane d{pDst, dstStep};
-    if (scaleFactor == 0) mapImage(roiSize, [](auto a, auto b) { return simd::addSat(a, b); }, s1, s2, d);
-    else mapScaled(roiSize, scaleFactor, [](auto a, auto b) { return a + b; }, s1, s2, d);
+    if (scaleFactor == 0) mapImage(roiSize, unscaled, s1, s2, d);
+    else mapScaled(roiSize, scaleFactor, exact, s1, s2, d);
     return StatusOk;
+}
+}  // namespace
+
+Status ZOR_CALL zoriAdd_8u_C1RSfs(const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step,
+                                  uint8_t* pDst, int dstStep, ImageSize roiSize, int scaleFactor) {
+    return scaledPair(pSrc1, src1Step, pSrc2, src2Step, pDst, dstStep, roiSize, scaleFactor,
+                      [](auto a, auto b) { return simd::addSat(a, b); }, [](auto a, auto b) { return a + b; });
 }
 
 // src2 - src1: negative differences scale to 0 or below and saturate to 0,
 // so the difference is taken with a floor of 0 first.
 Status ZOR_CALL zoriSub_8u_C1RSfs(const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step,
                                   uint8_t* pDst, int dstStep, ImageSize roiSize, int scaleFactor) {
-    if (Status s = checkImages(pSrc1, src1Step, pSrc2, src2Step, pDst, dstStep, roiSize)) return s;
-    const Plane s1{pSrc1, src1Step}, s2{pSrc2, src2Step};
-    const Plane d{pDst, dstStep};
-    if (scaleFactor == 0) mapImage(roiSize, [](auto a, auto b) { return simd::subSat(b, a); }, s1, s2, d);
-    else mapScaled(roiSize, scaleFactor, [](auto a, auto b) { return b - simd::min(a, b); }, s1, s2, d);
-    return StatusOk;
+    return scaledPair(pSrc1, src1Step, pSrc2, src2Step, pDst, dstStep, roiSize, scaleFactor,
+                      [](auto a, auto b) { return simd::subSat(b, a); },
+                      [](auto a, auto b) { return b - simd::min(a, b); });
 }
 
 Status ZOR_CALL zoriMul_8u_C1RSfs(const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step,
                                   uint8_t* pDst, int dstStep, ImageSize roiSize, int scaleFactor) {
-    if (Status s = checkImages(pSrc1, src1Step, pSrc2, src2Step, pDst, dstStep, roiSize)) return s;
-    mapScaled(roiSize, scaleFactor, [](auto a, auto b) { return a * b; }, Plane{pSrc1, src1Step},
-              Plane{pSrc2, src2Step}, Plane{pDst, dstStep});
-    return StatusOk;
+    const auto product = [](auto a, auto b) { return a * b; };
+    return scaledPair(pSrc1, src1Step, pSrc2, src2Step, pDst, dstStep, roiSize, scaleFactor, inWords(product),
+                      product);
 }
 
 // A constant of 0 or a scale above 16 leaves nothing but 0 (the source is not

@@ -83,10 +83,9 @@ inline auto roundShift(int sf) {
     };
 }
 
-// r 2^s, s >= 1, capped at 256 (saturated to 255 later); counts beyond 8
-// saturate every non-zero r just as 8 does.
+// r 2^s for 1 <= s <= 8, capped at 256 (saturated to 255 later); larger
+// counts saturate every non-zero r just as 8 does.
 inline auto shiftUp(int s) {
-    s = s > 8 ? 8 : s;
     const int cap = 1 << (8 - s);
     return [=](auto r) {
         using V = decltype(r);
@@ -153,7 +152,8 @@ void composeRowAC4Scalar(const uint8_t* s1, const uint8_t* s2, uint8_t* d, ptrdi
 // U = cA pq + cB qq, V1 = cA pr, V2 = cB qr, and since nested floors of
 // quotients compose,
 //   (n + 32512) / 65025 = (U + 127 + (V1 + V2 + 127) / 255) / 255.
-// Below AlphaPlus n <= 255^3, so U and the last dividend stay below 65280.
+// For every type but AlphaPlus n <= 255^3, so U and the last dividend stay
+// below 65280.
 // AlphaPlus: P = 255 a, Q = 255 b, and the result is (cA a + cB b + 127) / 255.
 using Words = simd::Vec<uint16_t>;
 
@@ -231,7 +231,7 @@ inline PerPixel spread(Words v) {
 }
 #endif
 
-// One row of n RGBA pixels.
+// One row of RGBA pixels.
 template <int Type>
 void composeRowAC4(const uint8_t* s1, const uint8_t* s2, uint8_t* d, ptrdiff_t pixels) {
     ptrdiff_t i = 0;
@@ -257,7 +257,7 @@ void composeRowAC4(const uint8_t* s1, const uint8_t* s2, uint8_t* d, ptrdiff_t p
     composeRowAC4Scalar<Type>(s1 + 4 * i, s2 + 4 * i, d + 4 * i, pixels - i);
 }
 
-// One row of n one-channel pixels with the constant alphas a, b.
+// One row of n one-channel pixels with the constant alphas a, b (colour only).
 template <int Type>
 void composeRowC1(const uint8_t* s1, const uint8_t* s2, uint8_t* d, ptrdiff_t n, int a, int b) {
     ptrdiff_t i = 0;
