@@ -443,7 +443,8 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
  * Checks, in this order: null pointers (StatusNullPointer), ROI width or
  * height below 1 (StatusBadSize), any step below 1 (StatusBadStep), then the
  * function's own argument (StatusBadArgument); on failure nothing is written.
- * The destination may be one of the sources (same pointer and step).
+ * The destination may be one of the sources (same pointer and step), except
+ * for DeinterlaceFilterTriangle, whose destination must not overlap its source.
  *
  * Add, Sub, Mul _8u_C1RSfs: the exact integer r = src1 + src2, src2 - src1
  *   (the second operand minus the first), src1 * src2 is scaled by
