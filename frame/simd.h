@@ -105,6 +105,19 @@ template <int N, class T>
 constexpr T shl(T a) { return T(static_cast<std::make_unsigned_t<T>>(a) << N); }
 template <int N, class T>
 constexpr T shr(T a) { return T(a >> N); }
+// Shifts by a run-time count below the lane's bit width.
+template <class T, std::enable_if_t<std::is_integral_v<T>, int> = 0>
+constexpr T shl(T a, int n) { return T(static_cast<std::make_unsigned_t<T>>(a) << n); }
+template <class T, std::enable_if_t<std::is_integral_v<T>, int> = 0>
+constexpr T shr(T a, int n) { return T(a >> n); }
+// set1<T>(x) of a plain lane is x: set1<decltype(v)>(k) makes a constant
+// for either form of a generic lambda's operand.
+template <class T, std::enable_if_t<std::is_arithmetic_v<T>, int> = 0>
+constexpr T set1(T x) { return x; }
+// A comparison's outcome as lane values: all ones where it holds, else 0
+// (a register's mask already is that).  asLanes<decltype(a)>(lt(a, b)).
+template <class T, std::enable_if_t<std::is_integral_v<T>, int> = 0>
+constexpr T asLanes(bool holds) { return holds ? T(~T(0)) : T(0); }
 
 // A plain lane stands for a register of one lane, so that a kernel written
 // over a register type V serves the generic variant with V = float:
@@ -278,6 +291,9 @@ struct Isa<16> {
         else _mm_stream_si128(reinterpret_cast<__m128i*>(p), v);
 #  endif
     }
+
+    // Asks for the cache line holding p (no fault for any address).
+    static void prefetch(const void* p) { _mm_prefetch(static_cast<const char*>(p), _MM_HINT_T0); }
 
     // -- bitwise (any lane type)
     template <class T>
@@ -664,7 +680,8 @@ struct Isa<16> {
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
-        if constexpr (std::is_same_v<R<To>, R<From>>) return a;
+        // (same register type; comparing the raw types would drop their vector attributes)
+        if constexpr (std::is_same_v<To, From> || (isInt<To> && isInt<From>)) return a;
 #  if ZOR_SIMD >= 2
         else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);
         else if constexpr (isD<To> && isF<From>) return _mm_castps_pd(a);
@@ -735,6 +752,10 @@ inline void storeHalf(T* p, Vec<T, B> v) { Isa<B>::template storeHalf<T>(p, v.ra
 // Non-temporal store to memory aligned to the register width.
 template <class T, int B>
 inline void stream(T* p, Vec<T, B> v) { Isa<B>::template stream<T>(p, v.raw); }
+
+// Brings the cache line holding p closer; p may lie beyond the data.
+template <class V>
+inline void prefetch(const void* p) { Isa<V::kBytes>::prefetch(p); }
 
 // Loads from (and stores to) memory of any lane type: for moving bytes.
 template <class V, class U>
@@ -816,6 +837,8 @@ template <class T, int B>
 inline int laneMask(Vec<T, B> a) { return Isa<B>::template laneMask<T>(a.raw); }
 template <class T, int B>
 inline bool anyTrue(Vec<T, B> mask) { return laneMask(mask) != 0; }
+template <class V, std::enable_if_t<!std::is_arithmetic_v<V>, int> = 0>
+inline V asLanes(V mask) { return mask; }
 
 template <int N, class T, int B>
 inline Vec<T, B> shl(Vec<T, B> a) { return {Isa<B>::template shl<T, N>(a.raw)}; }
@@ -982,27 +1005,31 @@ inline T reduceMax(Vec<T, B> v) {
 }
 
 // ---- loops --------------------------------------------------------------------
-// d[i] = op(s[i]) for i < n: whole registers while they fit (two at a time),
-// then one element at a time.  op is called with Vec<S> and with S (a generic
-// lambda over the names above serves both) and gives Vec<D> / D; D and S
-// must have the same size.  Reads every source element before the store of
-// its register, so d == s works.
+// d[i] = op(s[i]) for i < n: a cache line of registers at a time while they
+// fit, then single registers, then one element at a time.  op is called with
+// Vec<S> and with S (a generic lambda over the names above serves both) and
+// gives Vec<D> / D; D and S must have the same size.  Reads every source
+// element before the store of its register, so d == s works.
+//
+// The sources are requested kPrefetchBytes ahead: with two or three streams
+// at once the processor's own prefetching falls behind (an 8-bit sum of two
+// 1920 x 1080 images from L3 runs about a fifth faster).
+constexpr ptrdiff_t kPrefetchBytes = 1024;
+
 template <class D, class S, class Op>
 inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
     if constexpr (kHas<S> && kHas<D>) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
         using V = Vec<S>;
-        constexpr int L = V::kLanes;
-        for (; i + 2 * L <= n; i += 2 * L) {
-            const V a = load<V>(s + i), b = load<V>(s + i + L);
-            store(d + i, op(a));
-            store(d + i + L, op(b));
+        constexpr int L = V::kLanes, R = V::kBytes >= 64 ? 1 : 64 / V::kBytes;  // registers a line
+        for (; i + R * L <= n; i += R * L) {
+            prefetch<V>(s + i + kPrefetchBytes / ptrdiff_t(sizeof(S)));
+            V x[R];
+            for (int k = 0; k < R; ++k) x[k] = load<V>(s + i + k * L);
+            for (int k = 0; k < R; ++k) store(d + i + k * L, op(x[k]));
         }
-        if (i + L <= n) {
-            store(d + i, op(load<V>(s + i)));
-            i += L;
-        }
+        for (; i + L <= n; i += L) store(d + i, op(load<V>(s + i)));
     }
     for (; i < n; ++i) d[i] = op(s[i]);
 }
@@ -1013,17 +1040,15 @@ inline void mapLanes(const S* a, const S* b, D* d, ptrdiff_t n, Op op) {
     if constexpr (kHas<S> && kHas<D>) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
         using V = Vec<S>;
-        constexpr int L = V::kLanes;
-        for (; i + 2 * L <= n; i += 2 * L) {
-            const V a0 = load<V>(a + i), b0 = load<V>(b + i);
-            const V a1 = load<V>(a + i + L), b1 = load<V>(b + i + L);
-            store(d + i, op(a0, b0));
-            store(d + i + L, op(a1, b1));
+        constexpr int L = V::kLanes, R = V::kBytes >= 64 ? 1 : 64 / V::kBytes;
+        for (; i + R * L <= n; i += R * L) {
+            prefetch<V>(a + i + kPrefetchBytes / ptrdiff_t(sizeof(S)));
+            prefetch<V>(b + i + kPrefetchBytes / ptrdiff_t(sizeof(S)));
+            V x[R], y[R];
+            for (int k = 0; k < R; ++k) x[k] = load<V>(a + i + k * L), y[k] = load<V>(b + i + k * L);
+            for (int k = 0; k < R; ++k) store(d + i + k * L, op(x[k], y[k]));
         }
-        if (i + L <= n) {
-            store(d + i, op(load<V>(a + i), load<V>(b + i)));
-            i += L;
-        }
+        for (; i + L <= n; i += L) store(d + i, op(load<V>(a + i), load<V>(b + i)));
     }
     for (; i < n; ++i) d[i] = op(a[i], b[i]);
 }

@@ -142,11 +142,26 @@ enum {
     RoundNear = 1
 };
 
-/* Relation codes of zorsThreshold_32f_I: CmpGreater clips from above, any
-   other value from below. */
+/* Relation codes.  zorsThreshold_32f_I: CmpGreater clips from above, any
+   other value from below.  zoriThreshold_8u_C1R takes CmpLess and CmpGreater;
+   zoriCompare_8u_C1R and zoriCompareC_8u_C1R take all five. */
 enum {
-    CmpLess    = 0,
-    CmpGreater = 4
+    CmpLess      = 0,
+    CmpLessEq    = 1,
+    CmpEq        = 2,
+    CmpGreaterEq = 3,
+    CmpGreater   = 4
+};
+
+/* Porter-Duff operations of zoriAlphaComp_8u_AC4R and zoriAlphaCompC_8u_C1R
+   (image A is the first source, B the second). */
+enum {
+    AlphaOver = 0,  /* A over B */
+    AlphaIn   = 1,  /* A inside B */
+    AlphaOut  = 2,  /* A outside B */
+    AlphaATop = 3,  /* A atop B */
+    AlphaXor  = 4,  /* A xor B */
+    AlphaPlus = 5   /* A plus B, saturated */
 };
 
 /* ---- Exported functions -------------------------------------------- */

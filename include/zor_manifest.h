@@ -437,7 +437,111 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
 
 /* ---- image/filter/smoothing ---- */
 
-/* ---- image/pixel/arith ---- */
+/* ---- image/pixel/arith ----
+ * Pixel arithmetic, logic, threshold, compare, alpha composition and
+ * deinterlacing on one-channel images (four-channel for AlphaComp).
+ * Checks, in this order: null pointers (StatusNullPointer), ROI width or
+ * height below 1 (StatusBadSize), any step below 1 (StatusBadStep), then the
+ * function's own argument (StatusBadArgument); on failure nothing is written.
+ * The destination may be one of the sources (same pointer and step), except
+ * for DeinterlaceFilterTriangle, whose destination must not overlap its source.
+ *
+ * Add, Sub, Mul _8u_C1RSfs: the exact integer r = src1 + src2, src2 - src1
+ *   (the second operand minus the first), src1 * src2 is scaled by
+ *   2^-scaleFactor and saturated to 0..255: scaleFactor > 0 rounds to
+ *   nearest with ties to even (5 * 1 with scale 1 gives 2, 7 * 1 gives 4),
+ *   scaleFactor < 0 shifts left.  Any scaleFactor is accepted.
+ * MulC_8u_C1RSfs: r = src * value, scaled likewise.  A value of 0 or a scale
+ *   factor above 16 sets the ROI to 0 without reading the source; a scale
+ *   factor below -7 gives 255 for every non-zero product and 0 for zero.
+ * AbsDiff_8u_C1R: |src1 - src2|.
+ * Add, Sub, Mul _32f_C1R: src1 + src2, src2 - src1, src1 * src2 in float
+ *   (IEEE single, rounded to nearest).  Where both operands are NaN, which
+ *   of them comes out (quieted) is the processor's choice.
+ * And, Or, Xor _8u_C1R: bitwise on two sources; Not_8u_C1R: ~src.
+ * Threshold_8u_C1R: relOp CmpLess raises values below threshold to it,
+ *   CmpGreater lowers values above it; any other relOp: StatusBadArgument.
+ * Threshold_LTValGTVal_8u_C1R: v < thresholdLT gives valueLT, v >
+ *   thresholdGT gives valueGT, other values stay; thresholdLT > thresholdGT:
+ *   StatusBadArgument.
+ * Compare_8u_C1R: 255 where src1 op src2 holds, else 0; CompareC_8u_C1R the
+ *   same with src op value.  cmpOp: CmpLess <, CmpLessEq <=, CmpEq ==,
+ *   CmpGreaterEq >=, CmpGreater >; any other: StatusBadArgument.
+ * AlphaComp_8u_AC4R: Porter-Duff on non-premultiplied RGBA (alpha the fourth
+ *   byte), A = src1, B = src2, aA = a1 / 255, aB = a2 / 255:
+ *     colour = cA aA FA + cB aB FB,  alpha = aA FA + aB FB,
+ *   colours and 255 * alpha rounded half up (exactly: with a1, a2 and the
+ *   factors scaled by 255, (n + 32512) / 65025 in integers) and written to
+ *   all four destination bytes.  alphaType (FA, FB): AlphaOver (1, 1 - aA),
+ *   AlphaIn (aB, 0), AlphaOut (1 - aB, 0), AlphaATop (aB, 1 - aA), AlphaXor
+ *   (1 - aB, 1 - aA), AlphaPlus (1, 1, results saturated at 255); any other:
+ *   StatusBadArgument.
+ * AlphaCompC_8u_C1R: the same colour rule with the constant alphas alpha1,
+ *   alpha2 for every pixel.
+ * DeinterlaceFilterTriangle_8u_C1R: with c = centerWeight, a, m, b the pixels
+ *   above, at and below (x, y), rows outside the ROI replaced by the nearest
+ *   edge row (only ROI rows are read):
+ *     dst = (a (256 - c) / 2 + m c + b (256 - c) / 2 + 128) >> 8
+ *   with the outer weights taken exactly (a half for odd c), i.e.
+ *     dst = ((a + b) (256 - c) + 2 m c + 256) >> 9.
+ *   centerWeight > 256 or layout other than 0 (whole frame):
+ *   StatusBadArgument. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriAdd_8u_C1RSfs,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize, int scaleFactor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSub_8u_C1RSfs,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize, int scaleFactor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMul_8u_C1RSfs,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize, int scaleFactor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMulC_8u_C1RSfs,
+       (const uint8_t* pSrc, int srcStep, uint8_t value, uint8_t* pDst, int dstStep, ImageSize roiSize,
+        int scaleFactor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriAbsDiff_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriAdd_32f_C1R,
+       (const float* pSrc1, int src1Step, const float* pSrc2, int src2Step, float* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriSub_32f_C1R,
+       (const float* pSrc1, int src1Step, const float* pSrc2, int src2Step, float* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriMul_32f_C1R,
+       (const float* pSrc1, int src1Step, const float* pSrc2, int src2Step, float* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriAnd_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriOr_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriXor_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriNot_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriThreshold_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, uint8_t threshold,
+        int relOp))
+ZOR_FN(ZOR_SSE2UP, Status, zoriThreshold_LTValGTVal_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, uint8_t thresholdLT,
+        uint8_t valueLT, uint8_t thresholdGT, uint8_t valueGT))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCompare_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize, int cmpOp))
+ZOR_FN(ZOR_SSE2UP, Status, zoriCompareC_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t value, uint8_t* pDst, int dstStep, ImageSize roiSize,
+        int cmpOp))
+ZOR_FN(ZOR_SSE2UP, Status, zoriAlphaComp_8u_AC4R,
+       (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, uint8_t* pDst, int dstStep,
+        ImageSize roiSize, int alphaType))
+ZOR_FN(ZOR_SSE2UP, Status, zoriAlphaCompC_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, uint8_t alpha1, const uint8_t* pSrc2, int src2Step, uint8_t alpha2,
+        uint8_t* pDst, int dstStep, ImageSize roiSize, int alphaType))
+ZOR_FN(ZOR_SSE2UP, Status, zoriDeinterlaceFilterTriangle_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, uint32_t centerWeight,
+        uint32_t layout))
 
 /* ---- image/color/color ---- */
 

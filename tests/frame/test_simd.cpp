@@ -27,7 +27,7 @@ std::vector<T> randomLanes(std::mt19937& rng, int n) {
 template <class T, class Op>
 void agreesLaneByLane(Op op, const char* what) {
     std::mt19937 rng(7);
-    const int n = 3 * Vec<T>::kLanes + 1;
+    const int n = 9 * Vec<T>::kLanes + 1;  // two cache lines of registers, one more register, a tail
     for (int round = 0; round < 50; ++round) {
         const auto a = randomLanes<T>(rng, n), b = randomLanes<T>(rng, n);
         std::vector<T> got(n);
@@ -46,6 +46,12 @@ void integerOps() {
     agreesLaneByLane<T>([](auto a, auto b) { return select(le(a, b), a, b); }, "le");
     agreesLaneByLane<T>([](auto a, auto) { return shr<3>(a); }, "shr");
     agreesLaneByLane<T>([](auto a, auto) { return shl<5>(a); }, "shl");
+    agreesLaneByLane<T>([](auto a, auto b) { return asLanes<decltype(a)>(lt(a, b)); }, "asLanes");
+    agreesLaneByLane<T>([](auto a, auto) { return a | set1<decltype(a)>(T(0x41)); }, "set1");
+    if constexpr (sizeof(T) >= 2) {
+        agreesLaneByLane<T>([](auto a, auto) { return shr(a, 5); }, "shr by count");
+        agreesLaneByLane<T>([](auto a, auto) { return shl(a, 3); }, "shl by count");
+    }
     if constexpr (sizeof(T) <= 2) {
         agreesLaneByLane<T>([](auto a, auto b) { return addSat(a, b); }, "addSat");
         agreesLaneByLane<T>([](auto a, auto b) { return subSat(a, b); }, "subSat");
