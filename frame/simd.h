@@ -121,15 +121,13 @@ constexpr T asLanes(bool holds) { return holds ? T(~T(0)) : T(0); }
 
 // A plain lane stands for a register of one lane, so that a kernel written
 // over a register type V serves the generic variant with V = float:
-// load<float>(p), store(p, x), set1<float>(x), zero<float>(), lanesOf<V>,
+// load<float>(p), store(p, x), set1<float>(x) (above), zero<float>(), lanesOf<V>,
 // and the lane-order shuffles further down (deinterleave, interleave,
 // transpose), which are identities on one lane.
 template <class V>
 inline std::enable_if_t<std::is_arithmetic_v<V>, V> load(const V* p) { return *p; }
 template <class T>
 inline std::enable_if_t<std::is_arithmetic_v<T>> store(T* p, T v) { *p = v; }
-template <class V>
-inline std::enable_if_t<std::is_arithmetic_v<V>, V> set1(V x) { return x; }
 template <class V>
 inline std::enable_if_t<std::is_arithmetic_v<V>, V> zero() { return V(0); }
 template <class T>
