@@ -448,7 +448,9 @@ ZOR_FN(ZOR_ALL, Status, zormQRBackSubst_mv_64f_3x3, (const double* pSrc, int src
  *              region grows from, not with the seed.  No early return when
  *              the seed holds newVal (other pixels may change).
  * The record: area = pixels filled, value = {newVal, 0, 0} (gradient forms
- * too), rect = their bounding box. */
+ * too), rect = their bounding box.  A buffer of the size given suffices for
+ * every picture; only 4Con on a ROI of more than 3 * 2^30 pixels (whose
+ * size no int can give) may stop with StatusNoMemory, partly filled. */
 ZOR_FN(ZOR_GENERIC, Status, zoriFloodFillGetSize,      (ImageSize roiSize, int* pSize))
 ZOR_FN(ZOR_GENERIC, Status, zoriFloodFillGetSize_Grad, (ImageSize roiSize, int* pSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriFloodFill_4Con_8u_C1IR,

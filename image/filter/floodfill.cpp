@@ -337,12 +337,36 @@ private:
 
     // n joins from c.
     bool inWindow(int c, int n) const { return unsigned(n + minDelta_ - c) <= width_; }
+#if ZOR_SIMD >= 2
+    // Lane i set when to[i] is unvisited and joins from from[i]: the window
+    // [c - minDelta, c + maxDelta] with its ends saturated to the byte range.
+    uint32_t joinLanes(const uint8_t* from, const uint8_t* to, const uint8_t* visited) const {
+        const Bytes c = simd::load<Bytes>(from), n = simd::load<Bytes>(to);
+        const Bytes in = simd::eq(simd::max(n, simd::subSat(c, minDeltas_)), n) &
+                         simd::eq(simd::min(n, simd::addSat(c, maxDeltas_)), n);
+        return uint32_t(simd::laneMask(in & simd::eq(simd::load<Bytes>(visited), simd::zero<Bytes>())));
+    }
+#endif
 
-    // Extends the visited pixel (x, y) to its run: [left, right].
+    // Extends the visited pixel (x, y) to its run: [left, right], a register
+    // of pixels at a time while the run goes through them.
     void growRun(int y, int x, int& left, int& right) const {
         const uint8_t* row = rowAt(image_, step_, y);
         uint8_t* m = mapRow(y);
         left = right = x;
+#if ZOR_SIMD >= 2
+        constexpr int L = Bytes::kLanes;
+        for (int n = L; n == L && right + 1 + L <= roi_.width; right += n) {  // lane i: right + 1 + i
+            const uint32_t joins = joinLanes(row + right, row + right + 1, m + right + 1);
+            n = joins == kAllLanes ? L : __builtin_ctz(~joins);
+            std::memset(m + right + 1, kVisited, size_t(n));
+        }
+        for (int n = L; n == L && left - L >= 0; left -= n) {  // lane i: left - L + i
+            const uint32_t joins = joinLanes(row + left - L + 1, row + left - L, m + left - L);
+            n = joins == kAllLanes ? L : L - 1 - (31 - __builtin_clz(~joins & kAllLanes));
+            std::memset(m + left - n, kVisited, size_t(n));
+        }
+#endif
         while (!m[left - 1] && inWindow(row[left], row[left - 1])) m[--left] = kVisited;
         while (!m[right + 1] && inWindow(row[right], row[right + 1])) m[++right] = kVisited;
     }
@@ -417,6 +441,9 @@ private:
     uint8_t new_;
     int minDelta_;
     unsigned width_;  // minDelta + maxDelta
+#if ZOR_SIMD >= 2
+    Bytes minDeltas_ = simd::set1<Bytes>(uint8_t(minDelta_)), maxDeltas_ = simd::set1<Bytes>(uint8_t(width_ - minDelta_));
+#endif
     size_t mapStride_;
     uint8_t* map_;
     Span* stack_;
