@@ -164,6 +164,13 @@ enum {
     AlphaPlus = 5   /* A plus B, saturated */
 };
 
+/* Flood fill: the region filled (zoriFloodFill_*). */
+typedef struct ConnectedComp {
+    double    area;      /* number of pixels filled */
+    double    value[3];  /* newVal, 0, 0 */
+    ImageRect rect;      /* bounding box of the filled pixels */
+} ConnectedComp;
+
 /* ---- Exported functions -------------------------------------------- */
 
 #define ZOR_FN(map, ret, name, params) ZOR_API ret ZOR_CALL name params;

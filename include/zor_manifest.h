@@ -417,11 +417,74 @@ ZOR_FN(ZOR_GENERIC, Status, zorsSignChangeRate_16s, (const int16_t* pSrc, int le
 ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
        (const int16_t* pSrc, int len, int lowerLag, int upperLag, int32_t* pMax, int* pMaxLag))
 
-/* ---- frame/adapters ---- */
+/* ---- frame/adapters ----
+ * Fixed-size forms kept for older callers.  Each variant's adapter calls the
+ * same variant's general function directly and returns its status unchanged
+ * (it checks nothing itself):
+ *   Sobel3x3_Dx_*  = FilterSobelVert_8u16s / FilterSobelVertMask_32f, mask 33
+ *   Sobel3x3_Dy_*  = FilterSobelHoriz_8u16s / FilterSobelHorizMask_32f, mask 33;
+ *                    `reserved` is accepted and ignored (older callers pass it)
+ *   QR*_3x3        = the general QR functions on 3 x 3 matrices of densely
+ *                    packed doubles (element stride 8); only the row stride of
+ *                    the matrix comes from the caller. */
+ZOR_FN(ZOR_ALL, Status, zoriSobel3x3_Dx_8u16s_C1R, (const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriSobel3x3_Dy_8u16s_C1R, (const uint8_t* pSrc, int srcStep, int16_t* pDst, int dstStep, int reserved, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriSobel3x3_Dx_32f_C1R,   (const float* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zoriSobel3x3_Dy_32f_C1R,   (const float* pSrc, int srcStep, float* pDst, int dstStep, int reserved, ImageSize roiSize))
+ZOR_FN(ZOR_ALL, Status, zormQRDecomp_m_64f_3x3,     (const double* pSrc, int srcStride1, double* pBuffer, double* pDst, int dstStride1))
+ZOR_FN(ZOR_ALL, Status, zormQRBackSubst_mv_64f_3x3, (const double* pSrc, int srcStride1, double* pBuffer, const double* pSrc2, double* pDst))
 
-/* ---- image/filter/floodfill ---- */
+/* ---- image/filter/floodfill ----
+ * In-place fills from a seed, in the caller's buffer (GetSize bytes; no
+ * memory is allocated).  Checks: pointers, sizes, imageStep < width
+ * (StatusBadStep), seed outside the ROI (StatusOutOfRange).
+ *   4Con:      the 4-connected region of pixels equal to the seed's value.
+ *              A seed already holding newVal: StatusOk, nothing written
+ *              (the record neither).
+ *   Grad4Con, Grad8Con: the region grown from the seed through 4 (8)
+ *              neighbours: a neighbour of value n joins from a region pixel
+ *              of value c when c - minDelta <= n <= c + maxDelta, with the
+ *              values before the fill.  The window moves with the pixel the
+ *              region grows from, not with the seed.  No early return when
+ *              the seed holds newVal (other pixels may change).
+ * The record: area = pixels filled, value = {newVal, 0, 0} (gradient forms
+ * too), rect = their bounding box.  A buffer of the size given suffices for
+ * every picture; only 4Con on a ROI of more than 3 * 2^30 pixels (whose
+ * size no int can give) may stop with StatusNoMemory, partly filled. */
+ZOR_FN(ZOR_GENERIC, Status, zoriFloodFillGetSize,      (ImageSize roiSize, int* pSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriFloodFillGetSize_Grad, (ImageSize roiSize, int* pSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFloodFill_4Con_8u_C1IR,
+       (uint8_t* pImage, int imageStep, ImageSize roiSize, ImagePoint seed, uint8_t newVal,
+        ConnectedComp* pRegion, uint8_t* pBuffer))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFloodFill_Grad4Con_8u_C1IR,
+       (uint8_t* pImage, int imageStep, ImageSize roiSize, ImagePoint seed, uint8_t newVal,
+        uint8_t minDelta, uint8_t maxDelta, ConnectedComp* pRegion, uint8_t* pBuffer))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFloodFill_Grad8Con_8u_C1IR,
+       (uint8_t* pImage, int imageStep, ImageSize roiSize, ImagePoint seed, uint8_t newVal,
+        uint8_t minDelta, uint8_t maxDelta, ConnectedComp* pRegion, uint8_t* pBuffer))
 
-/* ---- matrix/qr ---- */
+/* ---- matrix/qr ----
+ * Matrices: element (i, j) at base + i * stride1 + j * stride2 bytes; vectors
+ * base + i * stride2.  Strides below 1 or not a multiple of the element size:
+ * StatusBadStride; width > height: StatusBadMatrixShape.
+ * QRDecomp: Householder QR; R in and above the diagonal, below it the
+ *   reflection vectors (leading 1 implied).  A column whose remaining norm
+ *   is below the double epsilon stops the work with StatusDivideByZero, the
+ *   destination partly transformed.  A zero diagonal element, +0 or -0,
+ *   reflects like a negative one.  pBuffer: height doubles of scratch.
+ * QRBackSubst: least-squares x (width elements) of A x = b from the
+ *   decomposition; pBuffer: height doubles of scratch.  No test for a zero
+ *   diagonal.
+ * Sums run in index order in every variant, so every variant gives the
+ * same bits. */
+ZOR_FN(ZOR_ALL, Status, zormQRDecomp_m_64f,
+       (const double* pSrc, int srcStride1, int srcStride2, double* pBuffer, double* pDst,
+        int dstStride1, int dstStride2, int width, int height))
+ZOR_FN(ZOR_ALL, Status, zormQRBackSubst_mv_64f,
+       (const double* pSrc, int srcStride1, int srcStride2, double* pBuffer, const double* pSrc2,
+        int src2Stride2, double* pDst, int dstStride2, int width, int height))
+ZOR_FN(ZOR_ALL, Status, zormMul_vc_32f,
+       (const float* pSrc, int srcStride2, float val, float* pDst, int dstStride2, int len))
 
 /* ---- image/stats/reductions ---- */
 
