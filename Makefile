@@ -28,8 +28,10 @@ asan: setup build-asan/CMakeCache.txt
 win: setup build-win/CMakeCache.txt
 	$(CMAKE) --build build-win -j $(JOBS)
 
+# The gallery: every family on the bundled photograph and speech clip,
+# written to build/gallery/ (open index.html).
 demo: native
-	./build/zor_demo
+	./build/tools/zor demo --out build/gallery
 
 test-native: native
 	cd build && ctest --output-on-failure

@@ -3,8 +3,10 @@
 # Idempotent: when every package is already present it only checks and exits.
 set -euo pipefail
 
+# libpng-dev: the zor tool's PNG files; pkgconf: the package tests;
+# chromium: the test that renders the demo gallery.
 native_pkgs=(cmake make g++ ccache libgtest-dev googletest libbenchmark-dev
-             libopencv-dev libfftw3-dev)
+             libopencv-dev libfftw3-dev libpng-dev pkgconf chromium)
 cross_pkgs=(g++-mingw-w64-i686)
 wine_pkgs=(wine wine32:i386)
 
