@@ -100,8 +100,9 @@ int cmdBench(const Args& args) {
     const std::string binary = o.get("binary", std::getenv("ZOR_BENCH") ? std::getenv("ZOR_BENCH") : ZOR_BENCH_BINARY);
     struct stat st;
     if (stat(binary.c_str(), &st) != 0)
-        throw UserError(binary + ": no benchmark program there (it is built with the native tree when Google "
-                                 "Benchmark, OpenCV and FFTW are installed: make native), or give --binary PATH");
+        throw UserError(binary +
+                        ": no benchmark program there (it is built with the native tree when Google "
+                        "Benchmark, OpenCV and FFTW are installed: make native), or give --binary PATH");
     const int reps = static_cast<int>(o.number("repetitions", 3));
     if (reps < 1 || reps > 100) throw UserError("--repetitions must be from 1 to 100");
 
@@ -184,8 +185,7 @@ int cmdBench(const Args& args) {
         const std::string kind = name.substr(slash + 1);
         if (kind != "zor" && kind != "peer") return;
         ++done;
-        if (tty)
-            std::fprintf(stderr, "\r[%zu/%zu] %-80.80s", std::min(done, total), total, name.c_str());
+        if (tty) std::fprintf(stderr, "\r[%zu/%zu] %-80.80s", std::min(done, total), total, name.c_str());
     });
     if (rc != 0) throw UserError(binary + " failed (exit status " + std::to_string(rc) + ")");
     for (const std::string& e : errors) std::fprintf(stderr, "%s\n", e.c_str());

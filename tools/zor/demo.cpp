@@ -72,10 +72,14 @@ namespace {
 std::string html(const std::string& s) {
     std::string o;
     for (char c : s) {
-        if (c == '<') o += "&lt;";
-        else if (c == '>') o += "&gt;";
-        else if (c == '&') o += "&amp;";
-        else o += c;
+        if (c == '<')
+            o += "&lt;";
+        else if (c == '>')
+            o += "&gt;";
+        else if (c == '&')
+            o += "&amp;";
+        else
+            o += c;
     }
     return o;
 }
@@ -89,8 +93,8 @@ std::string fmt(const char* f, double v) {
 // ---- the steps of the families that are in the library ----------------------
 
 ZT_DEMO_STEP(0, "input", "The inputs",
-             "The photograph every image step starts from (its grey version where a step needs one channel).",
-             "", [](Gallery& g) {
+             "The photograph every image step starts from (its grey version where a step needs one channel).", "",
+             [](Gallery& g) {
                  g.save("input", g.photo(), "Chelsea the cat, 451 x 300, CC0");
                  g.save("input-grey", g.grey(), "grey, weights 0.299, 0.587, 0.114");
              });
@@ -128,7 +132,7 @@ ZT_DEMO_STEP(21, "canny", "Canny edges",
                      differ += a != b;
                      uint8_t* p = &diff.px[3 * i];
                      p[0] = b ? 255 : 0;  // white: both; red: only the naive chain
-                     p[1] = a ? 255 : 0;                 // cyan: only the right chain
+                     p[1] = a ? 255 : 0;  // cyan: only the right chain
                      p[2] = a ? 255 : 0;
                  }
                  g.save("canny", right, "edges (255) with dx = right minus left");
@@ -195,47 +199,51 @@ ZT_DEMO_STEP(40, "morphology", "Morphology",
                  g.save("morph-gradient", gradient, "dilation minus erosion");
              });
 
-ZT_DEMO_STEP(50, "floodfill", "Flood fill",
-             "Three gradient fills (8-connected, a neighbour joins when it differs by at most 4, or 2 in the background, from the pixel it is "
-             "reached from), painted over the photograph; the record gives each region's area and bounding box.",
-             "zoriFloodFillGetSize_Grad, zoriFloodFill_Grad8Con_8u_C1IR, zoriThreshold_8u_C1R, zoriCompareC_8u_C1R",
-             [](Gallery& g) {
-                 const Image& grey = g.grey();
-                 Image clipped(grey.width, grey.height, 1);  // 255 is kept for the fill value
-                 ZT_CALL(zoriThreshold_8u_C1R(grey.px.data(), grey.step(), clipped.px.data(), clipped.step(),
-                                              grey.size(), 254, CmpGreater));
-                 int bytes = 0;
-                 ZT_CALL(zoriFloodFillGetSize_Grad(grey.size(), &bytes));
-                 std::vector<uint8_t> buffer(static_cast<size_t>(bytes));
-                 Image out = g.photo();
-                 const struct { double x, y; uint8_t delta, r, gr, b; } seeds[] = {
-                     {0.33, 0.37, 4, 60, 220, 60}, {0.58, 0.81, 4, 255, 60, 60}, {0.90, 0.90, 2, 60, 120, 255}};
-                 std::string record;
-                 for (const auto& s : seeds) {
-                     Image work = clipped;
-                     const ImagePoint seed{static_cast<int>(s.x * (grey.width - 1)), static_cast<int>(s.y * (grey.height - 1))};
-                     ConnectedComp region;
-                     ZT_CALL(zoriFloodFill_Grad8Con_8u_C1IR(work.px.data(), work.step(), grey.size(), seed, 255, s.delta, s.delta,
-                                                            &region, buffer.data()));
-                     Image mask(grey.width, grey.height, 1);
-                     ZT_CALL(zoriCompareC_8u_C1R(work.px.data(), work.step(), 255, mask.px.data(), mask.step(),
-                                                 grey.size(), CmpEq));
-                     for (size_t i = 0; i < mask.px.size(); ++i) {
-                         if (!mask.px[i]) continue;
-                         uint8_t* p = &out.px[3 * i];
-                         p[0] = static_cast<uint8_t>((p[0] + s.r) / 2);
-                         p[1] = static_cast<uint8_t>((p[1] + s.gr) / 2);
-                         p[2] = static_cast<uint8_t>((p[2] + s.b) / 2);
-                     }
-                     record += (record.empty() ? "" : "; ") + std::string("seed (") + std::to_string(seed.x) + ", " +
-                               std::to_string(seed.y) + "), +-" + std::to_string(s.delta) + ": area " + std::to_string(static_cast<long>(region.area)) +
-                               ", box " + std::to_string(region.rect.width) + " x " +
-                               std::to_string(region.rect.height) + " at (" + std::to_string(region.rect.x) + ", " +
-                               std::to_string(region.rect.y) + ")";
-                 }
-                 g.save("floodfill", out, "three regions, 8-connected, windows +-4 and +-2");
-                 g.note(record);
-             });
+ZT_DEMO_STEP(
+    50, "floodfill", "Flood fill",
+    "Three gradient fills (8-connected, a neighbour joins when it differs by at most 4, or 2 in the "
+    "background, from the pixel it is reached from), painted over the photograph; the record gives each "
+    "region's area and bounding box.",
+    "zoriFloodFillGetSize_Grad, zoriFloodFill_Grad8Con_8u_C1IR, zoriThreshold_8u_C1R, zoriCompareC_8u_C1R",
+    [](Gallery& g) {
+        const Image& grey = g.grey();
+        Image clipped(grey.width, grey.height, 1);  // 255 is kept for the fill value
+        ZT_CALL(zoriThreshold_8u_C1R(grey.px.data(), grey.step(), clipped.px.data(), clipped.step(), grey.size(), 254,
+                                     CmpGreater));
+        int bytes = 0;
+        ZT_CALL(zoriFloodFillGetSize_Grad(grey.size(), &bytes));
+        std::vector<uint8_t> buffer(static_cast<size_t>(bytes));
+        Image out = g.photo();
+        const struct {
+            double x, y;
+            uint8_t delta, r, gr, b;
+        } seeds[] = {{0.33, 0.37, 4, 60, 220, 60}, {0.58, 0.81, 4, 255, 60, 60}, {0.90, 0.90, 2, 60, 120, 255}};
+        std::string record;
+        for (const auto& s : seeds) {
+            Image work = clipped;
+            const ImagePoint seed{static_cast<int>(s.x * (grey.width - 1)), static_cast<int>(s.y * (grey.height - 1))};
+            ConnectedComp region;
+            ZT_CALL(zoriFloodFill_Grad8Con_8u_C1IR(work.px.data(), work.step(), grey.size(), seed, 255, s.delta,
+                                                   s.delta, &region, buffer.data()));
+            Image mask(grey.width, grey.height, 1);
+            ZT_CALL(
+                zoriCompareC_8u_C1R(work.px.data(), work.step(), 255, mask.px.data(), mask.step(), grey.size(), CmpEq));
+            for (size_t i = 0; i < mask.px.size(); ++i) {
+                if (!mask.px[i]) continue;
+                uint8_t* p = &out.px[3 * i];
+                p[0] = static_cast<uint8_t>((p[0] + s.r) / 2);
+                p[1] = static_cast<uint8_t>((p[1] + s.gr) / 2);
+                p[2] = static_cast<uint8_t>((p[2] + s.b) / 2);
+            }
+            record += (record.empty() ? "" : "; ") + std::string("seed (") + std::to_string(seed.x) + ", " +
+                      std::to_string(seed.y) + "), +-" + std::to_string(s.delta) + ": area " +
+                      std::to_string(static_cast<long>(region.area)) + ", box " + std::to_string(region.rect.width) +
+                      " x " + std::to_string(region.rect.height) + " at (" + std::to_string(region.rect.x) + ", " +
+                      std::to_string(region.rect.y) + ")";
+        }
+        g.save("floodfill", out, "three regions, 8-connected, windows +-4 and +-2");
+        g.note(record);
+    });
 
 ZT_DEMO_STEP(60, "filter", "Linear filters",
              "User kernels through the integer filter: a 3x3 sharpening kernel (divisor 1, saturated) and a 3x3 "
@@ -259,8 +267,8 @@ ZT_DEMO_STEP(70, "arith", "Pixel arithmetic and alpha",
                  Image mirrored(p.width, p.height, 3);
                  ZT_CALL(zoriMirror_8u_C3R(p.px.data(), p.step(), mirrored.px.data(), mirrored.step(), p.size(), 1));
                  ZT_CALL(zoriCopy_8u_C3AC4R(mirrored.px.data(), mirrored.step(), b.px.data(), b.step(), p.size()));
-                 ZT_CALL(zoriAlphaComp_8u_AC4R(a.px.data(), a.step(), b.px.data(), b.step(), over.px.data(), over.step(),
-                                               p.size(), AlphaOver));
+                 ZT_CALL(zoriAlphaComp_8u_AC4R(a.px.data(), a.step(), b.px.data(), b.step(), over.px.data(),
+                                               over.step(), p.size(), AlphaOver));
                  Image blend(p.width, p.height, 3);
                  ZT_CALL(zoriCopy_8u_AC4C3R(over.px.data(), over.step(), blend.px.data(), blend.step(), p.size()));
                  const Image& grey = g.grey();
@@ -344,8 +352,7 @@ ZT_DEMO_STEP(90, "spectrogram", "Spectrogram",
 ZT_DEMO_STEP(91, "mel", "Mel filter-bank energies",
              "The same frames through 40 triangular filters spaced evenly on the mel scale (64 Hz to half the "
              "sampling rate), log energies.",
-             "zorsMelFBankInitAlloc_32f, zorsEvalFBank_32f, zorsThreshold_LTVal_32f_I, zorsLn_32f_I",
-             [](Gallery& g) {
+             "zorsMelFBankInitAlloc_32f, zorsEvalFBank_32f, zorsThreshold_LTVal_32f_I, zorsLn_32f_I", [](Gallery& g) {
                  const Features& f = g.features();
                  g.save("mel", heatMap(f.mel, 2, 6, false, 9), "40 filters, filter 1 at the bottom");
              });
@@ -369,10 +376,12 @@ std::string versionLine() {
 int cmdDemo(const Args& args) {
     const Options o = parseOptions(args);
     if (o.help) {
-        std::puts("usage: zor demo [--out DIR] [--data DIR]\n\n"
-                  "Runs every family on the bundled photograph and speech clip (from --data,\n"
-                  "default " ZOR_DATA_DIR ") and writes one PNG per result and DIR/index.html\n"
-                  "(default DIR: gallery), printing what it wrote and how long each step took.");
+        std::puts(
+            "usage: zor demo [--out DIR] [--data DIR]\n\n"
+            "Runs every family on the bundled photograph and speech clip (from --data,\n"
+            "default " ZOR_DATA_DIR
+            ") and writes one PNG per result and DIR/index.html\n"
+            "(default DIR: gallery), printing what it wrote and how long each step took.");
         return 0;
     }
     if (!o.positional.empty()) throw UserError("unexpected argument '" + o.positional[0] + "'");

@@ -41,11 +41,11 @@ private:
 };
 
 struct Step {
-    int order;                 // place in the gallery
+    int order;  // place in the gallery
     const char* id;
     const char* title;
-    const char* explanation;   // the one line under the pictures
-    const char* exports;       // the exports it calls, as shown
+    const char* explanation;  // the one line under the pictures
+    const char* exports;      // the exports it calls, as shown
     std::function<void(Gallery&)> run;
 };
 

@@ -14,9 +14,7 @@
 namespace ztool {
 namespace {
 
-[[noreturn]] void fail(const std::string& path, const std::string& what) {
-    throw UserError(path + ": " + what);
-}
+[[noreturn]] void fail(const std::string& path, const std::string& what) { throw UserError(path + ": " + what); }
 
 std::vector<uint8_t> slurp(const std::string& path) {
     std::ifstream in(path, std::ios::binary);
@@ -162,8 +160,7 @@ Audio readWav(const std::string& path) {
             a.samples.resize(frames);
             for (size_t i = 0; i < frames; ++i) {
                 long sum = 0;
-                for (int c = 0; c < channels; ++c)
-                    sum += static_cast<int16_t>(le16(body + 2 * (i * channels + c)));
+                for (int c = 0; c < channels; ++c) sum += static_cast<int16_t>(le16(body + 2 * (i * channels + c)));
                 a.samples[i] = static_cast<int16_t>(sum / channels);
             }
             return a;
@@ -176,7 +173,9 @@ Audio readWav(const std::string& path) {
 void writeWav(const std::string& path, const Audio& a) {
     const uint32_t bytes = static_cast<uint32_t>(a.samples.size() * 2);
     std::string out;
-    auto put = [&](uint32_t v, int n) { for (int i = 0; i < n; ++i) out += static_cast<char>(v >> (8 * i)); };
+    auto put = [&](uint32_t v, int n) {
+        for (int i = 0; i < n; ++i) out += static_cast<char>(v >> (8 * i));
+    };
     out += "RIFF";
     put(36 + bytes, 4);
     out += "WAVEfmt ";

@@ -4,7 +4,7 @@
 
 #include "public/zor.h"
 
-#define ZOR_FN(map, ret, name, params)                                        \
+#define ZOR_FN(map, ret, name, params)                                         \
     static_assert(std::is_same<decltype(&name), ret(ZOR_CALL*) params>::value, \
                   #name ": the generated header differs from the manifest");
 #include "zor_manifest.h"

@@ -110,9 +110,10 @@ Options parseOptions(const Args& args, const std::vector<std::string>& flags) {
 
 int cmdInfo(const Args& args) {
     if (parseOptions(args).help) {
-        std::puts("usage: zor info\n\nPrints the version records of the code variant bound at load, the\n"
-                  "processor-type code the library classified the processor as, and the\n"
-                  "processor's instruction-set features.");
+        std::puts(
+            "usage: zor info\n\nPrints the version records of the code variant bound at load, the\n"
+            "processor-type code the library classified the processor as, and the\n"
+            "processor's instruction-set features.");
         return 0;
     }
     static const char* const variants[5] = {"generic x86", "SSE", "SSE2", "SSE3", "SSSE3"};
@@ -126,9 +127,12 @@ int cmdInfo(const Args& args) {
     unsigned a = 0, b = 0, c = 0, d = 0;
     std::string features;
     if (__get_cpuid(1, &a, &b, &c, &d)) {
-        const struct { unsigned word; int bit; const char* name; } bits[] = {
-            {d, 23, "mmx"}, {d, 25, "sse"}, {d, 26, "sse2"}, {c, 0, "sse3"}, {c, 9, "ssse3"},
-            {c, 19, "sse4.1"}, {c, 20, "sse4.2"}, {c, 28, "avx"}, {c, 12, "fma"}};
+        const struct {
+            unsigned word;
+            int bit;
+            const char* name;
+        } bits[] = {{d, 23, "mmx"},    {d, 25, "sse"},    {d, 26, "sse2"}, {c, 0, "sse3"}, {c, 9, "ssse3"},
+                    {c, 19, "sse4.1"}, {c, 20, "sse4.2"}, {c, 28, "avx"},  {c, 12, "fma"}};
         for (const auto& f : bits)
             if (f.word >> f.bit & 1) features += std::string(" ") + f.name;
         if (__get_cpuid_count(7, 0, &a, &b, &c, &d)) {
@@ -143,8 +147,9 @@ int cmdInfo(const Args& args) {
 int cmdIdentify(const Args& args) {
     const Options o = parseOptions(args);
     if (o.help || o.positional.empty()) {
-        std::puts("usage: zor identify FILE...\n\nFor each image: format, size, channels, the smallest, largest and mean\n"
-                  "sample, and the share of samples that are not zero.");
+        std::puts(
+            "usage: zor identify FILE...\n\nFor each image: format, size, channels, the smallest, largest and mean\n"
+            "sample, and the share of samples that are not zero.");
         return o.help ? 0 : 2;
     }
     for (const std::string& path : o.positional) {
@@ -175,10 +180,12 @@ int main(int argc, char** argv) {
     }
     const std::string cmd = argv[1];
     const Args args(argv + 2, argv + argc);
-    static const struct { const char* name; int (*run)(const Args&); } commands[] = {
-        {"info", cmdInfo},     {"demo", cmdDemo},     {"bench", cmdBench}, {"identify", cmdIdentify},
-        {"resize", cmdResize}, {"filter", cmdFilter}, {"edges", cmdEdges}, {"color", cmdColor},
-        {"mfcc", cmdMfcc}};
+    static const struct {
+        const char* name;
+        int (*run)(const Args&);
+    } commands[] = {{"info", cmdInfo},         {"demo", cmdDemo},     {"bench", cmdBench},
+                    {"identify", cmdIdentify}, {"resize", cmdResize}, {"filter", cmdFilter},
+                    {"edges", cmdEdges},       {"color", cmdColor},   {"mfcc", cmdMfcc}};
     if (cmd == "-h" || cmd == "--help" || cmd == "help") {
         std::fputs(kUsage, stdout);
         return 0;

@@ -103,32 +103,35 @@ Image canny(const Gradient& g, float low, float high) {
     ZT_CALL(zoriCannyGetSize(size, &bytes));
     std::vector<uint8_t> buffer(static_cast<size_t>(bytes));
     Image edges(g.width, g.height, 1);
-    ZT_CALL(zoriCanny_16s8u_C1R(g.dx.data(), 2 * g.width, g.dy.data(), 2 * g.width, edges.px.data(), edges.step(),
-                                size, low, high, buffer.data()));
+    ZT_CALL(zoriCanny_16s8u_C1R(g.dx.data(), 2 * g.width, g.dy.data(), 2 * g.width, edges.px.data(), edges.step(), size,
+                                low, high, buffer.data()));
     return edges;
 }
 
-Image median(const Image& img, int size) {
-    if (size < 1 || size % 2 == 0) throw UserError("median size must be odd, not " + std::to_string(size));
-    const int r = size / 2;
-    auto plane = [&](const Image& one) {
-        const Image padded = padReplicate(one, r);
-        Image out(one.width, one.height, 1);
-        ZT_CALL(zoriFilterMedian_8u_C1R(padded.px.data() + r * padded.step() + r, padded.step(), out.px.data(),
-                                        out.step(), one.size(), ImageSize{size, size}, ImagePoint{r, r}));
-        return out;
-    };
-    if (img.channels == 1) return plane(img);
+Image perPlane(const Image& img, const std::function<Image(const Image&)>& one) {
+    if (img.channels == 1) return one(img);
     const Image rgb = toRgb(img);
     Image planes[3] = {Image(img.width, img.height, 1), Image(img.width, img.height, 1),
                        Image(img.width, img.height, 1)};
     uint8_t* p[3] = {planes[0].px.data(), planes[1].px.data(), planes[2].px.data()};
     ZT_CALL(zoriCopy_8u_C3P3R(rgb.px.data(), rgb.step(), p, img.width, img.size()));
-    for (Image& one : planes) one = plane(one);
+    for (Image& plane : planes) plane = one(plane);
     const uint8_t* q[3] = {planes[0].px.data(), planes[1].px.data(), planes[2].px.data()};
     Image out(img.width, img.height, 3);
     ZT_CALL(zoriCopy_8u_P3C3R(q, img.width, out.px.data(), out.step(), img.size()));
     return out;
+}
+
+Image median(const Image& img, int size) {
+    if (size < 1 || size % 2 == 0) throw UserError("median size must be odd, not " + std::to_string(size));
+    const int r = size / 2;
+    return perPlane(img, [&](const Image& one) {
+        const Image padded = padReplicate(one, r);
+        Image out(one.width, one.height, 1);
+        ZT_CALL(zoriFilterMedian_8u_C1R(padded.px.data() + r * padded.step() + r, padded.step(), out.px.data(),
+                                        out.step(), one.size(), ImageSize{size, size}, ImagePoint{r, r}));
+        return out;
+    });
 }
 
 Features speechFeatures(const Audio& a, int nFilter, int nCeps, double winMs, double hopMs) {

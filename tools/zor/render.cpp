@@ -20,8 +20,7 @@ Rgb ramp(double t, bool diverging) {
     t = std::min(1.0, std::max(0.0, t)) * 4;
     const int i = std::min(3, static_cast<int>(t));
     const double f = t - i;
-    return {c[i].r + f * (c[i + 1].r - c[i].r), c[i].g + f * (c[i + 1].g - c[i].g),
-            c[i].b + f * (c[i + 1].b - c[i].b)};
+    return {c[i].r + f * (c[i + 1].r - c[i].r), c[i].g + f * (c[i + 1].g - c[i].g), c[i].b + f * (c[i + 1].b - c[i].b)};
 }
 
 double quantile(std::vector<float> v, double q) {

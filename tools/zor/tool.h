@@ -77,12 +77,14 @@ Gradient sobel(const Image& grey, int mask);
 // |dx| + |dy|, divided by 4 (3x3) or 48 (5x5) and saturated to 8 bits.
 Image gradientMagnitude(const Gradient& g, int mask);
 Image canny(const Gradient& g, float low, float high);
+// A one-channel operation applied to each channel of an RGB image.
+Image perPlane(const Image& img, const std::function<Image(const Image&)>& one);
 Image median(const Image& img, int size);
 // MFCC front end over frames of winMs every hopMs.
 struct Features {
-    Plane spectrum;   // log magnitude, one column per frame, bin 0 at the bottom row
-    Plane mel;        // log mel energies, filter 1 at the bottom row
-    Plane mfcc;       // cepstra 1..nCeps, c1 at the bottom row
+    Plane spectrum;  // log magnitude, one column per frame, bin 0 at the bottom row
+    Plane mel;       // log mel energies, filter 1 at the bottom row
+    Plane mfcc;      // cepstra 1..nCeps, c1 at the bottom row
     int frames = 0;
 };
 Features speechFeatures(const Audio& a, int nFilter, int nCeps, double winMs = 25, double hopMs = 10);

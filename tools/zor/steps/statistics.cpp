@@ -1,4 +1,5 @@
-// needs: zoriMean_StdDev_8u_C3CR zoriMinMax_8u_C3R zoriMomentInitAlloc_64f zoriMoments64f_32f_C1R zoriGetSpatialMoment_64f zoriMomentFree_64f
+// needs: zoriMean_StdDev_8u_C3CR zoriMinMax_8u_C3R
+// needs: zoriMomentInitAlloc_64f zoriMoments64f_32f_C1R zoriGetSpatialMoment_64f zoriMomentFree_64f
 // Demo step of the image statistics and moments: per-channel numbers, and
 // the centroid and main axis of the grey image drawn over it.
 #include <cmath>
@@ -12,7 +13,7 @@ namespace {
 
 // The type of an export's first parameter (the moment state's pointer type).
 template <class R, class A, class... B>
-A firstParameter(R (ZOR_CALL*)(A, B...));
+A firstParameter(R(ZOR_CALL*)(A, B...));
 
 ZT_DEMO_STEP(46, "statistics", "Statistics and moments",
              "Mean, standard deviation, minimum and maximum of each channel, and the centroid and main axis of the "
@@ -28,8 +29,11 @@ ZT_DEMO_STEP(46, "statistics", "Statistics and moments",
                      ZT_CALL(zoriMean_StdDev_8u_C3CR(p.px.data(), p.step(), p.size(), coi, &mean, &dev));
                      char line[96];
                      std::snprintf(line, sizeof line, "%s%s: mean %.2f, deviation %.2f, range %d..%d",
-                                   coi > 1 ? "; " : "", coi == 1 ? "red" : coi == 2 ? "green" : "blue", mean, dev,
-                                   lo[coi - 1], hi[coi - 1]);
+                                   coi > 1 ? "; " : "",
+                                   coi == 1   ? "red"
+                                   : coi == 2 ? "green"
+                                              : "blue",
+                                   mean, dev, lo[coi - 1], hi[coi - 1]);
                      stats += line;
                  }
                  g.note(stats);
@@ -58,7 +62,8 @@ ZT_DEMO_STEP(46, "statistics", "Statistics and moments",
                  };
                  for (int t = -120; t <= 120; ++t)
                      for (int w = -1; w <= 1; ++w)
-                         dot(cx + t * std::cos(angle) - w * std::sin(angle), cy + t * std::sin(angle) + w * std::cos(angle));
+                         dot(cx + t * std::cos(angle) - w * std::sin(angle),
+                             cy + t * std::sin(angle) + w * std::cos(angle));
                  for (int t = -8; t <= 8; ++t)
                      for (int w = -1; w <= 1; ++w) dot(cx + t, cy + w), dot(cx + w, cy + t);
                  char line[96];

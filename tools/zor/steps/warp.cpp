@@ -19,8 +19,8 @@ ZT_DEMO_STEP(17, "warp", "Affine and perspective warps",
                  double quad[4][2] = {{0.2 * w, 0.1 * h}, {0.8 * w, 0.1 * h}, {w, h}, {0, h}};
                  double coeffs[3][3];
                  ZT_CALL(zoriGetPerspectiveTransform(all, quad, coeffs));
-                 ZT_CALL(zoriWarpPerspective_8u_C3R(p.px.data(), p.size(), p.step(), all, persp.px.data(),
-                                                    persp.step(), all, coeffs, InterLinear));
+                 ZT_CALL(zoriWarpPerspective_8u_C3R(p.px.data(), p.size(), p.step(), all, persp.px.data(), persp.step(),
+                                                    all, coeffs, InterLinear));
                  g.save("warp-affine", affine, "x' = 0.9 x + 0.25 y, y' = 0.9 y + 15");
                  g.save("warp-perspective", persp, "corners to a trapezoid");
              });
