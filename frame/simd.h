@@ -619,7 +619,7 @@ struct Isa<16> {
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
-        if constexpr (std::is_same_v<R<To>, R<From>>) return a;
+        if constexpr (std::is_same_v<To, From> || (isInt<To> && isInt<From>)) return a;
 #  if ZOR_SIMD >= 2
         else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);
         else if constexpr (isD<To> && isF<From>) return _mm_castps_pd(a);
