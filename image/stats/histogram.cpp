@@ -43,22 +43,11 @@ void FullHistogram<Channels>::count(const uint8_t* src, int step, ImageSize roi)
     for (int y = 0; y < roi.height; ++y) {
         const uint8_t* s = rowAt(src, step, y);
         int x = 0;
-        if constexpr (Channels == 1) {
-            // a machine word of pixels at a time
-            using Word = uintptr_t;
-            for (; x + int(sizeof(Word)) <= roi.width; x += int(sizeof(Word))) {
-                Word v;
-                std::memcpy(&v, s + x, sizeof v);
-                for (int k = 0; k < int(sizeof(Word)); ++k) ++copy[0][k % kWays][(v >> (8 * k)) & 0xFF];
-            }
-            for (; x < roi.width; ++x) ++copy[0][x % kWays][s[x]];
-        } else {
-            for (; x + kWays <= roi.width; x += kWays)
-                for (int k = 0; k < kWays; ++k)
-                    for (int c = 0; c < Channels; ++c) ++copy[c][k][s[Channels * (x + k) + c]];
-            for (; x < roi.width; ++x)
-                for (int c = 0; c < Channels; ++c) ++copy[c][0][s[Channels * x + c]];
-        }
+        for (; x + kWays <= roi.width; x += kWays)
+            for (int k = 0; k < kWays; ++k)
+                for (int c = 0; c < Channels; ++c) ++copy[c][k][s[Channels * (x + k) + c]];
+        for (; x < roi.width; ++x)
+            for (int c = 0; c < Channels; ++c) ++copy[c][0][s[Channels * x + c]];
     }
     addCopies();
 }

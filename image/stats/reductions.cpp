@@ -44,6 +44,28 @@ double sumOfRows(const T* src, int step, ImageSize roi, RowTotal rowTotal) {
     return total;
 }
 
+// Sum of a (or of |a - b|) by rows: each row total in 32 bits, added to a
+// double.  A row total wraps only past 16843009 pixels, and the double sum
+// of row totals is exact below 2^53 (more than 35 TB of pixels), so below
+// that width the rows share one exact 64-bit sum and its accumulators.
+template <bool Diff>
+double byteSumOfRows(const uint8_t* a, int aStep, const uint8_t* b, int bStep, ImageSize roi) {
+    constexpr int kRowsNeverWrap = 16843009;  // 255 * 16843009 < 2^32
+    double total = 0.0;
+    ByteSum<Diff> sum;
+    for (int y = 0; y < roi.height; ++y) {
+        const uint8_t* rowB = Diff ? rowAt(b, bStep, y) : nullptr;
+        if (roi.width <= kRowsNeverWrap) {
+            sum.addRow(rowAt(a, aStep, y), rowB, roi.width);
+            continue;
+        }
+        ByteSum<Diff> row;
+        row.addRow(rowAt(a, aStep, y), rowB, roi.width);
+        total += double(uint32_t(row.total()));
+    }
+    return total + double(sum.total());
+}
+
 // Accurate float sum: one double accumulator over the even columns, one over
 // the odd columns, across the whole ROI.  Each step is a double addition of
 // a float; under the 53-bit precision control the x87 variants round every
@@ -133,15 +155,13 @@ inline int firstInRow16u(const uint16_t* row, int w, int c, uint16_t v) {
 #if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 Status ZOR_CALL zoriSum_8u_C1R(const uint8_t* pSrc, int srcStep, ImageSize roiSize, double* pSum) {
     if (Status s = checkFirst(anyNull(pSrc, pSum), badRoi(roiSize))) return s;
-    *pSum = sumOfRows(pSrc, srcStep, roiSize,
-                      [&](const uint8_t* r) { return rowSad8u<false>(r, nullptr, roiSize.width); });
+    *pSum = byteSumOfRows<false>(pSrc, srcStep, nullptr, 0, roiSize);
     return StatusOk;
 }
 
 Status ZOR_CALL zoriMean_8u_C1R(const uint8_t* pSrc, int srcStep, ImageSize roiSize, double* pMean) {
     if (Status s = checkFirst(anyNull(pMean), anyNull(pSrc), badRoi(roiSize))) return s;
-    const double sum = sumOfRows(pSrc, srcStep, roiSize,
-                                 [&](const uint8_t* r) { return rowSad8u<false>(r, nullptr, roiSize.width); });
+    const double sum = byteSumOfRows<false>(pSrc, srcStep, nullptr, 0, roiSize);
     DoublePrecisionScope precision;
     *pMean = toDouble(sum / pixelCount(roiSize));
     return StatusOk;
@@ -176,10 +196,7 @@ Status ZOR_CALL zoriNormDiff_L1_8u_C1R(const uint8_t* pSrc1, int src1Step, const
                                        ImageSize roiSize, double* pValue) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pValue), badRoi(roiSize), badSteps(src1Step, src2Step)))
         return s;
-    double total = 0.0;
-    for (int y = 0; y < roiSize.height; ++y)
-        total += double(rowSad8u<true>(rowAt(pSrc1, src1Step, y), rowAt(pSrc2, src2Step, y), roiSize.width));
-    *pValue = total;
+    *pValue = byteSumOfRows<true>(pSrc1, src1Step, pSrc2, src2Step, roiSize);
     return StatusOk;
 }
 #endif

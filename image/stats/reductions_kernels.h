@@ -47,42 +47,54 @@ const auto maxOf = [](auto a, auto b) { return decltype(a)(b > a ? b : a); };
 
 // ---- 8-bit sums: plain and of absolute differences ----------------------------
 
-// Sum over a row of a[x] (Diff false) or |a[x] - b[x]| (Diff true),
-// wrapping in 32 bits: two partial sums over the even and odd columns, the
+// Sum of a[x] (Diff false) or of |a[x] - b[x]| (Diff true) over rows, exact
+// in 64 bits.  Generic: two partial sums over the even and odd columns, the
 // last odd column added to the even one.  SIMD: sums of 8-byte groups in
-// 64-bit lanes, reduced modulo 2^32, which is the same number.
+// 64-bit lanes, kept across rows.
 template <bool Diff>
-uint32_t rowSad8u(const uint8_t* a, const uint8_t* b, int n) {
-    int x = 0;
-    uint32_t even = 0, odd = 0;
+class ByteSum {
+public:
+    void addRow(const uint8_t* a, const uint8_t* b, int n) {
+        int x = 0;
+#if ZOR_SIMD >= 2
+        auto sad = [&](int at) {
+            return simd::sumAbsDiff(simd::load<V>(a + at), Diff ? simd::load<V>(b + at) : simd::zero<V>());
+        };
+        for (; x + 4 * L <= n; x += 4 * L) {
+            s_[0] += sad(x);
+            s_[1] += sad(x + L);
+            s_[2] += sad(x + 2 * L);
+            s_[3] += sad(x + 3 * L);
+        }
+        for (; x + L <= n; x += L) s_[0] += sad(x);
+#endif
+        auto at = [&](int i) -> uint64_t {
+            if constexpr (Diff) return simd::absDiff(a[i], b[i]);
+            else return a[i];
+        };
+        for (; x + 2 <= n; x += 2) {
+            even_ += at(x);
+            odd_ += at(x + 1);
+        }
+        if (x < n) even_ += at(x);
+    }
+    uint64_t total() const {
+        uint64_t t = even_ + odd_;
+#if ZOR_SIMD >= 2
+        t += simd::reduceAdd((s_[0] + s_[1]) + (s_[2] + s_[3]));
+#endif
+        return t;
+    }
+
+private:
+    uint64_t even_ = 0, odd_ = 0;
 #if ZOR_SIMD >= 2
     using V = simd::Vec<uint8_t>;
     using W = simd::Vec<uint64_t>;
-    constexpr int L = V::kLanes;
-    auto sad = [&](int at) {
-        return simd::sumAbsDiff(simd::load<V>(a + at), Diff ? simd::load<V>(b + at) : simd::zero<V>());
-    };
-    W s0 = simd::zero<W>(), s1 = s0, s2 = s0, s3 = s0;
-    for (; x + 4 * L <= n; x += 4 * L) {
-        s0 += sad(x);
-        s1 += sad(x + L);
-        s2 += sad(x + 2 * L);
-        s3 += sad(x + 3 * L);
-    }
-    for (; x + L <= n; x += L) s0 += sad(x);
-    even = uint32_t(simd::reduceAdd((s0 + s1) + (s2 + s3)));
+    static constexpr int L = V::kLanes;
+    W s_[4] = {simd::zero<W>(), simd::zero<W>(), simd::zero<W>(), simd::zero<W>()};
 #endif
-    auto at = [&](int i) -> uint32_t {
-        if constexpr (Diff) return simd::absDiff(a[i], b[i]);
-        else return a[i];
-    };
-    for (; x + 2 <= n; x += 2) {
-        even += at(x);
-        odd += at(x + 1);
-    }
-    if (x < n) even += at(x);
-    return even + odd;
-}
+};
 
 // Per-channel sums of a three-channel 8-bit row, added to sums[3] (32-bit).
 inline void rowChannelSums8u(const uint8_t* s, int w, uint32_t* sums) {
