@@ -141,18 +141,21 @@ ZB_PAIR(meanstddev_16u, "zoriMean_StdDev_16u_C3CR 1920x1080", zorMeanStdDev, cvM
 
 // ---- histogram ------------------------------------------------------------------
 
+// bins equal bins over 0 .. 256
+template <int Bins>
 void zorHistogram(benchmark::State& st) {
     const cv::Mat& g = scene().gray;
-    std::vector<int32_t> levels(257), hist(256);
-    for (int k = 0; k <= 256; ++k) levels[k] = k;
+    std::vector<int32_t> levels(Bins + 1), hist(Bins);
+    for (int k = 0; k <= Bins; ++k) levels[k] = k * 256 / Bins;
     for (auto _ : st) {
-        zoriHistogramRange_8u_C1R(g.data, int(g.step), kRoi, hist.data(), levels.data(), 257);
+        zoriHistogramRange_8u_C1R(g.data, int(g.step), kRoi, hist.data(), levels.data(), Bins + 1);
         benchmark::DoNotOptimize(hist.data());
     }
 }
+template <int Bins>
 void cvHistogram(benchmark::State& st) {
     const cv::Mat& g = scene().gray;
-    const int channels[] = {0}, bins[] = {256};
+    const int channels[] = {0}, bins[] = {Bins};
     const float range[] = {0, 256};
     const float* ranges[] = {range};
     cv::Mat hist;
@@ -161,8 +164,10 @@ void cvHistogram(benchmark::State& st) {
         benchmark::DoNotOptimize(hist.data);
     }
 }
-ZB_PAIR(histogram_8u, "zoriHistogramRange_8u_C1R 256 bins 1920x1080", zorHistogram, cvHistogram, "cv::calcHist",
-        1.0);
+ZB_PAIR(histogram_8u, "zoriHistogramRange_8u_C1R 256 bins 1920x1080", zorHistogram<256>, cvHistogram<256>,
+        "cv::calcHist", 1.0);
+ZB_PAIR(histogram_8u_4, "zoriHistogramRange_8u_C1R 4 bins 1920x1080", zorHistogram<4>, cvHistogram<4>,
+        "cv::calcHist", 0);
 
 // ---- moments --------------------------------------------------------------------
 

@@ -466,7 +466,7 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriNormDiff_L1_8u_C1R, (const uint8_t* pSrc1, int sr
  * match.  The C3 form checks each channel's pointers and level count before
  * the size and step. */
 ZOR_FN(ZOR_SSE2UP, Status, zoriHistogramRange_8u_C1R,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist, const int32_t* pLevels, int nLevels))
-ZOR_FN(ZOR_GENERIC, Status, zoriHistogramRange_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist, const float* pLevels, int nLevels))
+ZOR_FN(ZOR_SSE2UP, Status, zoriHistogramRange_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist, const float* pLevels, int nLevels))
 ZOR_FN(ZOR_SSE2UP, Status, zoriHistogramRange_8u_C3R,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist[3], const int32_t* pLevels[3], const int nLevels[3]))
 
 /* ---- image/stats/moments ----
