@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "bench/pairs.h"
+#include "bench/picture.h"
 #include "zor.h"
 
 namespace {
@@ -19,28 +20,21 @@ namespace {
 constexpr int kW = 1920, kH = 1080;
 constexpr ImageSize kRoi{kW, kH};
 
-// A deterministic picture: smooth shading, a few shapes, mild noise; the
-// same in 8u, 16u (three channels) and 32f.
+// The test picture in 8u, a blurred copy, a three-channel 16u variant of it
+// and a float copy.
 struct Scene {
-    cv::Mat gray, gray2, rgb16, real;
+    cv::Mat gray = zb::testPicture(kW, kH), gray2, rgb16, real;
     Scene() {
-        gray.create(kH, kW, CV_8UC1);
-        rgb16.create(kH, kW, CV_16UC3);
-        uint32_t r = 12345;
-        for (int y = 0; y < kH; ++y)
-            for (int x = 0; x < kW; ++x) {
-                r = r * 1664525u + 1013904223u;
-                double v = 110 + 50 * std::sin(x / 57.0) * std::cos(y / 41.0);
-                if ((x / 160 + y / 120) % 3 == 0) v += 60;
-                const double cx = x - 960.0, cy = y - 540.0;
-                if (cx * cx + cy * cy < 300.0 * 300.0) v -= 70;
-                v += double(r >> 28) - 8;
-                gray.at<uint8_t>(y, x) = cv::saturate_cast<uint8_t>(v);
-                for (int c = 0; c < 3; ++c)
-                    rgb16.at<cv::Vec3w>(y, x)[c] = cv::saturate_cast<uint16_t>(v * (200 + 30 * c) + (r >> (8 + c)) % 256);
-            }
         cv::GaussianBlur(gray, gray2, cv::Size(5, 5), 1.5);
         gray.convertTo(real, CV_32F, 1.0 / 16);
+        rgb16.create(kH, kW, CV_16UC3);
+        uint32_t r = 777;
+        for (int y = 0; y < kH; ++y)
+            for (int x = 0; x < kW; ++x)
+                for (int c = 0; c < 3; ++c) {
+                    r = r * 1664525u + 1013904223u;
+                    rgb16.at<cv::Vec3w>(y, x)[c] = uint16_t(gray.at<uint8_t>(y, x) * (200 + 25 * c) + (r >> 24));
+                }
     }
 };
 

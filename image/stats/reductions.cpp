@@ -18,6 +18,7 @@
 
 #include <cmath>
 #include <cstdint>
+#include <cstring>
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -84,42 +85,48 @@ double accurateSum32f(const float* src, int step, ImageSize roi) {
     return odd + even;
 }
 
-// Extrema of a float image by the sequential rule: v becomes the minimum
-// when !(v >= min), else the maximum when v > max.
-Range32f sequentialRange32f(const float* src, int step, ImageSize roi) {
-    Range32f m{src[0], src[0]};
+// The extrema of a float image by the sequential rule, v becoming the
+// minimum when !(v >= min), else the maximum when v > max, as the pixels
+// that hold them: their bits are copied out, never loaded as floats (an x87
+// load would quieten a signalling NaN).
+struct Extremes {
+    const float* min;
+    const float* max;
+};
+Extremes sequentialExtremes32f(const float* src, int step, ImageSize roi) {
+    Extremes e{src, src};
     for (int y = 0; y < roi.height; ++y) {
         const float* s = rowAt(src, step, y);
         for (int x = 0; x < roi.width; ++x) {
-            const float v = s[x];
-            if (!(v >= m.min)) m.min = v;
-            else if (v > m.max) m.max = v;
+            if (!(s[x] >= *e.min)) e.min = s + x;
+            else if (s[x] > *e.max) e.max = s + x;
         }
     }
-    return m;
+    return e;
 }
 
-// The first value equal to v in raster order (v is in the image): tells
-// which zero, +0 or -0, the sequential rule keeps.
-float firstEqual32f(const float* src, int step, ImageSize roi, float v) {
+// The first zero in raster order (there is one).
+const float* firstZero32f(const float* src, int step, ImageSize roi) {
     for (int y = 0; y < roi.height; ++y) {
         const float* s = rowAt(src, step, y);
         for (int x = 0; x < roi.width; ++x)
-            if (s[x] == v) return s[x];
+            if (s[x] == 0.0f) return s + x;
     }
-    return v;
+    return src;
 }
 
 // Without NaNs the sequential rule keeps the first occurrence of the least
-// and of the greatest value; any NaN sends the scan to the rule itself.
-Range32f range32f(const float* src, int step, ImageSize roi) {
+// and of the greatest value, which differs from the others only for zeros
+// (+0 or -0); any NaN sends the scan to the rule itself.
+void extremes32f(const float* src, int step, ImageSize roi, float* pMin, float* pMax) {
     Range32f m{src[0], src[0]};
-    if (src[0] != src[0]) return sequentialRange32f(src, step, roi);
-    for (int y = 0; y < roi.height; ++y)
-        if (!rowRange32f(rowAt(src, step, y), roi.width, m)) return sequentialRange32f(src, step, roi);
-    if (m.min == 0.0f) m.min = firstEqual32f(src, step, roi, 0.0f);
-    if (m.max == 0.0f) m.max = firstEqual32f(src, step, roi, 0.0f);
-    return m;
+    bool ordered = src[0] == src[0];
+    for (int y = 0; y < roi.height && ordered; ++y) ordered = rowRange32f(rowAt(src, step, y), roi.width, m);
+    const Extremes e = ordered ? Extremes{m.min == 0.0f ? firstZero32f(src, step, roi) : &m.min,
+                                          m.max == 0.0f ? firstZero32f(src, step, roi) : &m.max}
+                               : sequentialExtremes32f(src, step, roi);
+    std::memcpy(pMin, e.min, sizeof *pMin);
+    std::memcpy(pMax, e.max, sizeof *pMax);
 }
 
 // Sum and sum of squares of one channel, mean and population deviation.
@@ -221,9 +228,7 @@ Status ZOR_CALL zoriSum_32f_C1R(const float* pSrc, int srcStep, ImageSize roiSiz
 
 Status ZOR_CALL zoriMinMax_32f_C1R(const float* pSrc, int srcStep, ImageSize roiSize, float* pMin, float* pMax) {
     if (Status s = checkFirst(anyNull(pSrc, pMin, pMax), badRoi(roiSize))) return s;
-    const Range32f m = range32f(pSrc, srcStep, roiSize);
-    *pMin = m.min;
-    *pMax = m.max;
+    extremes32f(pSrc, srcStep, roiSize, pMin, pMax);
     return StatusOk;
 }
 

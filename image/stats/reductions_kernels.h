@@ -132,6 +132,17 @@ struct SumSquares {
     int64_t sum = 0, squares = 0;
 };
 
+// Adds channel c of pixels x .. w - 1 to t.
+template <class T>
+SumSquares addSamples(const T* s, int x, int w, int c, SumSquares t) {
+    for (; x < w; ++x) {
+        const int64_t v = s[3 * x + c];
+        t.sum += v;
+        t.squares += v * v;
+    }
+    return t;
+}
+
 // Channel c of an 8-bit three-channel row.
 inline SumSquares rowChannelSquares8u(const uint8_t* s, int w, int c) {
     SumSquares t;
@@ -163,12 +174,7 @@ inline SumSquares rowChannelSquares8u(const uint8_t* s, int w, int c) {
     }
     t.sum = int64_t(simd::reduceAdd(sum));
 #endif
-    for (; x < w; ++x) {
-        const int64_t v = s[3 * x + c];
-        t.sum += v;
-        t.squares += v * v;
-    }
-    return t;
+    return addSamples(s, x, w, c, t);
 }
 
 // Channel c of a 16-bit three-channel row.  The SIMD path works on v - 32768,
@@ -207,12 +213,7 @@ inline SumSquares rowChannelSquares16u(const uint16_t* s, int w, int c) {
     t.sum = centred + 32768 * n;
     t.squares = int64_t(simd::reduceAdd(squares)) + 65536 * t.sum - (n << 30);
 #endif
-    for (; x < w; ++x) {
-        const int64_t v = s[3 * x + c];
-        t.sum += v;
-        t.squares += v * v;
-    }
-    return t;
+    return addSamples(s, x, w, c, t);
 }
 
 // ---- extrema of 8-bit rows ------------------------------------------------------------
@@ -240,34 +241,42 @@ inline uint8_t rowMax8u(const uint8_t* s, int n) {
     return m;
 }
 
+#if ZOR_SIMD >= 2
+// Per-channel extrema of a three-channel row of w >= kLanes pixels, merged
+// into mn[3] and mx[3]: lane-wise over the runs of three registers that
+// at(pixel, r) loads (the last run may overlap the one before, with the same
+// channel order), then folded by channel.
+template <class V, class Load>
+void runExtremes(int w, Load at, typename V::Lane* mn, typename V::Lane* mx) {
+    constexpr int L = V::kLanes;
+    V lo[3], hi[3];
+    for (int r = 0; r < 3; ++r) lo[r] = hi[r] = at(0, r);
+    for (int x = L;; x += L) {
+        if (x + L > w) x = w - L;
+        for (int r = 0; r < 3; ++r) {
+            const V v = at(x, r);
+            lo[r] = simd::min(lo[r], v);
+            hi[r] = simd::max(hi[r], v);
+        }
+        if (x == w - L) break;
+    }
+    for (int r = 0; r < 3; ++r) {
+        const V lab = channelLabels<V>(r);
+        foldByChannel(lo[r], lab, mn, minOf);
+        foldByChannel(hi[r], lab, mx, maxOf);
+    }
+}
+#endif
+
 // Per-channel minima and maxima of a three-channel 8-bit row, merged into
 // mn[3] and mx[3].
 inline void rowMinMax8uC3(const uint8_t* s, int w, uint8_t* mn, uint8_t* mx) {
-    int x = 0;
 #if ZOR_SIMD >= 2
     using V = simd::Vec<uint8_t>;
-    constexpr int L = V::kLanes;
-    if (w >= L) {
-        V lo[3], hi[3];
-        for (int r = 0; r < 3; ++r) lo[r] = hi[r] = simd::load<V>(s + r * L);
-        for (x = L;; x += L) {
-            if (x + L > w) x = w - L;  // the last run may overlap: same channel order
-            for (int r = 0; r < 3; ++r) {
-                const V v = simd::load<V>(s + 3 * x + r * L);
-                lo[r] = simd::min(lo[r], v);
-                hi[r] = simd::max(hi[r], v);
-            }
-            if (x == w - L) break;
-        }
-        for (int r = 0; r < 3; ++r) {
-            const V lab = channelLabels<V>(r);
-            foldByChannel(lo[r], lab, mn, minOf);
-            foldByChannel(hi[r], lab, mx, maxOf);
-        }
-        return;
-    }
+    if (w >= V::kLanes)
+        return runExtremes<V>(w, [&](int px, int r) { return simd::load<V>(s + 3 * px + r * V::kLanes); }, mn, mx);
 #endif
-    for (; x < w; ++x)
+    for (int x = 0; x < w; ++x)
         for (int c = 0; c < 3; ++c) {
             mn[c] = minOf(mn[c], s[3 * x + c]);
             mx[c] = maxOf(mx[c], s[3 * x + c]);
@@ -282,40 +291,20 @@ struct Range16u {
 
 inline Range16u rowRange16u(const uint16_t* s, int w, int c) {
     Range16u m;
-    int x = 0;
 #if ZOR_SIMD >= 2
     // Unsigned order as signed order of v ^ 0x8000, where the instructions
     // are single.
     using V = simd::Vec<int16_t>;
-    constexpr int L = V::kLanes;
-    if (w >= L) {
+    if (w >= V::kLanes) {
         const V flip = simd::set1<V>(int16_t(-32768));
-        auto at = [&](int px, int r) {
-            return simd::loadFrom<V>(s + 3 * px + r * L) ^ flip;
-        };
-        V lo[3], hi[3];
-        for (int r = 0; r < 3; ++r) lo[r] = hi[r] = at(0, r);
-        for (x = L;; x += L) {
-            if (x + L > w) x = w - L;
-            for (int r = 0; r < 3; ++r) {
-                const V v = at(x, r);
-                lo[r] = simd::min(lo[r], v);
-                hi[r] = simd::max(hi[r], v);
-            }
-            if (x == w - L) break;
-        }
         int16_t mn[3] = {32767, 32767, 32767}, mx[3] = {-32768, -32768, -32768};
-        for (int r = 0; r < 3; ++r) {
-            const V lab = channelLabels<V>(r);
-            foldByChannel(lo[r], lab, mn, minOf);
-            foldByChannel(hi[r], lab, mx, maxOf);
-        }
+        runExtremes<V>(w, [&](int px, int r) { return simd::loadFrom<V>(s + 3 * px + r * V::kLanes) ^ flip; }, mn, mx);
         m.min = uint16_t(mn[c] ^ 0x8000);
         m.max = uint16_t(mx[c] ^ 0x8000);
         return m;
     }
 #endif
-    for (; x < w; ++x) {
+    for (int x = 0; x < w; ++x) {
         m.min = minOf(m.min, s[3 * x + c]);
         m.max = maxOf(m.max, s[3 * x + c]);
     }
