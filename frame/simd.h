@@ -678,7 +678,6 @@ struct Isa<16> {
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
-        // (same register type; comparing the raw types would drop their vector attributes)
         if constexpr (std::is_same_v<To, From> || (isInt<To> && isInt<From>)) return a;
 #  if ZOR_SIMD >= 2
         else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);

@@ -486,11 +486,61 @@ ZOR_FN(ZOR_ALL, Status, zormQRBackSubst_mv_64f,
 ZOR_FN(ZOR_ALL, Status, zormMul_vc_32f,
        (const float* pSrc, int srcStride2, float val, float* pDst, int dstStride2, int len))
 
-/* ---- image/stats/reductions ---- */
+/* ---- image/stats/reductions ----
+ * Sums, means, deviations and norms are doubles; extrema keep the pixel type
+ * (zoriMinMaxIndx_16u_C3CR: float).  Positions are (column, row) within the
+ * ROI of the first occurrence in raster order.  C3CR forms analyse channel
+ * coi (1..3) of a three-channel image.
+ * Integer sums: each row in 32-bit unsigned arithmetic (wrapping only past
+ * 16 million pixels a row), each row total added to a double.
+ * zoriSum_32f_C1R, accurate method (hint 2, and any hint in the generic
+ * variant): one double accumulator over the even columns and one over the
+ * odd columns of every row, top to bottom; the result is odd + even.  Any
+ * other hint in the SIMD variants: each row summed in 16 float partial sums
+ * (element i into partial i mod 16, the last width mod 16 elements added
+ * in double), then added to a double total; the SSE to SSSE3 variants agree
+ * with one another, but may differ from the accurate sum in the last bits.
+ * zoriMinMax_32f_C1R scans in raster order: v becomes the minimum when
+ * !(v >= min), else the maximum when v > max (a NaN becomes the minimum, and
+ * the value after it replaces it unconditionally).
+ * Standard deviation: population form, sqrt(|sum(v^2)/N - mean^2|), from
+ * exact integer sums.  Null result pointers of zoriMean_StdDev_* and
+ * zoriMinMaxIndx_16u_C3CR are not an error: those results are not written.
+ * zoriMinMax_8u_C3R and zoriMax_8u_C1R stop reading after the row in which
+ * no result can change any more (minima 0 and maxima 255). */
+ZOR_FN(ZOR_SSE2UP, Status, zoriSum_8u_C1R,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, double* pSum))
+ZOR_FN(ZOR_ALL,    Status, zoriSum_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, double* pSum, int hint))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMean_8u_C1R, (const uint8_t* pSrc, int srcStep, ImageSize roiSize, double* pMean))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMean_8u_C3R, (const uint8_t* pSrc, int srcStep, ImageSize roiSize, double pMean[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMean_StdDev_8u_C3CR,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, int coi, double* pMean, double* pStdDev))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMean_StdDev_16u_C3CR, (const uint16_t* pSrc, int srcStep, ImageSize roiSize, int coi, double* pMean, double* pStdDev))
+ZOR_FN(ZOR_ALL,    Status, zoriMinMax_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, float* pMin, float* pMax))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMinMax_8u_C3R,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, uint8_t pMin[3], uint8_t pMax[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMinMaxIndx_16u_C3CR, (const uint16_t* pSrc, int srcStep, ImageSize roiSize, int coi, float* pMinVal, float* pMaxVal, ImagePoint* pMinIndex, ImagePoint* pMaxIndex))
+ZOR_FN(ZOR_SSE2UP, Status, zoriMax_8u_C1R, (const uint8_t* pSrc, int srcStep, ImageSize roiSize, uint8_t* pMax))
+ZOR_FN(ZOR_SSE2UP, Status, zoriNormDiff_L1_8u_C1R, (const uint8_t* pSrc1, int src1Step, const uint8_t* pSrc2, int src2Step, ImageSize roiSize, double* pValue))
 
-/* ---- image/stats/histogram ---- */
+/* ---- image/stats/histogram ----
+ * nLevels boundaries make nLevels - 1 bins; bin k counts levels[k] <= v <
+ * levels[k + 1]; the counts are cleared first.  8u: levels are clamped to
+ * 0..256, a bin with lo >= hi counts 0.  32f: levels that are not strictly
+ * increasing test every pixel against every bin (overlapping bins count a
+ * value more than once); NaN pixels are never counted, and NaN levels never
+ * match.  The C3 form checks each channel's pointers and level count before
+ * the size and step. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriHistogramRange_8u_C1R,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist, const int32_t* pLevels, int nLevels))
+ZOR_FN(ZOR_SSE2UP, Status, zoriHistogramRange_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist, const float* pLevels, int nLevels))
+ZOR_FN(ZOR_SSE2UP, Status, zoriHistogramRange_8u_C3R,  (const uint8_t* pSrc, int srcStep, ImageSize roiSize, int32_t* pHist[3], const int32_t* pLevels[3], const int nLevels[3]))
 
-/* ---- image/stats/moments ---- */
+/* ---- image/stats/moments ----
+ * Spatial moments up to order 3 in a MomentState (zor.h).  Row sums use
+ * x f, x (x f), x (x (x f)) in double, each in four partial sums (column x
+ * into partial x mod 4), combined as (p0 + p2) + (p1 + p3) at the end of
+ * the row.  Query orders: m, n >= 0 and m + n <= 3, else StatusBadSize. */
+ZOR_FN(ZOR_GENERIC, Status, zoriMomentInitAlloc_64f, (MomentState** ppState, int hint))
+ZOR_FN(ZOR_GENERIC, Status, zoriMomentFree_64f, (MomentState* pState))
+ZOR_FN(ZOR_SSE2UP,  Status, zoriMoments64f_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, MomentState* pState))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetSpatialMoment_64f, (const MomentState* pState, int mOrd, int nOrd, int nChannel, ImagePoint roiOffset, double* pValue))
 
 /* ---- image/geometry/resize ---- */
 
