@@ -1,0 +1,355 @@
+// Row passes of the separable resize.
+//
+// A destination row is made in two passes: the rows pass combines the
+// source rows of its vertical taps, element by element, into one
+// intermediate row; the columns pass combines, for every destination
+// element, the intermediate elements of its horizontal taps (consecutive
+// pixels, C elements apart).  Three arithmetics share the passes:
+//
+//   FixedPoint   8u, at most 8 taps: weights in 1/16384 (int16); a rows term
+//                p w rounded to 1/64 of a level (the intermediate, int16), a
+//                columns term v w rounded to 1/32; the sum rounded half up
+//                and saturated.  Every rounding is (a b + 2^14) >> 15 of a
+//                16-bit a, b: the pmulhrsw instruction.
+//   FloatPoint   16u and 32f, at most 8 taps: float weights; each sum is
+//                formed in tap order, every product and addition rounded to
+//                float; 16u rounds half up and saturates.
+//   DoublePoint  wider footprints, every type: the same in double, each
+//                destination pixel with its own tap count.
+//
+// In the SSSE3 variant the columns pass gathers the taps of blocks of one
+// register's worth of destination elements with byte shuffles from 16-byte
+// windows of the intermediate row (GatherPlan), computed once per call.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+
+#include "frame/fpu.h"
+#include "frame/simd.h"
+#include "image/geometry/resize_kernels.h"
+
+namespace zor { namespace ZOR_NS { namespace {
+
+// ---- the gather plan ---------------------------------------------------------
+
+// Blocks of `lanes` destination elements whose tap-0 values lie within
+// `windows` consecutive registers of the intermediate row starting at base.
+struct GatherPlan {
+    int blocks = 0;           // whole blocks; the elements after them go the scalar way
+    int windows = 0;          // 0: no plan
+    int32_t* base = nullptr;  // per block: intermediate element of the first window
+    uint8_t* masks = nullptr; // per block and window: 16 shuffle indices
+    uint8_t* weights = nullptr;  // per block and tap: the lanes' weights (16 bytes)
+};
+
+constexpr int kMaxWindows = 4;
+
+// Intermediate element read by tap 0 of destination element e.
+template <class W>
+inline ptrdiff_t tapZero(const AxisTable<W>& x, int channels, ptrdiff_t e) {
+    return ptrdiff_t(x.first[e / channels] - x.lo) * channels + e % channels;
+}
+
+// Windows the blocks need (0 when more than kMaxWindows).
+template <class W>
+int gatherWindows(const AxisTable<W>& x, int channels, int width, int lanes) {
+    const ptrdiff_t blocks = ptrdiff_t(width) * channels / lanes;
+    ptrdiff_t widest = 0;
+    for (ptrdiff_t b = 0; b < blocks; ++b) {
+        ptrdiff_t lo = tapZero(x, channels, b * lanes), hi = lo;
+        for (int l = 1; l < lanes; ++l) {
+            const ptrdiff_t t = tapZero(x, channels, b * lanes + l);
+            lo = t < lo ? t : lo;
+            hi = t > hi ? t : hi;
+        }
+        if (hi - lo + 1 > widest) widest = hi - lo + 1;
+    }
+    const ptrdiff_t windows = (widest + lanes - 1) / lanes;
+    return blocks == 0 || windows > kMaxWindows ? 0 : int(windows);
+}
+
+// Fills a plan sized for `windows` (weights: the table's, lane by lane).
+template <class W>
+void fillGatherPlan(GatherPlan& g, const AxisTable<W>& x, int channels, int width, int lanes, int windows) {
+    const int laneBytes = 16 / lanes;
+    g.windows = windows;
+    g.blocks = int(ptrdiff_t(width) * channels / lanes);
+    for (int b = 0; b < g.blocks; ++b) {
+        ptrdiff_t base = tapZero(x, channels, ptrdiff_t(b) * lanes);
+        for (int l = 1; l < lanes; ++l) {
+            const ptrdiff_t t = tapZero(x, channels, ptrdiff_t(b) * lanes + l);
+            base = t < base ? t : base;
+        }
+        g.base[b] = int32_t(base);
+        for (int w = 0; w < windows; ++w) {
+            uint8_t* m = g.masks + (size_t(b) * windows + w) * 16;
+            for (int l = 0; l < lanes; ++l) {
+                const ptrdiff_t at = tapZero(x, channels, ptrdiff_t(b) * lanes + l) - base - ptrdiff_t(w) * lanes;
+                for (int j = 0; j < laneBytes; ++j)
+                    m[l * laneBytes + j] = at >= 0 && at < lanes ? uint8_t(at * laneBytes + j) : 0x80;
+            }
+        }
+        for (int k = 0; k < x.taps; ++k) {
+            W* lw = reinterpret_cast<W*>(g.weights + (size_t(b) * x.taps + k) * 16);
+            for (int l = 0; l < lanes; ++l) lw[l] = x.weights(int((ptrdiff_t(b) * lanes + l) / channels))[k];
+        }
+    }
+}
+
+// ---- fixed point -----------------------------------------------------------------
+
+struct FixedPoint {
+    using Weight = int16_t;
+    using Inter = int16_t;  // levels in 1/64
+    static constexpr bool kUniform = true;
+    static Weight weight(double w) { return fixedWeight(w); }
+
+    static void rows(const uint8_t* const* rows, const int16_t* w, int n, ptrdiff_t len, int16_t* out) {
+        ptrdiff_t e = 0;
+#if ZOR_SIMD >= 2
+        using B = simd::Vec<uint8_t>;
+        using H = simd::Vec<int16_t>;
+        for (; e + B::kLanes <= len; e += B::kLanes) {
+            H lo = simd::zero<H>(), hi = simd::zero<H>();
+            for (int k = 0; k < n; ++k) {
+                const B v = simd::load<B>(rows[k] + e);
+                const H wk = simd::set1<H>(w[k]);
+                lo += simd::mulHiRound(simd::shl<7>(simd::bitcast<int16_t>(simd::widenLo(v))), wk);
+                hi += simd::mulHiRound(simd::shl<7>(simd::bitcast<int16_t>(simd::widenHi(v))), wk);
+            }
+            simd::store(out + e, lo);
+            simd::store(out + e + H::kLanes, hi);
+        }
+#endif
+        for (; e < len; ++e) {
+            int acc = 0;
+            for (int k = 0; k < n; ++k) acc += simd::mulHiRound(int16_t(rows[k][e] << 7), w[k]);
+            out[e] = int16_t(acc);
+        }
+    }
+    template <class T>
+    static T column(const int16_t* p, int channels, const int16_t* w, int n) {
+        int acc = 0;
+        for (int k = 0; k < n; ++k) acc += simd::mulHiRound(p[k * channels], w[k]);
+        acc = (acc + 16) >> 5;
+        return T(acc < 0 ? 0 : acc > 255 ? 255 : acc);
+    }
+#if ZOR_SIMD >= 4
+    using Lanes = simd::Vec<int16_t>;
+    static Lanes first(Lanes v, Lanes w) { return simd::mulHiRound(v, w); }
+    static Lanes next(Lanes acc, Lanes v, Lanes w) { return acc + simd::mulHiRound(v, w); }
+    static Lanes levels(Lanes acc) { return simd::shr<5>(acc + simd::set1<Lanes>(16)); }
+    // Two blocks of results, then a lone last one.
+    template <class T>
+    static void store2(T* out, Lanes a, Lanes b) {
+        simd::store(out, simd::narrowSat<uint8_t>(levels(a), levels(b)));
+    }
+    template <class T>
+    static void store1(T* out, Lanes a) {
+        simd::storeHalf(out, simd::narrowSat<uint8_t>(levels(a), levels(a)));
+    }
+#endif
+};
+
+// ---- float -------------------------------------------------------------------------
+
+template <class T>
+inline T floatResult(float v) {
+    if constexpr (std::is_same_v<T, float>) {
+        return v;
+    } else {
+        v = v > 0 ? v : 0;
+        v = v < 65535 ? v : 65535;
+        return T(int(toFloat(v + 0.5f)));
+    }
+}
+
+struct FloatPoint {
+    using Weight = float;
+    using Inter = float;
+    static constexpr bool kUniform = true;
+    static Weight weight(double w) { return toFloat(w); }
+
+    template <class T>
+    static void rows(const T* const* rows, const float* w, int n, ptrdiff_t len, float* out) {
+        ptrdiff_t e = 0;
+#if ZOR_SIMD >= 1
+        using F = simd::Vec<float>;
+        if constexpr (std::is_same_v<T, float> || simd::kHas<uint16_t>) {
+            for (; e + F::kLanes <= len; e += F::kLanes) {
+                F acc = simd::set1<F>(w[0]) * lanes(rows[0] + e);
+                for (int k = 1; k < n; ++k) acc += simd::set1<F>(w[k]) * lanes(rows[k] + e);
+                simd::store(out + e, acc);
+            }
+        }
+#endif
+        for (; e < len; ++e) {
+            float acc = toFloat(w[0] * float(rows[0][e]));
+            for (int k = 1; k < n; ++k) acc = toFloat(acc + toFloat(w[k] * float(rows[k][e])));
+            out[e] = acc;
+        }
+    }
+    template <class T>
+    static T column(const float* p, int channels, const float* w, int n) {
+        float acc = toFloat(w[0] * p[0]);
+        for (int k = 1; k < n; ++k) acc = toFloat(acc + toFloat(w[k] * p[k * channels]));
+        return floatResult<T>(acc);
+    }
+#if ZOR_SIMD >= 1
+    using Lanes = simd::Vec<float>;
+    static Lanes lanes(const float* p) { return simd::load<Lanes>(p); }
+#  if ZOR_SIMD >= 2
+    static Lanes lanes(const uint16_t* p) {
+        using U = simd::Vec<uint16_t>;
+        return simd::toFloat(simd::bitcast<int32_t>(simd::widenLo(simd::loadHalf<U>(p))));
+    }
+#  endif
+#endif
+#if ZOR_SIMD >= 4
+    static Lanes first(Lanes v, Lanes w) { return v * w; }
+    static Lanes next(Lanes acc, Lanes v, Lanes w) { return acc + v * w; }
+    static simd::Vec<int32_t> levels(Lanes acc) {
+        const Lanes v = simd::min(simd::max(acc, simd::zero<Lanes>()), simd::set1<Lanes>(65535.0f));
+        return simd::toInt32Trunc(v + simd::set1<Lanes>(0.5f));
+    }
+    template <class T>
+    static void store2(T* out, Lanes a, Lanes b) {
+        if constexpr (std::is_same_v<T, float>) {
+            simd::store(out, a);
+            simd::store(out + Lanes::kLanes, b);
+        } else {
+            simd::store(out, simd::narrowSat<uint16_t>(levels(a), levels(b)));
+        }
+    }
+    template <class T>
+    static void store1(T* out, Lanes a) {
+        if constexpr (std::is_same_v<T, float>) simd::store(out, a);
+        else simd::storeHalf(out, simd::narrowSat<uint16_t>(levels(a), levels(a)));
+    }
+#endif
+};
+
+// ---- double --------------------------------------------------------------------------
+
+template <class T>
+inline T doubleResult(double v) {
+    if constexpr (std::is_same_v<T, float>) {
+        return toFloat(v);
+    } else {
+        constexpr double top = std::is_same_v<T, uint8_t> ? 255.0 : 65535.0;
+        v = v > 0 ? v : 0;
+        v = v < top ? v : top;
+        return T(int(toDouble(v + 0.5)));
+    }
+}
+
+struct DoublePoint {
+    using Weight = double;
+    using Inter = double;
+    static constexpr bool kUniform = false;
+    static Weight weight(double w) { return w; }
+
+    template <class T>
+    static void rows(const T* const* rows, const double* w, int n, ptrdiff_t len, double* out) {
+        for (ptrdiff_t e = 0; e < len; ++e) {
+            double acc = toDouble(w[0] * double(rows[0][e]));
+            for (int k = 1; k < n; ++k) acc = toDouble(acc + toDouble(w[k] * double(rows[k][e])));
+            out[e] = acc;
+        }
+    }
+    template <class T>
+    static T column(const double* p, int channels, const double* w, int n) {
+        double acc = toDouble(w[0] * p[0]);
+        for (int k = 1; k < n; ++k) acc = toDouble(acc + toDouble(w[k] * p[k * channels]));
+        return doubleResult<T>(acc);
+    }
+};
+
+// ---- the columns pass ------------------------------------------------------------------
+
+// Destination elements [from, to) the scalar way.
+template <class A, class T>
+void columnsScalar(const typename A::Inter* in, const AxisTable<typename A::Weight>& x, int channels,
+                   ptrdiff_t from, ptrdiff_t to, T* out) {
+    for (ptrdiff_t e = from; e < to; ++e) {
+        const int i = int(e / channels);
+        out[e] = A::template column<T>(in + tapZero(x, channels, e), channels, x.weights(i), x.count(i));
+    }
+}
+
+#if ZOR_SIMD >= 4
+template <class A, int Windows, class T>
+void columnsGathered(const typename A::Inter* in, const GatherPlan& g, int taps, int channels, T* out) {
+    using L = typename A::Lanes;
+    using B = simd::Vec<uint8_t>;
+    constexpr int n = L::kLanes;
+    const auto tap = [&](int b, int k) {
+        const typename A::Inter* p = in + g.base[b] + k * channels;
+        const uint8_t* m = g.masks + size_t(b) * Windows * 16;
+        B v = simd::shuffleBytes(simd::loadFrom<B>(p), simd::load<B>(m));
+        for (int w = 1; w < Windows; ++w)
+            v = v | simd::shuffleBytes(simd::loadFrom<B>(p + w * n), simd::load<B>(m + 16 * w));
+        return simd::bitcast<typename L::Lane>(v);
+    };
+    const auto block = [&](int b) {
+        const auto* w = reinterpret_cast<const typename A::Weight*>(g.weights + size_t(b) * taps * 16);
+        L acc = A::first(tap(b, 0), simd::load<L>(w));
+        for (int k = 1; k < taps; ++k) acc = A::next(acc, tap(b, k), simd::load<L>(w + k * n));
+        return acc;
+    };
+    int b = 0;
+    for (; b + 2 <= g.blocks; b += 2) A::template store2<T>(out + ptrdiff_t(b) * n, block(b), block(b + 1));
+    if (b < g.blocks) A::template store1<T>(out + ptrdiff_t(b) * n, block(b));
+}
+#endif
+
+// A destination row from the intermediate row.
+template <class A, class T>
+void columns(const typename A::Inter* in, const AxisTable<typename A::Weight>& x, const GatherPlan& g, int channels,
+             int width, T* out) {
+    ptrdiff_t done = 0;
+    (void)g;  // a plan exists from SSSE3 on
+#if ZOR_SIMD >= 4
+    if constexpr (A::kUniform) {
+        switch (g.windows) {
+        case 1: columnsGathered<A, 1>(in, g, x.taps, channels, out); break;
+        case 2: columnsGathered<A, 2>(in, g, x.taps, channels, out); break;
+        case 3: columnsGathered<A, 3>(in, g, x.taps, channels, out); break;
+        case 4: columnsGathered<A, 4>(in, g, x.taps, channels, out); break;
+        default: break;
+        }
+        if (g.windows) done = ptrdiff_t(g.blocks) * (16 / sizeof(typename A::Inter));
+    }
+#endif
+    columnsScalar<A>(in, x, channels, done, ptrdiff_t(width) * channels, out);
+}
+
+// ---- 2 x 2 averages ---------------------------------------------------------------
+
+// out[i] = (r0[2i] + r0[2i + 1] + r1[2i] + r1[2i + 1] + 2) >> 2.
+inline void average2x2(const uint8_t* r0, const uint8_t* r1, uint8_t* out, int width) {
+    int i = 0;
+#if ZOR_SIMD >= 2
+    using B = simd::Vec<uint8_t>;
+    using U = simd::Vec<uint16_t>;
+    const auto pairs = [](B v) {
+#  if ZOR_SIMD >= 4
+        return simd::bitcast<uint16_t>(simd::mulAddPairs(v, simd::set1<simd::Vec<int8_t>>(1)));
+#  else
+        const U u = simd::bitcast<uint16_t>(v);
+        return (u & simd::set1<U>(0xFF)) + simd::shr<8>(u);
+#  endif
+    };
+    const U two = simd::set1<U>(2);
+    for (; i + B::kLanes <= width; i += B::kLanes) {
+        const U lo = pairs(simd::load<B>(r0 + 2 * i)) + pairs(simd::load<B>(r1 + 2 * i));
+        const U hi = pairs(simd::load<B>(r0 + 2 * i + B::kLanes)) + pairs(simd::load<B>(r1 + 2 * i + B::kLanes));
+        simd::store(out + i, simd::narrowSat<uint8_t>(simd::shr<2>(lo + two), simd::shr<2>(hi + two)));
+    }
+#endif
+    for (; i < width; ++i) out[i] = uint8_t((r0[2 * i] + r0[2 * i + 1] + r1[2 * i] + r1[2 * i + 1] + 2) >> 2);
+}
+
+}}}  // namespace zor::ZOR_NS::(anonymous)
