@@ -77,3 +77,14 @@ ZB_PAIR(resize_sup_c1, "zoriResize_8u_C1R super 1920x1080>960x540", zorSuperC1, 
 ZB_PAIR(resize_lin_f1, "zoriResize_32f_C1R linear 1920x1080>1280x720", zorLinearF1, cvLinearF1, "cv::resize INTER_LINEAR", 1.0);
 ZB_PAIR(resize_sup_c3, "zoriResize_8u_C3R super 1920x1080>1280x720", zorSuperC3, cvAreaC3, "cv::resize INTER_AREA", 0);
 ZB_PAIR(resize_lan_c3, "zoriResize_8u_C3R Lanczos 1920x1080>1280x720", zorLanczosC3, cvLanczosC3, "cv::resize INTER_LANCZOS4", 0);
+namespace {
+void zorThumbC3(benchmark::State& st) { zorResize<uint8_t>(st, zoriResize_8u_C3R, CV_8UC3, 160, 90, InterSuper); }
+void cvThumbC3(benchmark::State& st) { cvResize(st, CV_8UC3, 160, 90, cv::INTER_AREA); }
+void zorNearestC3(benchmark::State& st) { zorResize<uint8_t>(st, zoriResize_8u_C3R, CV_8UC3, 1280, 720, InterNearest); }
+void cvNearestC3(benchmark::State& st) { cvResize(st, CV_8UC3, 1280, 720, cv::INTER_NEAREST); }
+void zorUpC3(benchmark::State& st) { zorResize<uint8_t>(st, zoriResize_8u_C3R, CV_8UC3, 2880, 1620, InterLinear); }
+void cvUpC3(benchmark::State& st) { cvResize(st, CV_8UC3, 2880, 1620, cv::INTER_LINEAR); }
+}
+ZB_PAIR(resize_thumb_c3, "zoriResize_8u_C3R super 1920x1080>160x90", zorThumbC3, cvThumbC3, "cv::resize INTER_AREA", 0);
+ZB_PAIR(resize_nn_c3, "zoriResize_8u_C3R nearest 1920x1080>1280x720", zorNearestC3, cvNearestC3, "cv::resize INTER_NEAREST", 0);
+ZB_PAIR(resize_up_c3, "zoriResize_8u_C3R linear 1920x1080>2880x1620", zorUpC3, cvUpC3, "cv::resize INTER_LINEAR", 0);

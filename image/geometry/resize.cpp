@@ -295,20 +295,22 @@ Status separable(const T* src, ImageSize srcSize, int srcStep, T* dst, int dstSt
     using I = typename A::Inter;
     const int dw = dstSize.width, dh = dstSize.height, sw = srcSize.width, sh = srcSize.height;
 
+    // Columns of narrow footprints may be gathered: their table is uniform.
+    const bool gathered = A::template kGathers<T> && sx.widest <= kGatherTaps;
     AxisTable<W> xt, yt;
     double* scratch = nullptr;
     void* tables = allocateLayout([&](Carve& c) {
         xt.first = c.template take<int32_t>(dw);
         xt.offset = c.template take<int32_t>(dw + 1);
-        xt.weight = c.template take<W>(sx.entries(A::kUniform, dw));
+        xt.weight = c.template take<W>(sx.entries(gathered, dw));
         yt.first = c.template take<int32_t>(dh);
         yt.offset = c.template take<int32_t>(dh + 1);
-        yt.weight = c.template take<W>(sy.entries(A::kUniform, dh));
+        yt.weight = c.template take<W>(sy.total);
         scratch = c.template take<double>(sx.widest > sy.widest ? sx.widest : sy.widest);
     });
     if (!tables) return StatusNoMemory;
-    fillAxisTable(xt, mx, mode, dw, sw, A::kUniform, sx.widest, A::weight, scratch);
-    fillAxisTable(yt, my, mode, dh, sh, A::kUniform, sy.widest, A::weight, scratch);
+    fillAxisTable(xt, mx, mode, dw, sw, gathered, sx.widest, A::weight, scratch);
+    fillAxisTable(yt, my, mode, dh, sh, false, sy.widest, A::weight, scratch);
 
     // The intermediate row holds source pixels [xt.lo, xt.hi); the image's
     // own columns are computed, those beyond its edges copied from them.
@@ -318,7 +320,7 @@ Status separable(const T* src, ImageSize srcSize, int srcStep, T* dst, int dstSt
     GatherPlan plan;
     int windows = 0;
 #if ZOR_SIMD >= 4
-    if constexpr (A::kUniform) windows = gatherWindows(xt, C, dw, lanes);
+    if (gathered) windows = gatherWindows(xt, C, dw, lanes);
 #endif
     const int64_t blocks = windows ? int64_t(dw) * C / lanes : 0;
     const T** rows = nullptr;
@@ -375,12 +377,13 @@ Status resizeEngine(const T* src, ImageSize srcSize, int srcStep, T* dst, int ds
     }
     const AxisShape sx = axisShape(mx, mode, dstSize.width, srcSize.width);
     const AxisShape sy = axisShape(my, mode, dstSize.height, srcSize.height);
-    if (sx.widest <= 8 && sy.widest <= 8) {
-        if constexpr (std::is_same_v<T, uint8_t>)
+    // The arithmetic by the widest footprint (see resize_rows.h for the bounds).
+    const int widest = sx.widest > sy.widest ? sx.widest : sy.widest;
+    if constexpr (std::is_same_v<T, uint8_t>)
+        if (widest <= kGatherTaps)
             return separable<FixedPoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
-        else
-            return separable<FloatPoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
-    }
+    if (widest <= (std::is_same_v<T, uint8_t> ? 1024 : std::is_same_v<T, float> ? 64 : kGatherTaps))
+        return separable<FloatPoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
     return separable<DoublePoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
 }
 

@@ -171,6 +171,7 @@ inline int axisTaps(const AxisMap& m, int mode, int i, int n, int& first, double
 // with zero weights); others keep each pixel's own count.
 template <class W>
 struct AxisTable {
+    bool uniform = false;
     int taps = 0;       // uniform: taps per destination pixel; otherwise the widest
     int lo = 0, hi = 0; // source pixels the taps read: [lo, hi)
     int32_t* first = nullptr;   // per destination pixel
@@ -205,6 +206,7 @@ inline AxisShape axisShape(const AxisMap& m, int mode, int d, int n) {
 template <class W, class Quantize>
 void fillAxisTable(AxisTable<W>& t, const AxisMap& m, int mode, int d, int n, bool uniform, int widest,
                    Quantize quantize, double* scratch) {
+    t.uniform = uniform;
     t.taps = widest;
     t.lo = n;
     t.hi = 0;

@@ -98,12 +98,27 @@ void fillGatherPlan(GatherPlan& g, const AxisTable<W>& x, int channels, int widt
     }
 }
 
+// Calls body(std::integral_constant<int, N>()) with N the tap count where it
+// is one of the kernels' (2, 4, 6), so that loops over taps unroll, else 0.
+template <class Body>
+inline void withTaps(int n, Body body) {
+    switch (n) {
+    case 2: body(std::integral_constant<int, 2>()); break;
+    case 4: body(std::integral_constant<int, 4>()); break;
+    case 6: body(std::integral_constant<int, 6>()); break;
+    default: body(std::integral_constant<int, 0>()); break;
+    }
+}
+
+constexpr int kGatherTaps = 8;  // the widest uniform tables (gathered columns, fixed point)
+
 // ---- fixed point -----------------------------------------------------------------
 
 struct FixedPoint {
     using Weight = int16_t;
     using Inter = int16_t;  // levels in 1/64
-    static constexpr bool kUniform = true;
+    template <class T>
+    static constexpr bool kGathers = true;
     static Weight weight(double w) { return fixedWeight(w); }
 
     static void rows(const uint8_t* const* rows, const int16_t* w, int n, ptrdiff_t len, int16_t* out) {
@@ -111,17 +126,21 @@ struct FixedPoint {
 #if ZOR_SIMD >= 2
         using B = simd::Vec<uint8_t>;
         using H = simd::Vec<int16_t>;
-        for (; e + B::kLanes <= len; e += B::kLanes) {
-            H lo = simd::zero<H>(), hi = simd::zero<H>();
-            for (int k = 0; k < n; ++k) {
-                const B v = simd::load<B>(rows[k] + e);
-                const H wk = simd::set1<H>(w[k]);
-                lo += simd::mulHiRound(simd::shl<7>(simd::bitcast<int16_t>(simd::widenLo(v))), wk);
-                hi += simd::mulHiRound(simd::shl<7>(simd::bitcast<int16_t>(simd::widenHi(v))), wk);
+        H wv[kGatherTaps];
+        for (int k = 0; k < n; ++k) wv[k] = simd::set1<H>(w[k]);
+        withTaps(n, [&](auto count) {
+            const int taps = count ? int(count) : n;
+            for (; e + B::kLanes <= len; e += B::kLanes) {
+                H lo = simd::zero<H>(), hi = simd::zero<H>();
+                for (int k = 0; k < taps; ++k) {
+                    const B v = simd::load<B>(rows[k] + e);
+                    lo += simd::mulHiRound(simd::shl<7>(simd::bitcast<int16_t>(simd::widenLo(v))), wv[k]);
+                    hi += simd::mulHiRound(simd::shl<7>(simd::bitcast<int16_t>(simd::widenHi(v))), wv[k]);
+                }
+                simd::store(out + e, lo);
+                simd::store(out + e + H::kLanes, hi);
             }
-            simd::store(out + e, lo);
-            simd::store(out + e + H::kLanes, hi);
-        }
+        });
 #endif
         for (; e < len; ++e) {
             int acc = 0;
@@ -160,8 +179,9 @@ inline T floatResult(float v) {
     if constexpr (std::is_same_v<T, float>) {
         return v;
     } else {
+        constexpr float top = std::is_same_v<T, uint8_t> ? 255.0f : 65535.0f;
         v = v > 0 ? v : 0;
-        v = v < 65535 ? v : 65535;
+        v = v < top ? v : top;
         return T(int(toFloat(v + 0.5f)));
     }
 }
@@ -169,7 +189,8 @@ inline T floatResult(float v) {
 struct FloatPoint {
     using Weight = float;
     using Inter = float;
-    static constexpr bool kUniform = true;
+    template <class T>
+    static constexpr bool kGathers = !std::is_same_v<T, uint8_t>;
     static Weight weight(double w) { return toFloat(w); }
 
     template <class T>
@@ -178,11 +199,40 @@ struct FloatPoint {
 #if ZOR_SIMD >= 1
         using F = simd::Vec<float>;
         if constexpr (std::is_same_v<T, float> || simd::kHas<uint16_t>) {
-            for (; e + F::kLanes <= len; e += F::kLanes) {
-                F acc = simd::set1<F>(w[0]) * lanes(rows[0] + e);
-                for (int k = 1; k < n; ++k) acc += simd::set1<F>(w[k]) * lanes(rows[k] + e);
-                simd::store(out + e, acc);
+            const ptrdiff_t whole = len / (2 * F::kLanes) * (2 * F::kLanes);
+            if (n <= kGatherTaps) {
+                F wv[kGatherTaps];
+                for (int k = 0; k < n; ++k) wv[k] = simd::set1<F>(w[k]);
+                withTaps(n, [&](auto count) {
+                    const int taps = count ? int(count) : n;
+                    for (ptrdiff_t i = 0; i < whole; i += 2 * F::kLanes) {
+                        F a, b, pa, pb;
+                        lanes(rows[0] + i, pa, pb);
+                        a = wv[0] * pa;
+                        b = wv[0] * pb;
+                        for (int k = 1; k < taps; ++k) {
+                            lanes(rows[k] + i, pa, pb);
+                            a += wv[k] * pa;
+                            b += wv[k] * pb;
+                        }
+                        simd::store(out + i, a);
+                        simd::store(out + i + F::kLanes, b);
+                    }
+                });
+            } else {
+                // Wide footprints one source row at a time (the same sums).
+                for (int k = 0; k < n; ++k) {
+                    const F wk = simd::set1<F>(w[k]);
+                    for (ptrdiff_t i = 0; i < whole; i += 2 * F::kLanes) {
+                        F pa, pb;
+                        lanes(rows[k] + i, pa, pb);
+                        const F a = wk * pa, b = wk * pb;
+                        simd::store(out + i, k ? simd::load<F>(out + i) + a : a);
+                        simd::store(out + i + F::kLanes, k ? simd::load<F>(out + i + F::kLanes) + b : b);
+                    }
+                }
             }
+            e = whole;
         }
 #endif
         for (; e < len; ++e) {
@@ -191,22 +241,32 @@ struct FloatPoint {
             out[e] = acc;
         }
     }
+#if ZOR_SIMD >= 1
+    using Lanes = simd::Vec<float>;
+    // Two registers of source elements as floats.
+    static void lanes(const float* p, Lanes& a, Lanes& b) {
+        a = simd::load<Lanes>(p);
+        b = simd::load<Lanes>(p + Lanes::kLanes);
+    }
+#  if ZOR_SIMD >= 2
+    static void lanes(const uint16_t* p, Lanes& a, Lanes& b) {
+        const auto v = simd::load<simd::Vec<uint16_t>>(p);
+        a = simd::toFloat(simd::bitcast<int32_t>(simd::widenLo(v)));
+        b = simd::toFloat(simd::bitcast<int32_t>(simd::widenHi(v)));
+    }
+    static void lanes(const uint8_t* p, Lanes& a, Lanes& b) {
+        const auto v = simd::widenLo(simd::loadHalf<simd::Vec<uint8_t>>(p));
+        a = simd::toFloat(simd::bitcast<int32_t>(simd::widenLo(v)));
+        b = simd::toFloat(simd::bitcast<int32_t>(simd::widenHi(v)));
+    }
+#  endif
+#endif
     template <class T>
     static T column(const float* p, int channels, const float* w, int n) {
         float acc = toFloat(w[0] * p[0]);
         for (int k = 1; k < n; ++k) acc = toFloat(acc + toFloat(w[k] * p[k * channels]));
         return floatResult<T>(acc);
     }
-#if ZOR_SIMD >= 1
-    using Lanes = simd::Vec<float>;
-    static Lanes lanes(const float* p) { return simd::load<Lanes>(p); }
-#  if ZOR_SIMD >= 2
-    static Lanes lanes(const uint16_t* p) {
-        using U = simd::Vec<uint16_t>;
-        return simd::toFloat(simd::bitcast<int32_t>(simd::widenLo(simd::loadHalf<U>(p))));
-    }
-#  endif
-#endif
 #if ZOR_SIMD >= 4
     static Lanes first(Lanes v, Lanes w) { return v * w; }
     static Lanes next(Lanes acc, Lanes v, Lanes w) { return acc + v * w; }
@@ -248,7 +308,8 @@ inline T doubleResult(double v) {
 struct DoublePoint {
     using Weight = double;
     using Inter = double;
-    static constexpr bool kUniform = false;
+    template <class T>
+    static constexpr bool kGathers = false;
     static Weight weight(double w) { return w; }
 
     template <class T>
@@ -280,28 +341,37 @@ void columnsScalar(const typename A::Inter* in, const AxisTable<typename A::Weig
 }
 
 #if ZOR_SIMD >= 4
-template <class A, int Windows, class T>
+// Whole blocks: per tap, its lanes shuffled out of the windows.  Taps is
+// the tap count where it is a constant (else 0: taps).
+template <class A, int Windows, int Taps, class T>
 void columnsGathered(const typename A::Inter* in, const GatherPlan& g, int taps, int channels, T* out) {
     using L = typename A::Lanes;
     using B = simd::Vec<uint8_t>;
     constexpr int n = L::kLanes;
-    const auto tap = [&](int b, int k) {
-        const typename A::Inter* p = in + g.base[b] + k * channels;
-        const uint8_t* m = g.masks + size_t(b) * Windows * 16;
-        B v = simd::shuffleBytes(simd::loadFrom<B>(p), simd::load<B>(m));
-        for (int w = 1; w < Windows; ++w)
-            v = v | simd::shuffleBytes(simd::loadFrom<B>(p + w * n), simd::load<B>(m + 16 * w));
-        return simd::bitcast<typename L::Lane>(v);
-    };
-    const auto block = [&](int b) {
-        const auto* w = reinterpret_cast<const typename A::Weight*>(g.weights + size_t(b) * taps * 16);
-        L acc = A::first(tap(b, 0), simd::load<L>(w));
-        for (int k = 1; k < taps; ++k) acc = A::next(acc, tap(b, k), simd::load<L>(w + k * n));
-        return acc;
-    };
-    int b = 0;
-    for (; b + 2 <= g.blocks; b += 2) A::template store2<T>(out + ptrdiff_t(b) * n, block(b), block(b + 1));
-    if (b < g.blocks) A::template store1<T>(out + ptrdiff_t(b) * n, block(b));
+    const int m = Taps ? Taps : taps;
+    L done[2];
+    for (int b = 0; b < g.blocks; ++b) {
+        const typename A::Inter* p = in + g.base[b];
+        B masks[Windows];
+        for (int w = 0; w < Windows; ++w) masks[w] = simd::load<B>(g.masks + (size_t(b) * Windows + w) * 16);
+        const auto* weights = reinterpret_cast<const typename A::Weight*>(g.weights + size_t(b) * m * 16);
+        L acc;
+        for (int k = 0; k < m; ++k) {
+            const typename A::Inter* q = p + k * channels;
+            B v = simd::shuffleBytes(simd::loadFrom<B>(q), masks[0]);
+            for (int w = 1; w < Windows; ++w) v = v | simd::shuffleBytes(simd::loadFrom<B>(q + w * n), masks[w]);
+            const L x = simd::bitcast<typename L::Lane>(v), wk = simd::load<L>(weights + k * n);
+            acc = k ? A::next(acc, x, wk) : A::first(x, wk);
+        }
+        done[b & 1] = acc;
+        if (b & 1) A::template store2<T>(out + ptrdiff_t(b - 1) * n, done[0], done[1]);
+    }
+    if (g.blocks & 1) A::template store1<T>(out + ptrdiff_t(g.blocks - 1) * n, done[0]);
+}
+
+template <class A, int Windows, class T>
+void columnsGathered(const typename A::Inter* in, const GatherPlan& g, int taps, int channels, T* out) {
+    withTaps(taps, [&](auto count) { columnsGathered<A, Windows, decltype(count)::value>(in, g, taps, channels, out); });
 }
 #endif
 
@@ -312,7 +382,7 @@ void columns(const typename A::Inter* in, const AxisTable<typename A::Weight>& x
     ptrdiff_t done = 0;
     (void)g;  // a plan exists from SSSE3 on
 #if ZOR_SIMD >= 4
-    if constexpr (A::kUniform) {
+    if constexpr (A::template kGathers<T>) {
         switch (g.windows) {
         case 1: columnsGathered<A, 1>(in, g, x.taps, channels, out); break;
         case 2: columnsGathered<A, 2>(in, g, x.taps, channels, out); break;
