@@ -459,10 +459,11 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
  * whose taps include it, even at weight 0.  Every variant gives the same
  * bits.  How: 8u with at most 8 taps a direction: weights in 1/16384,
  * rows combined to 1/64 of a level, columns to 1/32, the sum rounded half
- * up (the fixed-point value stays within 0.32 of the exact one); 16u and
- * 32f with at most 8 taps: float weights, sums formed in order in float;
- * wider super-sampling footprints: double.  8u super-sampling by exactly
- * 0.5 x 0.5 inside the image: (sum of the 2 x 2 pixels + 2) / 4.
+ * up (the fixed-point value stays within 0.32 of the exact one); float
+ * weights and sums formed in tap order in float for 16u with at most 8
+ * taps, 32f with at most 32 and 8u with at most 1024; double beyond.  8u
+ * super-sampling by exactly 0.5 x 0.5 inside the image: (sum of the 2 x 2
+ * pixels + 2) / 4.
  *
  * The 8u exports first apply a read guard: with interpolation 8 and an odd
  * ROI height, when the srcStep bytes after the image (srcSize.height rows

@@ -382,7 +382,7 @@ Status resizeEngine(const T* src, ImageSize srcSize, int srcStep, T* dst, int ds
     if constexpr (std::is_same_v<T, uint8_t>)
         if (widest <= kGatherTaps)
             return separable<FixedPoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
-    if (widest <= (std::is_same_v<T, uint8_t> ? 1024 : std::is_same_v<T, float> ? 64 : kGatherTaps))
+    if (widest <= (std::is_same_v<T, uint8_t> ? 1024 : std::is_same_v<T, float> ? 32 : kGatherTaps))
         return separable<FloatPoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
     return separable<DoublePoint, T, C>(src, srcSize, srcStep, dst, dstStep, dstSize, mx, my, mode, sx, sy);
 }

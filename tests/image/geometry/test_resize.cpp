@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "frame/attach.h"
+#include "frame/fpu.h"
 #include "frame/memory.h"
 #include "tests/support/agree.h"
 #include "tests/support/checks.h"
@@ -79,6 +80,7 @@ template <class T>
 void expectDefinition(const zt::GuardedImage<T>& d, int channels, const Axis& ax, const Axis& ay, int mode,
                       ImageSize src, const std::function<double(int, int)>& get,
                       const std::function<bool(int, int)>& written = nullptr) {
+    zor::DoublePrecisionScope precision;  // x87: round as double (nearest ties)
     for (int j = 0; j < d.height(); ++j)
         for (int e = 0; e < d.width(); ++e) {
             const int i = e / channels;
@@ -204,19 +206,18 @@ TEST_P(Resize, ShiftedAndCentredMappings) {
         }
         // about (10.3, 7): pixels sampling outside the ROI stay untouched
         for (auto [fx, fy] : {std::pair{2.5, 0.6}, std::pair{0.4, 1.7}}) {
-            zt::GuardedImage<uint8_t> d1(40, 21), d3(40 * 3, 21);
             const Axis ax{[&](int i) { return 10.3 + (i - 10.3) * (1 / fx); }, 1 / fx};
             const Axis ay{[&](int i) { return 7 + (i - 7.0) * (1 / fy); }, 1 / fy};
             const auto inside = [&](int i, int j) {
                 return ax.at(i) >= roi.x - 0.5 && ax.at(i) < roi.x + roi.width - 0.5 && ay.at(j) >= roi.y - 0.5 &&
                        ay.at(j) < roi.y + roi.height - 0.5;
             };
-            ASSERT_EQ(z().zoriResizeCenter_8u_C3R(s.roi(), src, s.step(), roi, d3.roi(), d3.step(), {40, 21}, fx, fy,
-                                                  10.3, 7, mode), StatusOk);
-            expectDefinition(d3, 3, ax, ay, mode, src, get, inside);
-            ASSERT_EQ(z().zoriResizeCenter_8u_C1R(s.roi(), src, s.step(), roi, d1.roi(), d1.step(), {40, 21}, fx, fy,
-                                                  10.3, 7, mode), StatusOk);
-            expectDefinition(d1, 1, ax, ay, mode, src, get, inside);  // a third of each row as one channel
+            for (int ch : {1, 3}) {  // one channel: a third of each row
+                zt::GuardedImage<uint8_t> d(40 * ch, 21);
+                const auto fn = ch == 1 ? z().zoriResizeCenter_8u_C1R : z().zoriResizeCenter_8u_C3R;
+                ASSERT_EQ(fn(s.roi(), src, s.step(), roi, d.roi(), d.step(), {40, 21}, fx, fy, 10.3, 7, mode), 0);
+                expectDefinition(d, ch, ax, ay, mode, src, get, inside);
+            }
         }
     }
 }
@@ -249,12 +250,11 @@ TEST_P(Resize, Checks) {
                      {zt::watch(dst)}, zt::eachNull(), zt::bad(StatusBadSize, zt::arg<1>(ImageSize{0, 10})),
                      zt::bad(StatusBadSize, zt::arg<3>(ImageRect{0, 0, 12, 0})),
                      zt::bad(StatusBadSize, zt::arg<6>(ImageSize{6, -1})), zt::bad(StatusBadStep, zt::arg<2>(0)),
-                     zt::bad(StatusBadStep, zt::arg<5>(-24)),
                      zt::bad(StatusWarnNoOperation, zt::arg<3>(ImageRect{12, 0, 1, 1})),
                      zt::bad(StatusWarnNoOperation, zt::arg<3>(ImageRect{0, -1, 1, 1})),
                      zt::bad(StatusBadResizeFactor, zt::arg<7>(0.0)), zt::bad(StatusBadResizeFactor, zt::arg<8>(NAN)),
                      zt::bad(StatusBadInterpolation, zt::arg<9>(3)),
-                     zt::bad(StatusBadStep, zt::arg<5>(0), zt::arg<7>(-1.0), zt::arg<9>(0)),
+                     zt::bad(StatusBadStep, zt::arg<5>(-24), zt::arg<7>(-1.0), zt::arg<9>(0)),
                      zt::bad(StatusWarnNoOperation, zt::arg<3>(ImageRect{0, 10, 1, 1}), zt::arg<7>(-1.0)),
                      zt::bad(StatusBadResizeFactor, zt::arg<7>(-1.0), zt::arg<9>(0)));
     std::vector<uint8_t> s8(12 * 10 * 3), d8(6 * 5 * 3);
@@ -376,8 +376,7 @@ TEST(ResizeMarker, CopyOfTheLibraryBesideAMarkerFile) {
         EXPECT_EQ(resize(nullptr, {6, 5}, 18, {0, 0, 6, 4}, out, 6, {2, 2}, 0.5, 0.5, InterSuper),
                   marker && zt::variantSupported(2) ? StatusOk : StatusNullPointer);
         close(h);
-        std::remove(lib.c_str());
-        std::remove((base + ".xml").c_str());
+        std::remove(lib.c_str()), std::remove((base + ".xml").c_str());
     }
 }
 
