@@ -147,22 +147,15 @@ Status resizeCenter(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRe
 
 // ---- exports ------------------------------------------------------------------------------
 
+#define ZOR_RESIZE_EXPORT(name, T, call)                                                                        \
+    Status ZOR_CALL name(const T* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, T* pDst, int dstStep, \
+                         ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation) {            \
+        return call(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoiSize, xFactor, yFactor, interpolation); \
+    }
 #if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
-Status ZOR_CALL zoriResize_8u_C1R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                  uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor,
-                                  int interpolation) {
-    return resize8u<1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoiSize, xFactor, yFactor, interpolation);
-}
-Status ZOR_CALL zoriResize_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                  uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor,
-                                  int interpolation) {
-    return resize8u<3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoiSize, xFactor, yFactor, interpolation);
-}
-Status ZOR_CALL zoriResize_8u_C4R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                  uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor,
-                                  int interpolation) {
-    return resize8u<4>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoiSize, xFactor, yFactor, interpolation);
-}
+ZOR_RESIZE_EXPORT(zoriResize_8u_C1R, uint8_t, resize8u<1>)
+ZOR_RESIZE_EXPORT(zoriResize_8u_C3R, uint8_t, resize8u<3>)
+ZOR_RESIZE_EXPORT(zoriResize_8u_C4R, uint8_t, resize8u<4>)
 
 Status ZOR_CALL zoriResizeShift_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
                                        uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFr, double yFr,
@@ -189,18 +182,12 @@ Status ZOR_CALL zoriResizeCenter_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, 
 }
 #endif
 
-#define ZOR_RESIZE_EXPORT(name, T, C)                                                                          \
-    Status ZOR_CALL name(const T* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, T* pDst, int dstStep, \
-                         ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation) {            \
-        return resizePlain<T, C>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoiSize, xFactor, yFactor, \
-                                 interpolation);                                                               \
-    }
-ZOR_RESIZE_EXPORT(zoriResize_16u_C1R, uint16_t, 1)
-ZOR_RESIZE_EXPORT(zoriResize_16u_C3R, uint16_t, 3)
-ZOR_RESIZE_EXPORT(zoriResize_16u_C4R, uint16_t, 4)
-ZOR_RESIZE_EXPORT(zoriResize_32f_C1R, float, 1)
-ZOR_RESIZE_EXPORT(zoriResize_32f_C3R, float, 3)
-ZOR_RESIZE_EXPORT(zoriResize_32f_C4R, float, 4)
+ZOR_RESIZE_EXPORT(zoriResize_16u_C1R, uint16_t, (resizePlain<uint16_t, 1>))
+ZOR_RESIZE_EXPORT(zoriResize_16u_C3R, uint16_t, (resizePlain<uint16_t, 3>))
+ZOR_RESIZE_EXPORT(zoriResize_16u_C4R, uint16_t, (resizePlain<uint16_t, 4>))
+ZOR_RESIZE_EXPORT(zoriResize_32f_C1R, float, (resizePlain<float, 1>))
+ZOR_RESIZE_EXPORT(zoriResize_32f_C3R, float, (resizePlain<float, 3>))
+ZOR_RESIZE_EXPORT(zoriResize_32f_C4R, float, (resizePlain<float, 4>))
 #undef ZOR_RESIZE_EXPORT
 
 #if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
@@ -271,11 +258,24 @@ Status resizeNearest(const T* src, ImageSize srcSize, int srcStep, T* dst, int d
     void* block = allocateLayout([&](Carve& c) { xs = c.template take<int32_t>(dstSize.width); });
     if (!block) return StatusNoMemory;
     for (int x = 0; x < dstSize.width; ++x) xs[x] = nearestPixel(mx, x, srcSize.width) * C;
+    // Three-byte pixels move as four bytes (the next pixel rewrites the
+    // fourth) wherever the source row has the byte after them.
+    int wide = 0;
+    if constexpr (sizeof(T) * C == 3)
+        while (wide < dstSize.width - 1 && xs[wide] < (srcSize.width - 1) * C) ++wide;
+    const size_t rowBytes = size_t(dstSize.width) * C * sizeof(T);
+    int previous = -1;
     for (int y = 0; y < dstSize.height; ++y) {
-        const T* s = rowAt(src, srcStep, nearestPixel(my, y, srcSize.height));
+        const int sy = nearestPixel(my, y, srcSize.height);
         T* d = rowAt(dst, dstStep, y);
-        for (int x = 0; x < dstSize.width; ++x)
-            for (int c = 0; c < C; ++c) d[x * C + c] = s[xs[x] + c];
+        if (sy == previous) {  // the row above again
+            std::memcpy(d, rowAt(dst, dstStep, y - 1), rowBytes);
+            continue;
+        }
+        const T* s = rowAt(src, srcStep, previous = sy);
+        int x = 0;
+        for (; x < wide; ++x) std::memcpy(d + x * C, s + xs[x], 4);
+        for (; x < dstSize.width; ++x) std::memcpy(d + x * C, s + xs[x], C * sizeof(T));
     }
     mem::alignedFree(block);
     return StatusOk;

@@ -178,15 +178,18 @@ struct FixedPoint {
 
 // ---- float -------------------------------------------------------------------------
 
-template <class T>
-inline T floatResult(float v) {
+// A float or double sum as a destination element: integers rounded half
+// up and saturated (the addition rounded as F even on x87).
+template <class T, class F>
+inline T resultOf(F v) {
     if constexpr (std::is_same_v<T, float>) {
-        return v;
+        return toFloat(v);
     } else {
-        constexpr float top = std::is_same_v<T, uint8_t> ? 255.0f : 65535.0f;
+        constexpr F top = std::is_same_v<T, uint8_t> ? 255 : 65535;
         v = v > 0 ? v : 0;
         v = v < top ? v : top;
-        return T(int(toFloat(v + 0.5f)));
+        const F half = v + F(0.5);
+        return T(int(std::is_same_v<F, float> ? toFloat(half) : toDouble(half)));
     }
 }
 
@@ -269,7 +272,7 @@ struct FloatPoint {
     static T column(const float* p, int channels, const float* w, int n) {
         float acc = toFloat(w[0] * p[0]);
         for (int k = 1; k < n; ++k) acc = toFloat(acc + toFloat(w[k] * p[k * channels]));
-        return floatResult<T>(acc);
+        return resultOf<T>(acc);
     }
 #if ZOR_SIMD >= 4
     static Lanes first(Lanes v, Lanes w) { return v * w; }
@@ -296,18 +299,6 @@ struct FloatPoint {
 };
 
 // ---- double --------------------------------------------------------------------------
-
-template <class T>
-inline T doubleResult(double v) {
-    if constexpr (std::is_same_v<T, float>) {
-        return toFloat(v);
-    } else {
-        constexpr double top = std::is_same_v<T, uint8_t> ? 255.0 : 65535.0;
-        v = v > 0 ? v : 0;
-        v = v < top ? v : top;
-        return T(int(toDouble(v + 0.5)));
-    }
-}
 
 struct DoublePoint {
     using Weight = double;
@@ -347,7 +338,7 @@ struct DoublePoint {
     static T column(const double* p, int channels, const double* w, int n) {
         double acc = toDouble(w[0] * p[0]);
         for (int k = 1; k < n; ++k) acc = toDouble(acc + toDouble(w[k] * p[k * channels]));
-        return doubleResult<T>(acc);
+        return resultOf<T>(acc);
     }
 #if ZOR_SIMD >= 2
     // Eight source elements as doubles.

@@ -39,10 +39,7 @@ const int kModes[] = {InterNearest, InterLinear, InterCubic, InterSuper, InterLa
 // One direction: where destination pixel i samples, and the source pixels
 // per destination pixel (the width of the super-sampling footprint, centred
 // on the sample's pixel area).
-struct Axis {
-    std::function<double(int)> at;
-    double width;
-};
+struct Axis { std::function<double(int)> at; double width; };
 Axis plain(int roiStart, double f) { return {[=](int i) { return roiStart + (i + 0.5) / f - 0.5; }, 1 / f}; }
 
 double kernel(int mode, double d) {
@@ -227,12 +224,12 @@ TEST(ResizeFract, ValuesAndCheckOrder) {
     const auto fract = [&](ImageRect roi, double fx, double fy, int mode, bool outputs = true) {
         return zt::api(0).zoriGetResizeFract({40, 30}, roi, fx, fy, outputs ? &x : nullptr, &y, mode);
     };
-    ASSERT_EQ(fract({0, 0, 10, 1}, 2, 0.5, InterLinear), StatusOk);
-    EXPECT_EQ(std::pair(x, y), std::pair(9.0 / 19, 0.0));  // one row: 0
-    ASSERT_EQ(fract({38, 0, 10, 3}, 0.5, 2, InterCubic), StatusOk);
-    EXPECT_EQ(std::pair(x, y), std::pair(0.0, 2.0 / 5));  // clipped to 2 wide: 0.5 * 2 is not above 1
-    ASSERT_EQ(fract({0, 0, 10, 3}, 4, 0.5, InterNearest), StatusOk);
-    EXPECT_EQ(std::pair(x, y), std::pair(0.25, 2.0));
+    const auto both = [&](ImageRect roi, double fx, double fy, int mode) {
+        return fract(roi, fx, fy, mode) == StatusOk ? std::pair(x, y) : std::pair(-1.0, -1.0);
+    };
+    EXPECT_EQ(both({0, 0, 10, 1}, 2, 0.5, InterLinear), std::pair(9.0 / 19, 0.0));  // one row: 0
+    EXPECT_EQ(both({38, 0, 10, 3}, 0.5, 2, InterCubic), std::pair(0.0, 2.0 / 5));  // clipped to 2: 0.5 * 2 not above 1
+    EXPECT_EQ(both({0, 0, 10, 3}, 4, 0.5, InterNearest), std::pair(0.25, 2.0));
     EXPECT_EQ(fract({0, 0, 10, 3}, 2, NAN, InterLinear), StatusOk);  // NaN passes
     EXPECT_EQ(fract({40, 0, 1, 1}, 2, 2, InterLinear, false), StatusWarnNoOperation);
     EXPECT_EQ(fract({0, 0, 1, 1}, 0, 2, InterLinear, false), StatusBadResizeFactor);
@@ -345,7 +342,6 @@ TEST_P(Resize, AlternateSuperSamplingBySpans) {
     EXPECT_EQ(out[3 + 2], (100 + 101 + 110 + 111 + 2) / 4);
     EXPECT_EQ(resize(nullptr, 18, {2, 2}, 0.5, 0.5), StatusOk);
     EXPECT_EQ(resize(img.data(), -3, {0, 2}, 3.0, -1.0), StatusOk);
-    EXPECT_EQ(resize(img.data(), 18, {2, 2}, 0.5, 0.5, InterLinear), StatusOk);
 }
 
 // A copy of the built library beside a marker file takes the alternate
