@@ -376,32 +376,41 @@ void columnsScalar(const typename A::Inter* in, const AxisTable<typename A::Weig
 }
 
 #if ZOR_SIMD >= 4
-// Whole blocks: per tap, its lanes shuffled out of the windows.  Taps is
-// the tap count where it is a constant (else 0: taps).
-template <class A, int Windows, int Taps, class T>
-void columnsGathered(const typename A::Inter* in, const GatherPlan& g, int taps, int channels, T* out) {
+// Block b: per tap, its lanes shuffled out of the windows, weighted and
+// summed.  (A call per block would cost as much as the block.)
+template <class A, int Windows>
+[[gnu::always_inline]] inline typename A::Lanes gatheredBlock(const typename A::Inter* in, const GatherPlan& g, int b, int taps,
+                                       int channels) {
     using L = typename A::Lanes;
     using B = simd::Vec<uint8_t>;
-    constexpr int n = L::kLanes;
-    const int m = Taps ? Taps : taps;
-    L done[2];
-    for (int b = 0; b < g.blocks; ++b) {
-        const typename A::Inter* p = in + g.base[b];
-        B masks[Windows];
-        for (int w = 0; w < Windows; ++w) masks[w] = simd::load<B>(g.masks + (size_t(b) * Windows + w) * 16);
-        const auto* weights = reinterpret_cast<const typename A::Weight*>(g.weights + size_t(b) * m * 16);
-        L acc;
-        for (int k = 0; k < m; ++k) {
-            const typename A::Inter* q = p + k * channels;
-            B v = simd::shuffleBytes(simd::loadFrom<B>(q), masks[0]);
-            for (int w = 1; w < Windows; ++w) v = v | simd::shuffleBytes(simd::loadFrom<B>(q + w * n), masks[w]);
-            const L x = simd::bitcast<typename L::Lane>(v), wk = simd::load<L>(weights + k * n);
-            acc = k ? A::next(acc, x, wk) : A::first(x, wk);
-        }
-        done[b & 1] = acc;
-        if (b & 1) A::template store2<T>(out + ptrdiff_t(b - 1) * n, done[0], done[1]);
+    const typename A::Inter* p = in + g.base[b];
+    B masks[Windows];
+    for (int w = 0; w < Windows; ++w) masks[w] = simd::load<B>(g.masks + (size_t(b) * Windows + w) * 16);
+    const auto* weights = reinterpret_cast<const typename A::Weight*>(g.weights + size_t(b) * taps * 16);
+    L acc;
+    for (int k = 0; k < taps; ++k) {
+        const typename A::Inter* q = p + k * channels;
+        B v = simd::shuffleBytes(simd::loadFrom<B>(q), masks[0]);
+        for (int w = 1; w < Windows; ++w) v = v | simd::shuffleBytes(simd::loadFrom<B>(q + w * L::kLanes), masks[w]);
+        const L x = simd::bitcast<typename L::Lane>(v), wk = simd::load<L>(weights + k * L::kLanes);
+        acc = k ? A::next(acc, x, wk) : A::first(x, wk);
     }
-    if (g.blocks & 1) A::template store1<T>(out + ptrdiff_t(g.blocks - 1) * n, done[0]);
+    return acc;
+}
+
+// Whole blocks, two at a time.  Taps is the tap count where it is a
+// constant (else 0: taps).
+template <class A, int Windows, int Taps, class T>
+void columnsGathered(const typename A::Inter* in, const GatherPlan& plan, int taps, int channels, T* out) {
+    constexpr int n = A::Lanes::kLanes;
+    const GatherPlan g = plan;  // a copy the stores to out cannot alias
+    const int m = Taps ? Taps : taps;
+    int b = 0;
+    for (; b + 2 <= g.blocks; b += 2) {
+        const auto first = gatheredBlock<A, Windows>(in, g, b, m, channels);
+        A::template store2<T>(out + ptrdiff_t(b) * n, first, gatheredBlock<A, Windows>(in, g, b + 1, m, channels));
+    }
+    if (b < g.blocks) A::template store1<T>(out + ptrdiff_t(b) * n, gatheredBlock<A, Windows>(in, g, b, m, channels));
 }
 
 template <class A, int Windows, class T>
