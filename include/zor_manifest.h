@@ -469,15 +469,17 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
  * ROI height, when the srcStep bytes after the image (srcSize.height rows
  * of srcStep bytes) cannot be read, they resize from a copy of the image
  * with its last row repeated once below it (same arguments otherwise; the
- * copy's allocation is not checked, and no copy is made where srcStep is
- * below the row's bytes).
+ * copy's allocation is not checked; no copy is made where srcStep is below
+ * the row's bytes or the copy would pass 2 GiB).  On Linux the probe reads
+ * the own process through process_vm_readv, which reports instead of
+ * faulting.
  *
  * zoriResize_8u_C3R in the SSE2, SSE3 and SSSE3 variants, with
  * interpolation 8 while the marker file (the module's path with its last
  * extension replaced by "xml") existed at load, takes the alternate
  * super-sampling instead: no argument is checked and it returns 0, doing
- * nothing for null pointers, empty sizes or factors whose reciprocal is not
- * a positive finite number.  rx = (float)(1 / xFactor), likewise ry;
+ * nothing for null pointers, empty sizes or clipped ROIs, factors whose
+ * reciprocal is not a positive finite number, or missing work memory.  rx = (float)(1 / xFactor), likewise ry;
  * K = trunc(65536 xFactor yFactor); column i covers [s, min(s + rx, w)) with
  * s = min(max(s0 + i rx, 0), w), s0 = trunc(roi.x xFactor + 0.5) / xFactor
  * - roi.x, w the clipped ROI width, in ROI coordinates (rows likewise); a
