@@ -15,8 +15,8 @@
 // What exists in which column:
 //   ZOR_SIMD >= 1  float lanes
 //   ZOR_SIMD >= 2  every lane type
-//   ZOR_SIMD >= 4  shuffleBytes, alignBytes, mulAddPairs on bytes, mulHiRound
-//                  (and abs/sign without emulation)
+//   ZOR_SIMD >= 4  shuffleBytes, alignBytes, mulAddPairs on bytes
+//                  (and abs/sign/mulHiRound without emulation)
 // simd::kHas<T> tells a template whether Vec<T> exists in this column.
 //
 // Lane order.  Operations act lane by lane and keep lane order, except those
@@ -74,6 +74,8 @@ constexpr T avg(T a, T b) {
     static_assert(std::is_unsigned_v<T> && sizeof(T) <= 2, "rounding average of unsigned lanes");
     return T((unsigned(a) + unsigned(b) + 1) >> 1);
 }
+// (a b + 2^14) >> 15 of 16-bit lanes (the low 16 bits of it).
+constexpr int16_t mulHiRound(int16_t a, int16_t b) { return int16_t((int(a) * b + 0x4000) >> 15); }
 // |a - b| of unsigned lanes.
 template <class T>
 constexpr T absDiff(T a, T b) {
@@ -700,10 +702,19 @@ struct Isa<16> {
     // pmaddubsw: u0 s0 + u1 s1 of neighbouring bytes (unsigned times signed),
     // saturated to 16 bits.
     static __m128i mulAddPairs8(__m128i u, __m128i s) { return _mm_maddubs_epi16(u, s); }
-    // pmulhrsw: (a b + 2^14) >> 15 of 16-bit lanes.
-    static __m128i mulHiRound(__m128i a, __m128i b) { return _mm_mulhrs_epi16(a, b); }
 #  endif
 #  if ZOR_SIMD >= 2
+    // pmulhrsw: (a b + 2^14) >> 15 of 16-bit lanes.  Before SSSE3 from the
+    // product's halves: 2 hi + ((lo >> 14) + 1) >> 1, lo taken unsigned.
+    static __m128i mulHiRound(__m128i a, __m128i b) {
+#    if ZOR_SIMD >= 4
+        return _mm_mulhrs_epi16(a, b);
+#    else
+        const __m128i hi = _mm_mulhi_epi16(a, b);
+        const __m128i q = _mm_srli_epi16(_mm_mullo_epi16(a, b), 14);
+        return _mm_add_epi16(_mm_add_epi16(hi, hi), _mm_srli_epi16(_mm_add_epi16(q, _mm_set1_epi16(1)), 1));
+#    endif
+    }
     template <class T>
     static __m128i abs(__m128i a) {
 #    if ZOR_SIMD >= 4

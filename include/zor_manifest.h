@@ -542,7 +542,97 @@ ZOR_FN(ZOR_GENERIC, Status, zoriMomentFree_64f, (MomentState* pState))
 ZOR_FN(ZOR_SSE2UP,  Status, zoriMoments64f_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, MomentState* pState))
 ZOR_FN(ZOR_GENERIC, Status, zoriGetSpatialMoment_64f, (const MomentState* pState, int mOrd, int nOrd, int nChannel, ImagePoint roiOffset, double* pValue))
 
-/* ---- image/geometry/resize ---- */
+/* ---- image/geometry/resize ----
+ * Arguments: the source pointer is the image origin, srcSize the whole
+ * image, srcRoi a rectangle in it; the destination pointer is the first
+ * pixel of the destination ROI, dstRoiSize its size; factors are
+ * destination / source sizes.
+ *
+ * Checks, in order: a null pointer -8; a dimension of srcSize, srcRoi or
+ * dstRoiSize below 1: -6; a step below 1: -14; the ROI origin outside the
+ * image (x or y negative or at least the image's width / height): warning
+ * 29, nothing written; a factor not above 0 (NaN included): -23;
+ * interpolation other than 1, 2, 4, 8, 16: -22.  The ROI is clipped to the
+ * image.  Work memory that cannot be had: -9, nothing written.
+ *
+ * Mapping: destination pixel i samples x = roi.x + (i + 0.5) / xFactor - 0.5
+ * (pixel centres aligned), likewise y.  Neighbours come from the whole
+ * image and are clamped to its edge pixels.  Nearest (1): the pixel at
+ * floor(x + 0.5).  Linear (2): bilinear.  Cubic (4): Catmull-Rom (a = -0.5),
+ * 4 x 4.  Lanczos (16): 3 lobes, 6 x 6, the weights of each direction
+ * normalised to sum 1.  Super-sampling (8): the area-weighted mean over
+ * [roi.x + i / f, roi.x + (i + 1) / f) x (likewise y), where area beyond
+ * the image counts for the edge pixel; in a direction whose factor is above
+ * 1, linear instead.  Every destination pixel is written.
+ *
+ * Results: 8u and 16u round half up and saturate, within +-1 of the exact
+ * (double) value of the definition; 32f within 1e-5 of the sum of the
+ * magnitudes of the weighted source values (relative to the value where
+ * nothing cancels).  A non-finite 32f source value reaches every output
+ * whose taps include it, even at weight 0.  Every variant gives the same
+ * bits.  How: 8u with at most 8 taps a direction: weights in 1/16384,
+ * rows combined to 1/64 of a level, columns to 1/32, the sum rounded half
+ * up (the fixed-point value stays within 0.32 of the exact one); float
+ * weights and sums formed in tap order in float for 16u with at most 8
+ * taps, 32f with at most 32 and 8u with at most 1024; double beyond.  8u
+ * super-sampling by exactly 0.5 x 0.5 inside the image: (sum of the 2 x 2
+ * pixels + 2) / 4.
+ *
+ * The 8u exports first apply a read guard: with interpolation 8 and an odd
+ * ROI height, when the srcStep bytes after the image (srcSize.height rows
+ * of srcStep bytes) cannot be read, they resize from a copy of the image
+ * with its last row repeated once below it (same arguments otherwise; the
+ * copy's allocation is not checked; no copy is made where srcStep is below
+ * the row's bytes or the copy would pass 2 GiB).  On Linux the probe reads
+ * the own process through process_vm_readv, which reports instead of
+ * faulting.
+ *
+ * zoriResize_8u_C3R in the SSE2, SSE3 and SSSE3 variants, with
+ * interpolation 8 while the marker file (the module's path with its last
+ * extension replaced by "xml") existed at load, takes the alternate
+ * super-sampling instead: no argument is checked and it returns 0, doing
+ * nothing for null pointers, empty sizes or clipped ROIs, factors whose
+ * reciprocal is not a positive finite number, or missing work memory.  rx = (float)(1 / xFactor), likewise ry;
+ * K = trunc(65536 xFactor yFactor); column i covers [s, min(s + rx, w)) with
+ * s = min(max(s0 + i rx, 0), w), s0 = trunc(roi.x xFactor + 0.5) / xFactor
+ * - roi.x, w the clipped ROI width, in ROI coordinates (rows likewise); a
+ * partial first pixel weighs trunc((1 - frac) 256), whole pixels 256, a
+ * partial last pixel trunc(frac 256); row sums are weighted by the row's
+ * weight, shifted right by 8, summed in 32 bits; the output is
+ * (sum K + 2^23) >> 24 stored without a clamp.  Spans keep 16-bit indices
+ * (ROIs up to 65534 pixels a side).
+ *
+ * zoriGetResizeFract: checks sizes (-6), the ROI origin (29), factors not
+ * above 0 (-23; NaN passes), output pointers (-8), interpolation 1, 2, 4,
+ * 16 (-22); fraction = 1 / factor (nearest) or (w - 1) / (factor w - 1)
+ * when factor w > 1, else 0, w the clipped ROI width (height for y).
+ *
+ * zoriResizeShift_8u_C3R: destination pixel i samples
+ * roi.x + (i - xShift) xFr (likewise y), with the engine's checks except
+ * that a fraction of 0 is accepted (every pixel then samples one position;
+ * zoriGetResizeFract gives 0 for a one-pixel ROI).  Super-sampling averages
+ * [x + 0.5 - xFr / 2, x + 0.5 + xFr / 2), linear where xFr is below 1.
+ *
+ * zoriResizeCenter_8u_C1R / _C3R: destination pixel i (relative to pDst)
+ * samples xCenter + (i - xCenter) (1 / xFactor), likewise y, so the point
+ * (xCenter, yCenter) keeps its coordinates; only destination pixels whose
+ * sample lies in the clipped ROI's pixel area [roi.x - 0.5, roi.x + w - 0.5)
+ * in both directions are written; super-sampling averages a footprint of
+ * 1 / factor around the sample, as the shifted resize does.  Checks: pDst
+ * null first, then the engine's; nothing to write: 0. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C1R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C3R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C4R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C1R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C3R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C4R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C1R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C3R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C4R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetResizeFract, (ImageSize srcSize, ImageRect srcRoi, double xFactor, double yFactor, double* pXFr, double* pYFr, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResizeShift_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFr, double yFr, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C1R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
 
 /* ---- image/geometry/rotate ---- */
 

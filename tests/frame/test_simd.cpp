@@ -69,6 +69,7 @@ TEST(SimdLanes, IntegerOperationsMatchTheirScalarTwins) {
     agreesLaneByLane<uint8_t>([](auto a, auto b) { return avg(a, b); }, "avg");
     agreesLaneByLane<uint16_t>([](auto a, auto b) { return absDiff(a, b); }, "absDiff");
     agreesLaneByLane<uint32_t>([](auto a, auto b) { return a * b; }, "mul");
+    agreesLaneByLane<int16_t>([](auto a, auto b) { return mulHiRound(a, b); }, "mulHiRound");  // emulated
 }
 
 TEST(SimdLanes, WidenThenNarrowRestoresOrderAndSaturates) {
