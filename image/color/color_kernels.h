@@ -110,6 +110,66 @@ inline I16 zipWords(U8 a, U8 b, int k) {
     return simd::bitcast<int16_t>(k % 2 ? simd::widenHi(ab) : simd::widenLo(ab));
 }
 
+// Three channels of 16 pixels, four pixels (one 32-bit lane each) at a
+// time, to interleaved bytes.  Saturating: the lanes are values, narrowed
+// with saturation.  Otherwise they are sums whose bits 16..23 are the value
+// (0 <= sum < 2^24), and SSSE3 picks those bytes straight into place.
+// put(k, ...) takes group k; SSSE3 stores groups 0..2 16 bytes wide (the
+// last 4 are the next group's, which overwrites them), group 3 with the
+// end of group 2.
+template <bool Saturating>
+class Interleave3 {
+public:
+    explicit Interleave3(uint8_t* d) : d_(d) {}
+    void put(int k, I32 a, I32 b, I32 c) {
+#  if ZOR_SIMD >= 4
+        const int at = k == 3;
+        U8 bytes;
+        if constexpr (Saturating) {
+            const U8 v = simd::narrowSat<uint8_t>(simd::narrowSat<int16_t>(a, b), simd::narrowSat<int16_t>(c, c));
+            bytes = simd::shuffleBytes(v, mask(3, at));  // a0..3 b0..3 c0..3 to pixel order
+        } else {
+            bytes = pick(a, 0, at) | pick(b, 1, at) | pick(c, 2, at);
+        }
+        if (k < 3) simd::store(d_ + 12 * k, third_ = bytes);
+        else simd::store(d_ + 32, simd::shiftBytesDown<8>(third_) | bytes);
+#  else
+        if constexpr (!Saturating) a = simd::shr<16>(a), b = simd::shr<16>(b), c = simd::shr<16>(c);
+        a_[k] = a, b_[k] = b, c_[k] = c;
+        if (k == 3) simd::storeInterleaved3(d_, toBytes(a_), toBytes(b_), toBytes(c_));
+#  endif
+    }
+
+private:
+    uint8_t* d_;
+#  if ZOR_SIMD >= 4
+    // m[ch][0]: byte 2 of lane i to byte 3 i + ch (ch = 3: byte 4 ch' + i of
+    // the narrowed groups to 3 i + ch'); m[ch][1]: the same 4 bytes on
+    struct Masks {
+        uint8_t m[4][2][16];
+    };
+    static constexpr Masks masks() {
+        Masks t{};
+        for (int ch = 0; ch < 4; ++ch)
+            for (int j = 0; j < 16; ++j) {
+                const bool own = j < 12 && (ch == 3 || j % 3 == ch);
+                const int from = ch == 3 ? 4 * (j % 3) + j / 3 : 4 * (j / 3) + 2;
+                t.m[ch][0][j] = own ? static_cast<uint8_t>(from) : uint8_t(0x80);
+                t.m[ch][1][j] = j < 4 ? uint8_t(0x80) : t.m[ch][0][j - 4];
+            }
+        return t;
+    }
+    static U8 mask(int ch, int at) {
+        alignas(16) static constexpr Masks kMasks = masks();
+        return simd::fromLanes<U8>(kMasks.m[ch][at]);
+    }
+    static U8 pick(I32 v, int ch, int at) { return simd::shuffleBytes(simd::bitcast<uint8_t>(v), mask(ch, at)); }
+    U8 third_;
+#  else
+    I32 a_[4], b_[4], c_[4];
+#  endif
+};
+
 // ---- RGB to YCbCr ------------------------------------------------------------------------
 // The chroma lies in 16..240, so 256 * 65536 added to its offset keeps the
 // low 8 bits and makes the shifted value the byte itself.
@@ -118,57 +178,60 @@ inline int ycbcrRowSimd(const uint8_t* s, uint8_t* d, int n) {
     int x = 0;
     for (; x + kBlock <= n; x += kBlock) {
         const Pixels16 px(s + 3 * x);
-        I32 y[4], cb[4], cr[4];
+        Interleave3<false> out(d + 3 * x);
         for (int k = 0; k < 4; ++k) {
             const I16 rg = px.pairs<0, 1>(k), bg = px.pairs<2, 1>(k);
-            y[k] = simd::shr<16>(plus<1081344>(dot<16843, 16515>(rg) + dot<6423, 16515>(bg)));
-            cb[k] = simd::shr<16>(plus<8421376>(dot<-9699, -19071>(rg) + dot<28770, 0>(bg)));
-            cr[k] = simd::shr<16>(plus<8421376>(dot<28770, -24117>(rg) + dot<-4653, 0>(bg)));
+            out.put(k, plus<1081344>(dot<16843, 16515>(rg) + dot<6423, 16515>(bg)),
+                    plus<8421376>(dot<-9699, -19071>(rg) + dot<28770, 0>(bg)),
+                    plus<8421376>(dot<28770, -24117>(rg) + dot<-4653, 0>(bg)));
         }
-        simd::storeInterleaved3(d + 3 * x, toBytes(y), toBytes(cb), toBytes(cr));
     }
     return x;
 }
 
 // ---- YCbCr to RGB ------------------------------------------------------------------------
-// From word pairs (y, cr) and (y, cb): 76284 = 65536 + 10748,
-// 104595 = 2 * 65536 - 26477, -53281 = -65536 + 12255, 132186 = 2 * 65536 +
-// 1114, so each channel is a small product sum shifted, plus whole
-// multiples of y and the chroma; K are the forms' constants.
-template <int KR, int KG, int KB>
-inline void rgbOfPairs(I16 ycr, I16 ycb, I32& r, I32& g, I32& b) {
-    r = simd::shr<16>(plus<KR>(dot<10748, -26477>(ycr))) + dot<1, 2>(ycr);
-    g = simd::shr<16>(plus<KG>(dot<10748, -25690>(ycb) + dot<0, 12255>(ycr))) + dot<1, -1>(ycr);
-    b = simd::shr<16>(plus<KB>(dot<10748, 1114>(ycb))) + dot<1, 2>(ycb);
+// Every channel is one product sum shifted by 16, with the weights brought
+// into 16 bits by scaling the words: 76284 y = 19071 (4 y),
+// 104595 cr = 20919 (5 cr), 132186 cb = 22031 (6 cb) and
+// -53281 cr = -10656 (5 cr) - cr.  Pairs (y, cr), (y, cb), (cb, cr) of raw
+// bytes; YO and CO are the offsets taken off luma and chroma, K the forms'
+// constants.
+template <int YO, int CO, int KR, int KG, int KB>
+inline void rgbOfPairs(I16 ycr, I16 ycb, I16 cbcr, I32& r, I32& g, I32& b) {
+    const auto scaled = [](I16 p, int sy, int sc, int oc) {
+        return p * pairWeights(sy, sc) - pairWeights(sy * YO, sc * oc);
+    };
+    const I16 yr = scaled(ycr, 4, 5, CO), yb = scaled(ycb, 4, 6, CO), c = cbcr - pairWeights(CO, CO);
+    r = simd::shr<16>(plus<KR>(dot<19071, 20919>(yr)));
+    g = simd::shr<16>(plus<KG>(dot<19071, -10656>(yr) + dot<-25690, -1>(c)));
+    b = simd::shr<16>(plus<KB>(dot<19071, 22031>(yb)));
 }
-
-// (y - 16, c - 128) of word pairs: the offsets fold the constant 16 * 76284.
-inline I16 centred(I16 pair) { return pair - simd::bitcast<int16_t>(simd::set1<I32>(128 << 16 | 16)); }
 
 inline int rgbRowSimd(const uint8_t* s, uint8_t* d, int n) {
     int x = 0;
     for (; x + kBlock <= n; x += kBlock) {
         const Pixels16 px(s + 3 * x);
-        I32 r[4], g[4], b[4];
-        for (int k = 0; k < 4; ++k) rgbOfPairs<0, 0, 0>(centred(px.pairs<0, 2>(k)), centred(px.pairs<0, 1>(k)), r[k], g[k], b[k]);
-        simd::storeInterleaved3(d + 3 * x, toBytes(r), toBytes(g), toBytes(b));
+        Interleave3<true> out(d + 3 * x);
+        for (int k = 0; k < 4; ++k) {
+            I32 r, g, b;
+            rgbOfPairs<16, 128, 0, 0, 0>(px.pairs<0, 2>(k), px.pairs<0, 1>(k), px.pairs<1, 2>(k), r, g, b);
+            out.put(k, r, g, b);
+        }
     }
     return x;
 }
 
-// 16 pixels from luma bytes and 8 chroma bytes each (one per pixel pair);
-// Centre: subtract the offsets first.  Terms K as in rgbOfPairs.
-template <bool Centre, int KR, int KG, int KB, bool Bgr>
+// 16 pixels from luma bytes and 8 chroma bytes each (one per pixel pair).
+template <int YO, int CO, int KR, int KG, int KB, bool Bgr>
 inline void rgbOfPairedChroma(U8 luma, U8 cb8, U8 cr8, uint8_t* d) {
     const U8 cb = simd::zipLo(cb8, cb8), cr = simd::zipLo(cr8, cr8);
-    I32 r[4], g[4], b[4];
+    Interleave3<true> out(d);
     for (int k = 0; k < 4; ++k) {
-        I16 ycr = zipWords(luma, cr, k), ycb = zipWords(luma, cb, k);
-        if constexpr (Centre) ycr = centred(ycr), ycb = centred(ycb);
-        rgbOfPairs<KR, KG, KB>(ycr, ycb, r[k], g[k], b[k]);
+        I32 r, g, b;
+        rgbOfPairs<YO, CO, KR, KG, KB>(zipWords(luma, cr, k), zipWords(luma, cb, k), zipWords(cb, cr, k), r, g, b);
+        if constexpr (Bgr) out.put(k, b, g, r);
+        else out.put(k, r, g, b);
     }
-    if constexpr (Bgr) simd::storeInterleaved3(d, toBytes(b), toBytes(g), toBytes(r));
-    else simd::storeInterleaved3(d, toBytes(r), toBytes(g), toBytes(b));
 }
 
 // Rows of 4:2:2 quadruples Y0 Cb Y1 Cr: the even bytes are luma, the odd
@@ -185,7 +248,7 @@ inline int unpack422RowSimd(const uint8_t* s, uint8_t* d, int n) {
     for (; x + kBlock <= n; x += kBlock) {
         const U16 q0 = simd::loadFrom<U16>(s + 2 * x), q1 = simd::loadFrom<U16>(s + 2 * x + 16);
         const U16 chroma = simd::bitcast<uint16_t>(odds(q0, q1));  // Cb Cr Cb Cr ...
-        rgbOfPairedChroma<false, -14608761, 8887730, -18140365, false>(
+        rgbOfPairedChroma<0, 0, -14608761, 8887730, -18140365, false>(
             evens(q0, q1), evens(chroma, chroma), odds(chroma, chroma), d + 3 * x);
     }
     return x;
@@ -196,7 +259,7 @@ inline int unpack422RowSimd(const uint8_t* s, uint8_t* d, int n) {
 inline int unplanar420RowSimd(const uint8_t* luma, const uint8_t* cb, const uint8_t* cr, uint8_t* d, int blocks) {
     int j = 0;
     for (; j + kBlock / 2 <= blocks; j += kBlock / 2)
-        rgbOfPairedChroma<true, 32768, 32768, 32768, true>(simd::load<U8>(luma + 2 * j), simd::loadHalf<U8>(cb + j),
+        rgbOfPairedChroma<16, 128, 32768, 32768, 32768, true>(simd::load<U8>(luma + 2 * j), simd::loadHalf<U8>(cb + j),
                                                             simd::loadHalf<U8>(cr + j), d + 6 * j);
     return j;
 }
