@@ -31,19 +31,23 @@ inline U8 toBytes(const I32 (&v)[4]) {
 }
 
 // w0 a + w1 b for the words (a, b) of every 32-bit lane (a the lower),
-// exact; a weight from 32768 to 65535 is applied as w - 65536 plus 65536
-// times its word.
+// exact (modulo 2^32); a weight outside 16 bits (up to 65535 in
+// magnitude) is applied as w -+ 65536 plus or minus 65536 times its word.
 inline I16 pairWeights(int w0, int w1) {
     return simd::bitcast<int16_t>(simd::set1<I32>(static_cast<int32_t>(uint32_t(w1) << 16 | uint16_t(w0))));
 }
+constexpr int inWord(int w) { return w > 32767 ? w - 65536 : w < -32768 ? w + 65536 : w; }
 template <int W0, int W1>
 inline I32 dot(I16 p) {
-    constexpr int l0 = W0 > 32767 ? W0 - 65536 : W0, l1 = W1 > 32767 ? W1 - 65536 : W1;
-    static_assert(l0 >= -32768 && l1 >= -32768, "weights from -32768 to 65535");
+    constexpr int l0 = inWord(W0), l1 = inWord(W1);
+    static_assert(W0 >= -65535 && W0 <= 65535 && W1 >= -65535 && W1 <= 65535, "weights of at most 16 bits");
     I32 r = simd::mulAddPairs(p, pairWeights(l0, l1));
     const I32 words = simd::bitcast<int32_t>(p);
-    if constexpr (l0 != W0) r = r + simd::shl<16>(words);
-    if constexpr (l1 != W1) r = r + (words & simd::set1<I32>(int32_t(0xFFFF0000u)));
+    const I32 low = simd::shl<16>(words), high = words & simd::set1<I32>(int32_t(0xFFFF0000u));
+    if constexpr (l0 < W0) r = r + low;
+    if constexpr (l0 > W0) r = r - low;
+    if constexpr (l1 < W1) r = r + high;
+    if constexpr (l1 > W1) r = r - high;
     return r;
 }
 template <int K>

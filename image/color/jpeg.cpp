@@ -91,6 +91,7 @@ Status ZOR_CALL zoriBGRToYCbCr422LS_MCU_8u16s_C3P3R(const uint8_t* pSrc, int src
     int16_t* luma = pDstMCU[0];
     for (int r = 0; r < 8; ++r) {
         const uint8_t* s = rowAt(pSrc, srcStep, r);
+        if (mcuRowSimd(s, luma + r * 8, luma + 64 + r * 8, pDstMCU[1] + r * 8, pDstMCU[2] + r * 8)) continue;
         for (int x = 0; x < 16; ++x) {
             const int b = s[3 * x], g = s[3 * x + 1], red = s[3 * x + 2];
             // the luma truncated, then centred: no rounding term
@@ -113,8 +114,10 @@ Status ZOR_CALL zoriJoin422LS_MCU_16s8u_P3C2R(const int16_t* const pSrcMCU[3], u
     if (pSrcMCU[0] == nullptr || pSrcMCU[1] == nullptr || pSrcMCU[2] == nullptr) return StatusNullPointer;
     if (Status s = badSteps(dstStep)) return s;
     const auto level = [](int v) { return color::clampByte(v + 128); };
+    const int16_t* luma = pSrcMCU[0];
     for (int r = 0; r < 8; ++r) {
         uint8_t* d = rowAt(pDst, dstStep, r);
+        if (joinRowSimd(luma + r * 8, luma + 64 + r * 8, pSrcMCU[1] + r * 8, pSrcMCU[2] + r * 8, d)) continue;
         for (int j = 0; j < 8; ++j, d += 4) {
             const int16_t* y = pSrcMCU[0] + (j < 4 ? 0 : 64) + r * 8 + 2 * (j % 4);
             d[0] = level(y[0]);
@@ -130,6 +133,7 @@ Status ZOR_CALL zoriJoin422LS_MCU_16s8u_P3C2R(const int16_t* const pSrcMCU[3], u
 Status ZOR_CALL zoriDCTQuantFwd8x8LS_JPEG_8u16s_C1R(const uint8_t* pSrc, int srcStep, int16_t* pDst,
                                                     const uint16_t* pQuantFwdTable) {
     if (Status s = checkFirst(anyNull(pSrc, pDst), badSteps(srcStep), anyNull(pQuantFwdTable))) return s;
+    if (dctQuantFwdSimd(pSrc, srcStep, pDst, pQuantFwdTable)) return StatusOk;
     int rows[64];
     for (int r = 0; r < 8; ++r) {
         const uint8_t* s = rowAt(pSrc, srcStep, r);
