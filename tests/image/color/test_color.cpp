@@ -171,7 +171,7 @@ TEST_P(Color, Packed422OddWidthsAndWidthOne) {
             const int x = i % w, n = x % 2 == 0 && x == w - 1 ? 1 : 2;  // a last single pixel: its own blue chroma
             const uint8_t* a = x % 2 ? p - 3 : p;  // the pair's first pixel
             ASSERT_EQ(q[0], lumaRef(p[0], p[1], p[2], x % 2 ? 1048576 : 1081344)) << w << " " << i;  // no half for the second
-            ASSERT_EQ(q[1], chromaRef(x % 2, a[0] + (n - 1) * a[3], a[1] + (n - 1) * a[4], a[2] + (n - 1) * a[5], n)) << w << " " << i;
+            ASSERT_EQ(q[1], chromaRef(x % 2, a[0] + (n - 1) * a[3 * n - 3], a[1] + (n - 1) * a[3 * n - 2], a[2] + (n - 1) * a[3 * n - 1], n)) << w << " " << i;
             // back: Cb and Cr of the pair; a single last pixel takes the Cr before it; width 1 uses its one chroma twice
             const int cb = x % 2 ? q[-1] : q[1], cr = w == 1 ? q[1] : x % 2 ? q[1] : x == w - 1 ? q[-1] : q[3];
             const int64_t k[3] = {-14608761, 8887730, -18140365};
