@@ -62,7 +62,7 @@ TEST_P(Jpeg, SampleDownAndMcuLayouts) {
 
 // The T.81 DCT of a block, or its inverse, in double precision.
 std::vector<double> dct(const std::vector<double>& in, bool inverse) {
-    const auto c = [](int f, int s) { return (f ? 1.0 : std::sqrt(0.5)) * std::cos((2 * s + 1) * f * M_PI / 16) / 2; };
+    const auto c = [](int f, int s) { return (f ? 1.0 : std::sqrt(0.5)) * std::cos((2 * s + 1) * f * std::acos(-1.0) / 16) / 2; };
     std::vector<double> out(64, 0.0);
     for (int a = 0; a < 64; ++a)
         for (int b = 0; b < 64; ++b) out[a] += in[b] * (inverse ? c(b % 8, a % 8) * c(b / 8, a / 8) : c(a % 8, b % 8) * c(a / 8, b / 8));
