@@ -304,27 +304,34 @@ inline int packed422RowSimd(const uint8_t* s, uint8_t* d, int n) {
 }
 
 // Two BGR rows to two luma rows and one row of each chroma plane, 8 blocks of
-// 2 x 2 at a time: chroma of the column sums, then of pairs of columns.
+// 2 x 2 at a time.  The chroma starts from the pairs' sums over the two rows
+// and then over neighbouring pixels (a 32-bit lane holds a pair of 16-bit
+// sums below 1021, so adding lanes adds the sums), weighted once per block.
 inline int planar420RowsSimd(const uint8_t* s0, const uint8_t* s1, uint8_t* y0, uint8_t* y1, uint8_t* cb,
                              uint8_t* cr, int blocks) {
+    const auto sumPairs = [](I16 a, I16 b) {
+        return simd::bitcast<int16_t>(simd::addPairs(simd::bitcast<int32_t>(a), simd::bitcast<int32_t>(b)));
+    };
     int j = 0;
     for (; j + kBlock / 2 <= blocks; j += kBlock / 2) {
         const Pixels16 a(s0 + 6 * j), b(s1 + 6 * j);
-        I32 ya[4], yb[4], csum[4], rsum[4];
+        I32 ya[4], yb[4], c[4];
+        I16 rg[4], bg[4];
         for (int k = 0; k < 4; ++k) {
             const I16 rga = a.pairs<2, 1>(k), bga = a.pairs<0, 1>(k), rgb = b.pairs<2, 1>(k), bgb = b.pairs<0, 1>(k);
             ya[k] = simd::shr<16>(plus<1081344>(dot<16843, 16515>(rga) + dot<6423, 16515>(bga)));
             yb[k] = simd::shr<16>(plus<1081344>(dot<16843, 16515>(rgb) + dot<6423, 16515>(bgb)));
-            csum[k] = cbSum(rga + rgb, bga + bgb);
-            rsum[k] = crSum(rga + rgb, bga + bgb);
+            rg[k] = rga + rgb;
+            bg[k] = bga + bgb;
         }
         simd::store(y0 + 2 * j, toBytes(ya));
         simd::store(y1 + 2 * j, toBytes(yb));
         // the block mean plus 128.125, the offset raised by 256 * 2^18
-        const I32 c[4] = {simd::shr<18>(plus<33587200>(simd::addPairs(csum[0], csum[1]))),
-                          simd::shr<18>(plus<33587200>(simd::addPairs(csum[2], csum[3]))),
-                          simd::shr<18>(plus<33587200>(simd::addPairs(rsum[0], rsum[1]))),
-                          simd::shr<18>(plus<33587200>(simd::addPairs(rsum[2], rsum[3])))};
+        for (int h = 0; h < 2; ++h) {
+            const I16 rgs = sumPairs(rg[2 * h], rg[2 * h + 1]), bgs = sumPairs(bg[2 * h], bg[2 * h + 1]);
+            c[h] = simd::shr<18>(plus<33587200>(cbSum(rgs, bgs)));
+            c[2 + h] = simd::shr<18>(plus<33587200>(crSum(rgs, bgs)));
+        }
         const U8 bytes = toBytes(c);  // Cb of the 8 blocks, then Cr
         simd::storeHalf(cb + j, bytes);
         simd::storeHalf(cr + j, simd::shiftBytesDown<8>(bytes));
