@@ -447,10 +447,11 @@ ZOR_FN(ZOR_GENERIC, Status, zorsAutoCorrLagMax_Fwd_16s,
  * without the rounding half and the 4:2:0 one-eighth rounding term.
  * 4:2:0 forms convert the even part of the ROI and return StatusWarnOddSize
  * when a side is odd; a null step array is a null pointer like the others.
- * HSV, HLS, YCC and the 16-bit grey compute in double precision and round
- * stores as trunc(x + 0.499999); for 8-bit data that is the exact rational
- * value rounded to nearest with halves down, which the SIMD RGB-to-HSV path
- * computes exactly (the other floating-point forms share one entry).
+ * HSV, HLS and YCC compute in double precision and round stores as
+ * trunc(x + 0.499999) (the 16-bit grey truncates); for 8-bit data that is
+ * the exact rational value rounded to nearest with halves down, which the
+ * SIMD RGB-to-HSV rows compute exactly (the other floating-point forms share
+ * one entry).
  * ColorToGray: float weight w becomes trunc(w * 4096 + 0.5) taken modulo
  * 2^32 (8u forms); a truncated value that is NaN or of magnitude 2^63 or
  * more counts as 0; 16u forms store the truncated sum modulo 2^16 (NaN and
@@ -509,8 +510,10 @@ ZOR_FN(ZOR_GENERIC, Status, zoriColorToGray_16u_AC4C1R,
  *         X3 = c - a, X5 = b + d, X1 = 46341 (a - b + c + d) >>> 16,
  *         X7 = 46341 (a + b + c - d) >>> 16
  *         (column: X3, X5 >>> 3 and X1, X7 >>> 19 instead).
- * The inverse is the transpose of that flow with the same constants, in
- * 64-bit intermediates, one rounding per pass. */
+ * The inverse is the transpose of that flow with the same constants, exact
+ * in 64-bit intermediates except for one rounding of the odd part before its
+ * last sqrt 2 and one of each pass's results (columns kept at 2^3, rows
+ * divided by 8 with the level shift added back and clamped). */
 ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToY_JPEG_8u_C3C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr_JPEG_8u_C3P3R,

@@ -7,7 +7,7 @@
 // formulas (color_pixels.h) that the SIMD rows reproduce bit for bit
 // (color_kernels.h).  The floating-point forms compute in double precision;
 // RGB to HSV has SIMD rows in integer arithmetic that give the same bytes
-// (see rgbToHsvRows), the others share the generic entry.
+// (see hsvRowSimd), the others share the generic entry.
 #include "frame/variant.h"
 #include "frame/fpu.h"
 #include "frame/row_address.h"
