@@ -198,6 +198,27 @@ constexpr int lanesOf() {
 template <int Bytes>
 struct Isa;  // the instructions of one register width
 
+#if ZOR_SIMD >= 4
+// Shuffle masks between a 48-byte interleaved block of three byte channels
+// and three channel registers: m[3 k + r] takes register r's share of
+// output k (loadInterleaved3 / storeInterleaved3).
+struct InterleaveMasks {
+    uint8_t m[9][16];
+};
+constexpr InterleaveMasks interleaveMasks(bool toInterleaved) {
+    InterleaveMasks t{};
+    for (int k = 0; k < 3; ++k)
+        for (int r = 0; r < 3; ++r)
+            for (int j = 0; j < 16; ++j) {
+                // loading: output k = channel k, byte j from block byte 3j + k;
+                // storing: output k = block register k, byte j = channel (16k+j) % 3
+                const int from = toInterleaved ? ((16 * k + j) / 3) + 16 * ((16 * k + j) % 3) : 3 * j + k;
+                t.m[3 * k + r][j] = from / 16 == r ? static_cast<uint8_t>(from % 16) : uint8_t(0x80);
+            }
+    return t;
+}
+#endif
+
 #if ZOR_SIMD >= 1
 // ---- 16-byte registers: SSE ... SSSE3 ---------------------------------------
 template <>
@@ -634,6 +655,83 @@ struct Isa<16> {
     // One bit per byte, lane order.
     static int byteMask(__m128i a) { return _mm_movemask_epi8(a); }
 
+    // Sums of neighbouring 32-bit lanes: a0+a1, a2+a3, b0+b1, b2+b3.
+    template <class T>
+    static R<T> addPairs(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "pair sums of 32-bit lanes");
+        if constexpr (isF<T>) {
+#    if ZOR_SIMD >= 3
+            return _mm_hadd_ps(a, b);
+#    else
+            return _mm_add_ps(_mm_shuffle_ps(a, b, 0x88), _mm_shuffle_ps(a, b, 0xDD));
+#    endif
+        } else {
+#    if ZOR_SIMD >= 4
+            return _mm_hadd_epi32(a, b);
+#    else
+            const __m128 x = _mm_castsi128_ps(a), y = _mm_castsi128_ps(b);
+            return _mm_add_epi32(_mm_castps_si128(_mm_shuffle_ps(x, y, 0x88)),
+                                 _mm_castps_si128(_mm_shuffle_ps(x, y, 0xDD)));
+#    endif
+        }
+    }
+
+    // Three interleaved byte channels, 48 bytes a0 b0 c0 a1 b1 c1 ..., as
+    // three registers of 16 lanes each, and back.
+    static void loadInterleaved3(const uint8_t* p, __m128i& a, __m128i& b, __m128i& c) {
+        const __m128i v0 = load<uint8_t>(p), v1 = load<uint8_t>(p + 16), v2 = load<uint8_t>(p + 32);
+#    if ZOR_SIMD >= 4
+        // byte j of channel k is byte 3j + k of the block: three shuffles each
+        alignas(16) static constexpr auto masks = interleaveMasks(false);
+        const __m128i* m = reinterpret_cast<const __m128i*>(masks.m);
+        __m128i out[3];
+        for (int k = 0; k < 3; ++k)
+            out[k] = _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(v0, m[3 * k]), _mm_shuffle_epi8(v1, m[3 * k + 1])),
+                                  _mm_shuffle_epi8(v2, m[3 * k + 2]));
+        a = out[0], b = out[1], c = out[2];
+#    else
+        // Four rounds of one fixed byte interleaving of the 48 bytes leave
+        // every third byte together (the permutation's fourth power).
+        __m128i x[3] = {v0, v1, v2};
+        for (int round = 0; round < 4; ++round) {
+            const __m128i y0 = _mm_unpacklo_epi8(x[0], _mm_unpackhi_epi64(x[1], x[1]));
+            const __m128i y1 = _mm_unpacklo_epi8(_mm_unpackhi_epi64(x[0], x[0]), x[2]);
+            const __m128i y2 = _mm_unpacklo_epi8(x[1], _mm_unpackhi_epi64(x[2], x[2]));
+            x[0] = y0, x[1] = y1, x[2] = y2;
+        }
+        a = x[0], b = x[1], c = x[2];
+#    endif
+    }
+    static void storeInterleaved3(uint8_t* p, __m128i a, __m128i b, __m128i c) {
+#    if ZOR_SIMD >= 4
+        alignas(16) static constexpr auto masks = interleaveMasks(true);
+        const __m128i* m = reinterpret_cast<const __m128i*>(masks.m);
+        const __m128i in[3] = {a, b, c};
+        for (int r = 0; r < 3; ++r)
+            store<uint8_t>(p + 16 * r, _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(in[0], m[3 * r]),
+                                                                 _mm_shuffle_epi8(in[1], m[3 * r + 1])),
+                                                    _mm_shuffle_epi8(in[2], m[3 * r + 2])));
+#    else
+        // The rounds of loadInterleaved3 undone: each takes the even and the
+        // odd bytes of the registers apart again.
+        const __m128i low = _mm_set1_epi16(0x00FF);
+        const auto even = [&](__m128i u, __m128i v) {
+            return _mm_packus_epi16(_mm_and_si128(u, low), _mm_and_si128(v, low));
+        };
+        __m128i x[3] = {a, b, c};
+        for (int round = 0; round < 4; ++round) {
+            const __m128i o0 = _mm_srli_epi16(x[0], 8), o1 = _mm_srli_epi16(x[1], 8), o2 = _mm_srli_epi16(x[2], 8);
+            const __m128i y0 = even(x[0], x[1]);
+            const __m128i y1 = _mm_packus_epi16(_mm_and_si128(x[2], low), o0);
+            const __m128i y2 = _mm_packus_epi16(o1, o2);
+            x[0] = y0, x[1] = y1, x[2] = y2;
+        }
+        store<uint8_t>(p, x[0]);
+        store<uint8_t>(p + 16, x[1]);
+        store<uint8_t>(p + 32, x[2]);
+#    endif
+    }
+
     // -- conversions
     static __m128 int32ToFloat(__m128i a) { return _mm_cvtepi32_ps(a); }
     // By the rounding mode that MXCSR holds (nearest-even unless changed);
@@ -680,6 +778,8 @@ struct Isa<16> {
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
+        // (compared by lane kind: naming __m128i as a template argument drops
+        // its attributes, which the compiler warns about)
         if constexpr (std::is_same_v<To, From> || (isInt<To> && isInt<From>)) return a;
 #  if ZOR_SIMD >= 2
         else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);
@@ -939,6 +1039,19 @@ inline Vec<int16_t, B> mulHiRound(Vec<int16_t, B> a, Vec<int16_t, B> b) {
 template <int B>
 inline Vec<uint64_t, B> sumAbsDiff(Vec<uint8_t, B> a, Vec<uint8_t, B> b) {
     return {Isa<B>::sumAbsDiff8(a.raw, b.raw)};
+}
+// Per 16-byte block: sums of neighbouring 32-bit lanes, a's pairs then b's.
+template <class T, int B>
+inline Vec<T, B> addPairs(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template addPairs<T>(a.raw, b.raw)}; }
+// Three interleaved byte channels (a0 b0 c0 a1 ...: 3 * kLanes bytes) to
+// three registers and back.
+template <int B>
+inline void loadInterleaved3(const uint8_t* p, Vec<uint8_t, B>& a, Vec<uint8_t, B>& b, Vec<uint8_t, B>& c) {
+    Isa<B>::loadInterleaved3(p, a.raw, b.raw, c.raw);
+}
+template <int B>
+inline void storeInterleaved3(uint8_t* p, Vec<uint8_t, B> a, Vec<uint8_t, B> b, Vec<uint8_t, B> c) {
+    Isa<B>::storeInterleaved3(p, a.raw, b.raw, c.raw);
 }
 // Per 16-byte block: byte i is table[idx[i] & 15], zero where idx[i] >= 128.
 template <int B>

@@ -746,9 +746,97 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriDeinterlaceFilterTriangle_8u_C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, uint32_t centerWeight,
         uint32_t layout))
 
-/* ---- image/color/color ---- */
+/* ---- image/color/color ----
+ * Colour model conversions of whole images; every one checks the pointers,
+ * then the size (no step is checked: steps are used as given).
+ * Fixed-point YCbCr forms give exactly the bytes of their integer formulas,
+ * including the low-8-bit chroma wrap, the second luma of a 4:2:2 pair
+ * without the rounding half and the 4:2:0 one-eighth rounding term.
+ * 4:2:0 forms convert the even part of the ROI and return StatusWarnOddSize
+ * when a side is odd; a null step array is a null pointer like the others.
+ * HSV, HLS and YCC compute in double precision and round stores as
+ * trunc(x + 0.499999) (the 16-bit grey truncates); for 8-bit data that is
+ * the exact rational value rounded to nearest with halves down, which the
+ * SIMD RGB-to-HSV rows compute exactly (the other floating-point forms share
+ * one entry).
+ * ColorToGray: float weight w becomes trunc(w * 4096 + 0.5) taken modulo
+ * 2^32 (8u forms); a truncated value that is NaN or of magnitude 2^63 or
+ * more counts as 0; 16u forms store the truncated sum modulo 2^16 (NaN and
+ * magnitudes of 2^63 or more give 0).  A null coefficient pointer selects
+ * the default weights. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToYCbCr_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCrToRGB_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToHSV_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriHSVToRGB_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriRGBToHLS_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriHLSToRGB_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriRGBToYCC_16s_C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriYCCToRGB_16s_C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToYCbCr422_8u_C3C2R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCr422ToRGB_8u_C2C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr420_8u_C3P3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], const int dstStep[3], ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCr420ToBGR_8u_P3C3R,
+       (const uint8_t* const pSrc[3], const int srcStep[3], uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToGray_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriColorToGray_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriColorToGray_8u_AC4C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
+ZOR_FN(ZOR_GENERIC, Status, zoriColorToGray_16u_C3C1R,
+       (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
+ZOR_FN(ZOR_GENERIC, Status, zoriColorToGray_16u_AC4C1R,
+       (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
 
-/* ---- image/color/jpeg ---- */
+/* ---- image/color/jpeg ----
+ * Baseline JPEG building blocks.  Quantisation tables are 64 entries in
+ * natural (row-major) order except the raw table, which is in zigzag order.
+ * The forward DCT (Loeffler-Ligtenberg-Moschytz, 16-bit row results scaled
+ * by 8) on level-shifted samples, per 8 samples x0..x7 of a row, then of a
+ * column, with t_k = x_k + x_(7-k), d_k = x_k - x_(7-k), a >>> n meaning
+ * (a + 2^(n-1)) >> n:
+ *   even: e0 = t0 + t3, e3 = t0 - t3, e1 = t1 + t2, e2 = t1 - t2,
+ *         z = 17734 (e2 + e3);  X2 = z + 25080 e3,  X6 = z - 60547 e2
+ *         (row: X0 = 8 (e0 + e1), X4 = 8 (e0 - e1), X2 >>> 12, X6 >>> 12;
+ *          column: (e0 + e1) >>> 6, (e0 - e1) >>> 6, X2 >>> 21, X6 >>> 21)
+ *   odd:  o_k = (46341 d_k) >>> 12, then the rotations
+ *         z = 799 (o2 + o1):   a = z + 3218 o2,  b = z - 4816 o1,
+ *         z = 3406 (o3 + o0):  c = z - 5681 o3,  d = z - 1130 o0,
+ *         each >>> 12 (row) or >>> 18 (column), and
+ *         X3 = c - a, X5 = b + d, X1 = 46341 (a - b + c + d) >>> 16,
+ *         X7 = 46341 (a + b + c - d) >>> 16
+ *         (column: X3, X5 >>> 3 and X1, X7 >>> 19 instead).
+ * The inverse is the transpose of that flow with the same constants, exact
+ * in 64-bit intermediates except for one rounding of the odd part before its
+ * last sqrt 2 and one of each pass's results (columns kept at 2^3, rows
+ * divided by 8 with the level shift added back and clamped). */
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToY_JPEG_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr_JPEG_8u_C3P3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSampleDownH2V2_JPEG_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst, int dstStep, ImageSize dstRoiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr422LS_MCU_8u16s_C3P3R,
+       (const uint8_t* pSrc, int srcStep, int16_t* const pDstMCU[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriJoin422LS_MCU_16s8u_P3C2R,
+       (const int16_t* const pSrcMCU[3], uint8_t* pDst, int dstStep))
+ZOR_FN(ZOR_SSE2UP, Status, zoriDCTQuantFwd8x8LS_JPEG_8u16s_C1R,
+       (const uint8_t* pSrc, int srcStep, int16_t* pDst, const uint16_t* pQuantFwdTable))
+ZOR_FN(ZOR_GENERIC, Status, zoriDCTQuantInv8x8LS_JPEG_16s8u_C1R,
+       (const int16_t* pSrc, uint8_t* pDst, int dstStep, const uint16_t* pQuantInvTable))
+ZOR_FN(ZOR_GENERIC, Status, zoriQuantFwdTableInit_JPEG_8u16u,
+       (const uint8_t* pQuantRawTable, uint16_t* pQuantFwdTable))
 
 /* ---- signal/transform/dft2d ----
  * Two-dimensional DFT of a real float image of any width W >= 1 and height

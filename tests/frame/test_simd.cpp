@@ -135,4 +135,20 @@ TEST(SimdLanes, DeinterleaveInterleaveAndTransposeKeepLaneOrder) {
     }
 }
 
+TEST(SimdLanes, InterleavedThreeChannelsAndPairSums) {
+    uint8_t block[48], back[48];
+    for (int i = 0; i < 48; ++i) block[i] = uint8_t(7 * i + 3);
+    Vec<uint8_t> a, b, c;
+    loadInterleaved3(block, a, b, c);
+    uint8_t planes[3][16];
+    store(planes[0], a), store(planes[1], b), store(planes[2], c);
+    for (int i = 0; i < 48; ++i) ASSERT_EQ(planes[i % 3][i / 3], block[i]) << i;
+    storeInterleaved3(back, a, b, c);
+    EXPECT_EQ(0, std::memcmp(back, block, 48));
+    const int32_t x[4] = {1, -2, 1 << 30, 5}, y[4] = {7, 8, -9, 10};
+    int32_t got[4];
+    store(got, addPairs(load<Vec<int32_t>>(x), load<Vec<int32_t>>(y)));
+    EXPECT_EQ(std::vector<int32_t>(got, got + 4), (std::vector<int32_t>{-1, (1 << 30) + 5, 15, 1}));
+}
+
 }  // namespace
