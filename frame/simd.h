@@ -21,10 +21,16 @@
 //
 // Lane order.  Operations act lane by lane and keep lane order, except those
 // marked "per 16-byte block": widenLo/widenHi, narrow*, zipLo/zipHi,
-// shuffleBytes, alignBytes and shiftBytes* work within each 16-byte block
-// of a wider register, as the hardware does.  widenLo/widenHi followed by
-// narrow* restores the original order at every width, so kernels that widen,
-// compute and narrow back need not care.
+// concatEven/concatOdd, transpose4, addPairs, shuffleBytes, alignBytes and
+// shiftBytes* work within each 16-byte block of a wider register, as the
+// hardware does.  widenLo/widenHi followed by narrow* restores the original
+// order at every width, so kernels that widen, compute and narrow back need
+// not care; loadWidened and reverseLanes keep (reverse) the order of the
+// whole register.
+//
+// A kernel whose result depends on the width (a fixed accumulation order,
+// lanes counted out per 16-byte block, a byte-shuffle table) names it:
+// Vec<T, 16>.  It then runs at 16 bytes in every column, wider ones too.
 //
 // Every operation is exact and defined for every input; float operations
 // follow IEEE rules lane by lane (min/max: the second operand when either is
@@ -80,12 +86,23 @@ constexpr T absDiff(T a, T b) {
     static_assert(std::is_unsigned_v<T>, "absolute difference of unsigned lanes");
     return a > b ? T(a - b) : T(b - a);
 }
-// |a| of signed lanes; the lowest value stays as it is.
+// |a| of signed lanes; the lowest value stays as it is.  Floats: the sign
+// bit cleared.
 template <class T>
-constexpr T abs(T a) {
+inline T abs(T a) {
     static_assert(std::is_signed_v<T>, "absolute value of signed lanes");
-    if constexpr (std::is_integral_v<T>) return a < 0 ? T(0u - static_cast<std::make_unsigned_t<T>>(a)) : a;
-    else return a < 0 ? -a : a;
+    if constexpr (std::is_integral_v<T>) {
+        return a < 0 ? T(0u - static_cast<std::make_unsigned_t<T>>(a)) : a;
+    } else {
+        // the sign bit cleared, -0 and NaNs included, in integer registers
+        // (an x87 load would quiet a signalling NaN)
+        using U = std::conditional_t<sizeof(T) == 4, uint32_t, uint64_t>;
+        U u;
+        std::memcpy(&u, &a, sizeof u);
+        u &= ~(U(1) << (8 * sizeof(T) - 1));
+        std::memcpy(&a, &u, sizeof u);
+        return a;
+    }
 }
 // Comparisons give bool on lanes, masks on registers; select takes either.
 template <class T>
@@ -105,6 +122,13 @@ template <int N, class T>
 constexpr T shl(T a) { return T(static_cast<std::make_unsigned_t<T>>(a) << N); }
 template <int N, class T>
 constexpr T shr(T a) { return T(a >> N); }
+
+// set1<T>(x) and zero<T>() on plain lanes, so that a generic lambda can
+// write set1<decltype(a)>(c) for registers and lanes alike.
+template <class T, std::enable_if_t<std::is_arithmetic_v<T>, int> = 0>
+constexpr T set1(T x) { return x; }
+template <class T, std::enable_if_t<std::is_arithmetic_v<T>, int> = 0>
+constexpr T zero() { return T(0); }
 
 // ---- registers --------------------------------------------------------------
 
@@ -205,8 +229,14 @@ struct Isa<16> {
     // The lower half of a register from memory, the upper half zero.
     template <class T>
     static R<T> loadHalf(const T* p) {
-        if constexpr (isF<T>)
+        if constexpr (isF<T>) {
+            // movq from SSE2 on: no dependency on an older register value
+#  if ZOR_SIMD >= 2
+            return _mm_castsi128_ps(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+#  else
             return _mm_loadl_pi(_mm_setzero_ps(), reinterpret_cast<const __m64*>(p));
+#  endif
+        }
 #  if ZOR_SIMD >= 2
         else if constexpr (isD<T>) return _mm_load_sd(p);
         else return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(p));
@@ -601,6 +631,17 @@ struct Isa<16> {
     static __m128i doubleToInt32(__m128d lo, __m128d hi) {
         return _mm_unpacklo_epi64(_mm_cvtpd_epi32(lo), _mm_cvtpd_epi32(hi));
     }
+    static __m128i doubleToInt32Trunc(__m128d lo, __m128d hi) {
+        return _mm_unpacklo_epi64(_mm_cvttpd_epi32(lo), _mm_cvttpd_epi32(hi));
+    }
+    // a0 + a1, b0 + b1
+    static __m128d addPairs(__m128d a, __m128d b) {
+#    if ZOR_SIMD >= 3
+        return _mm_hadd_pd(a, b);
+#    else
+        return _mm_add_pd(_mm_unpacklo_pd(a, b), _mm_unpackhi_pd(a, b));
+#    endif
+    }
 #  endif  // ZOR_SIMD >= 2
 
     // One bit per lane of 32 or 64-bit lanes (their sign bits).
@@ -616,10 +657,109 @@ struct Isa<16> {
 #  endif
     }
 
+    // The lanes of a mask as bits (one per byte for integer lanes, one per
+    // lane for float and double), and the value with every lane set.
+    template <class T>
+    static int maskBits(R<T> m) {
+        if constexpr (isF<T>) return _mm_movemask_ps(m);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_movemask_pd(m);
+        else return _mm_movemask_epi8(m);
+#  endif
+    }
+    template <class T>
+    static constexpr int kMaskBitsPerLane = isInt<T> ? int(sizeof(T)) : 1;
+    template <class T>
+    static constexpr int kMaskFull = (1 << (16 / sizeof(T) * kMaskBitsPerLane<T>)) - 1;
+    template <class T>
+    static bool anyTrue(R<T> m) { return maskBits<T>(m) != 0; }
+    template <class T>
+    static bool allTrue(R<T> m) { return maskBits<T>(m) == kMaskFull<T>; }
+    // The first set lane of a mask, the lane count when none is.
+    template <class T>
+    static int firstTrue(R<T> m) {
+        return __builtin_ctz(unsigned(maskBits<T>(m)) | (unsigned(kMaskFull<T>) + 1u)) / kMaskBitsPerLane<T>;
+    }
+
+    // Lane I as a scalar.
+    template <int I, class T>
+    static T getLane(R<T> a) {
+        static_assert(I >= 0 && I < 16 / int(sizeof(T)), "lane index out of range");
+        if constexpr (isF<T>) return _mm_cvtss_f32(I == 0 ? a : _mm_shuffle_ps(a, a, I));
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_cvtsd_f64(I == 0 ? a : _mm_unpackhi_pd(a, a));
+        else if constexpr (sizeof(T) == 1) return T(_mm_extract_epi16(a, I / 2) >> (8 * (I % 2)));
+        else if constexpr (sizeof(T) == 2) return T(_mm_extract_epi16(a, I));
+        else if constexpr (sizeof(T) == 4) return T(_mm_cvtsi128_si32(I == 0 ? a : _mm_shuffle_epi32(a, I)));
+#  endif
+        else static_assert(sizeof(T) == 0, "no lane access for 64-bit integers");
+    }
+
+    // Lane order reversed over the whole register.
+    template <class T>
+    static R<T> reverseLanes(R<T> a) {
+        if constexpr (isF<T>) return _mm_shuffle_ps(a, a, _MM_SHUFFLE(0, 1, 2, 3));
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_shuffle_pd(a, a, 1);
+        else if constexpr (sizeof(T) == 8) return _mm_shuffle_epi32(a, _MM_SHUFFLE(1, 0, 3, 2));
+        else if constexpr (sizeof(T) == 4) return _mm_shuffle_epi32(a, _MM_SHUFFLE(0, 1, 2, 3));
+#    if ZOR_SIMD >= 4
+        else if constexpr (sizeof(T) == 1)
+            return _mm_shuffle_epi8(a, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
+#    endif
+        else {
+            const __m128i w = _mm_shufflehi_epi16(
+                _mm_shufflelo_epi16(_mm_shuffle_epi32(a, _MM_SHUFFLE(0, 1, 2, 3)), _MM_SHUFFLE(2, 3, 0, 1)),
+                _MM_SHUFFLE(2, 3, 0, 1));
+            if constexpr (sizeof(T) == 2) return w;
+            else return _mm_or_si128(_mm_slli_epi16(w, 8), _mm_srli_epi16(w, 8));  // bytes of each word swapped
+        }
+#  endif
+    }
+    // Per 16-byte block: lanes 0 and 2 (1 and 3) of a, then those of b, of
+    // 32-bit lanes.
+    template <class T>
+    static R<T> concatEven(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatEven of 32-bit lanes");
+        if constexpr (isF<T>) return _mm_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+#  if ZOR_SIMD >= 2
+        else return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), _MM_SHUFFLE(2, 0, 2, 0)));
+#  endif
+    }
+    template <class T>
+    static R<T> concatOdd(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatOdd of 32-bit lanes");
+        if constexpr (isF<T>) return _mm_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+#  if ZOR_SIMD >= 2
+        else return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), _MM_SHUFFLE(3, 1, 3, 1)));
+#  endif
+    }
+    // Per 16-byte block: the 4 x 4 matrix of 32-bit lanes in a, b, c, d
+    // (rows) transposed.
+    template <class T>
+    static void transpose4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        static_assert(sizeof(T) == 4, "transpose4 of 32-bit lanes");
+        if constexpr (isF<T>) {
+            _MM_TRANSPOSE4_PS(a, b, c, d);
+        }
+#  if ZOR_SIMD >= 2
+        else {
+            const __m128i t0 = _mm_unpacklo_epi32(a, b), t1 = _mm_unpackhi_epi32(a, b);
+            const __m128i t2 = _mm_unpacklo_epi32(c, d), t3 = _mm_unpackhi_epi32(c, d);
+            a = _mm_unpacklo_epi64(t0, t2);
+            b = _mm_unpackhi_epi64(t0, t2);
+            c = _mm_unpacklo_epi64(t1, t3);
+            d = _mm_unpackhi_epi64(t1, t3);
+        }
+#  endif
+    }
+    // About 12 bits of 1/a (rcpps).
+    static __m128 recipApprox(__m128 a) { return _mm_rcp_ps(a); }
+
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
-        if constexpr (std::is_same_v<R<To>, R<From>>) return a;
+        if constexpr (std::is_same_v<To, From> || (isInt<To> && isInt<From>)) return a;
 #  if ZOR_SIMD >= 2
         else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);
         else if constexpr (isD<To> && isF<From>) return _mm_castps_pd(a);
@@ -769,8 +909,39 @@ inline Vec<T, B> select(Vec<T, B> mask, Vec<T, B> a, Vec<T, B> b) {
 // lane's sign; bytes: one bit per byte).
 template <class T, int B>
 inline int laneMask(Vec<T, B> a) { return Isa<B>::template laneMask<T>(a.raw); }
+// Tests of masks (lanes all ones or all zeros).
 template <class T, int B>
-inline bool anyTrue(Vec<T, B> mask) { return laneMask(mask) != 0; }
+inline bool anyTrue(Vec<T, B> mask) { return Isa<B>::template anyTrue<T>(mask.raw); }
+template <class T, int B>
+inline bool allTrue(Vec<T, B> mask) { return Isa<B>::template allTrue<T>(mask.raw); }
+// The index of the first set lane of a mask, kLanes when none is set.
+template <class T, int B>
+inline int firstTrue(Vec<T, B> mask) { return Isa<B>::template firstTrue<T>(mask.raw); }
+
+// Lane I as a scalar (8, 16 and 32-bit integers, float, double).
+template <int I, class T, int B>
+inline T getLane(Vec<T, B> a) { return Isa<B>::template getLane<I, T>(a.raw); }
+// The lanes in reverse order (over the whole register).
+template <class T, int B>
+inline Vec<T, B> reverseLanes(Vec<T, B> a) { return {Isa<B>::template reverseLanes<T>(a.raw)}; }
+// Per 16-byte block, 32-bit lanes: a0 a2 b0 b2 (concatEven), a1 a3 b1 b3
+// (concatOdd): interleaved pairs split apart.
+template <class T, int B>
+inline Vec<T, B> concatEven(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template concatEven<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> concatOdd(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template concatOdd<T>(a.raw, b.raw)}; }
+// Per 16-byte block, 32-bit lanes: the 4 x 4 matrix whose rows are a, b, c,
+// d, transposed in place.
+template <class T, int B>
+inline void transpose4(Vec<T, B>& a, Vec<T, B>& b, Vec<T, B>& c, Vec<T, B>& d) {
+    Isa<B>::template transpose4<T>(a.raw, b.raw, c.raw, d.raw);
+}
+// An estimate of 1/a with a relative error below 1.5 * 2^-12.
+template <int B>
+inline Vec<float, B> recipApprox(Vec<float, B> a) { return {Isa<B>::recipApprox(a.raw)}; }
+// Per 16-byte block: a0 + a1, b0 + b1 of double lanes.
+template <int B>
+inline Vec<double, B> addPairs(Vec<double, B> a, Vec<double, B> b) { return {Isa<B>::addPairs(a.raw, b.raw)}; }
 
 template <int N, class T, int B>
 inline Vec<T, B> shl(Vec<T, B> a) { return {Isa<B>::template shl<T, N>(a.raw)}; }
@@ -814,6 +985,14 @@ inline Vec<To, B> narrowSat(Vec<From, B> lo, Vec<From, B> hi) {
     if constexpr (std::is_same_v<From, double>) return {Isa<B>::doubleToFloat(lo.raw, hi.raw)};
     else return {Isa<B>::template narrowSat<To, From>(lo.raw, hi.raw)};
 }
+// V::kLanes values of the lane type half as wide from p, widened in order
+// (zero- or sign-extended by N's signedness; floats to double).
+template <class V, class N>
+inline V loadWidened(const N* p) {
+    static_assert(sizeof(N) * 2 == sizeof(typename V::Lane), "loadWidened doubles the lane size");
+    static_assert(V::kBytes == 16, "wider registers widen across blocks: give their Isa a loadWidened");
+    return bitcast<typename V::Lane>(widenLo(loadHalf<Vec<N, V::kBytes>>(p)));
+}
 // Per 16-byte block: keeps the low bits of every lane.
 template <class To, class From, int B>
 inline Vec<To, B> narrowTrunc(Vec<From, B> lo, Vec<From, B> hi) {
@@ -838,10 +1017,15 @@ template <int B>
 inline Vec<double, B> toDoubleLo(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleLo(a.raw)}; }
 template <int B>
 inline Vec<double, B> toDoubleHi(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleHi(a.raw)}; }
-// Two registers of doubles into one of 32-bit integers (rounded by MXCSR).
+// Two registers of doubles into one of 32-bit integers (rounded by MXCSR,
+// or truncated); INT_MIN for NaN and out-of-range lanes.
 template <int B>
 inline Vec<int32_t, B> toInt32(Vec<double, B> lo, Vec<double, B> hi) {
     return {Isa<B>::doubleToInt32(lo.raw, hi.raw)};
+}
+template <int B>
+inline Vec<int32_t, B> toInt32Trunc(Vec<double, B> lo, Vec<double, B> hi) {
+    return {Isa<B>::doubleToInt32Trunc(lo.raw, hi.raw)};
 }
 
 // Neighbouring 16-bit lanes multiplied and summed into 32-bit lanes.
@@ -919,12 +1103,13 @@ inline T reduceMax(Vec<T, B> v) {
 // d[i] = op(s[i]) for i < n: whole registers while they fit (two at a time),
 // then one element at a time.  op is called with Vec<S> and with S (a generic
 // lambda over the names above serves both) and gives Vec<D> / D; D and S
-// must have the same size.  Reads every source element before the store of
-// its register, so d == s works.
+// must have the same size.  An op that takes lanes only runs lane by lane.
+// Reads every source element before the store of its register, so d == s
+// works.
 template <class D, class S, class Op>
 inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
-    if constexpr (kHas<S> && kHas<D>) {
+    if constexpr (kHas<S> && kHas<D> && std::is_invocable_v<Op&, Vec<S>>) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
         using V = Vec<S>;
         constexpr int L = V::kLanes;
@@ -944,7 +1129,7 @@ inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
 template <class D, class S, class Op>
 inline void mapLanes(const S* a, const S* b, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
-    if constexpr (kHas<S> && kHas<D>) {
+    if constexpr (kHas<S> && kHas<D> && std::is_invocable_v<Op&, Vec<S>, Vec<S>>) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
         using V = Vec<S>;
         constexpr int L = V::kLanes;
