@@ -804,7 +804,7 @@ struct Isa<16> {
 // ---- the vocabulary -----------------------------------------------------------
 // Free functions over Vec<T, B>; each forwards to Isa<B>.
 
-template <class V>
+template <class V, std::enable_if_t<!std::is_arithmetic_v<V>, int> = 0>
 inline V zero() { return {Isa<V::kBytes>::template zero<typename V::Lane>()}; }
 template <class V>
 inline V set1(typename V::Lane x) { return {Isa<V::kBytes>::template set1<typename V::Lane>(x)}; }
@@ -1109,18 +1109,20 @@ inline T reduceMax(Vec<T, B> v) {
 template <class D, class S, class Op>
 inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
-    if constexpr (kHas<S> && kHas<D> && std::is_invocable_v<Op&, Vec<S>>) {
+    if constexpr (kHas<S> && kHas<D>) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
-        using V = Vec<S>;
-        constexpr int L = V::kLanes;
-        for (; i + 2 * L <= n; i += 2 * L) {
-            const V a = load<V>(s + i), b = load<V>(s + i + L);
-            store(d + i, op(a));
-            store(d + i + L, op(b));
-        }
-        if (i + L <= n) {
-            store(d + i, op(load<V>(s + i)));
-            i += L;
+        if constexpr (std::is_invocable_v<Op&, Vec<S>>) {
+            using V = Vec<S>;
+            constexpr int L = V::kLanes;
+            for (; i + 2 * L <= n; i += 2 * L) {
+                const V a = load<V>(s + i), b = load<V>(s + i + L);
+                store(d + i, op(a));
+                store(d + i + L, op(b));
+            }
+            if (i + L <= n) {
+                store(d + i, op(load<V>(s + i)));
+                i += L;
+            }
         }
     }
     for (; i < n; ++i) d[i] = op(s[i]);
@@ -1129,19 +1131,21 @@ inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
 template <class D, class S, class Op>
 inline void mapLanes(const S* a, const S* b, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
-    if constexpr (kHas<S> && kHas<D> && std::is_invocable_v<Op&, Vec<S>, Vec<S>>) {
+    if constexpr (kHas<S> && kHas<D>) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
-        using V = Vec<S>;
-        constexpr int L = V::kLanes;
-        for (; i + 2 * L <= n; i += 2 * L) {
-            const V a0 = load<V>(a + i), b0 = load<V>(b + i);
-            const V a1 = load<V>(a + i + L), b1 = load<V>(b + i + L);
-            store(d + i, op(a0, b0));
-            store(d + i + L, op(a1, b1));
-        }
-        if (i + L <= n) {
-            store(d + i, op(load<V>(a + i), load<V>(b + i)));
-            i += L;
+        if constexpr (std::is_invocable_v<Op&, Vec<S>, Vec<S>>) {
+            using V = Vec<S>;
+            constexpr int L = V::kLanes;
+            for (; i + 2 * L <= n; i += 2 * L) {
+                const V a0 = load<V>(a + i), b0 = load<V>(b + i);
+                const V a1 = load<V>(a + i + L), b1 = load<V>(b + i + L);
+                store(d + i, op(a0, b0));
+                store(d + i + L, op(a1, b1));
+            }
+            if (i + L <= n) {
+                store(d + i, op(load<V>(a + i), load<V>(b + i)));
+                i += L;
+            }
         }
     }
     for (; i < n; ++i) d[i] = op(a[i], b[i]);

@@ -12,6 +12,7 @@
 #include "frame/variant.h"
 #include "frame/fpu.h"
 #include "frame/status.h"
+#include "frame/simd.h"
 
 #include <cmath>
 #include <cstddef>
@@ -35,110 +36,48 @@ inline float floatOf(uint32_t u) {
 // The quiet NaN that square root and logarithm leave for negative inputs.
 constexpr uint32_t kNegNaN = 0xFFC00000u;
 
-// ---- elementwise float kernels ------------------------------------------------
+// ---- elementwise kernels ------------------------------------------------------
 //
-// An operation is a small struct: operator() on scalars and, under SSE, vec()
-// on four lanes.  The loops load before they store, so in-place calls (the
-// same pointer as source and destination) are safe.  Operations are passed by
-// value so that their constants stay in registers across the stores.
+// Each operation is written once, as a generic lambda (or a struct with a
+// lane and a register overload) over the lane vocabulary, and run by
+// simd::mapLanes: registers from the column that has them (floats from SSE,
+// 16-bit lanes from SSE2), single elements for the rest.  mapLanes loads
+// before it stores, so in-place calls (the same pointer as source and
+// destination) are safe.
 
-#if ZOR_SIMD >= 1
-#  define ZOR_VEC1(expr) \
-      __m128 vec(__m128 a) const { return expr; }
-#  define ZOR_VEC2(expr) \
-      __m128 vec(__m128 a, __m128 b) const { return expr; }
-#else
-#  define ZOR_VEC1(expr)
-#  define ZOR_VEC2(expr)
-#endif
+constexpr auto kAdd = [](auto a, auto b) { return a + b; };
+constexpr auto kSub = [](auto a, auto b) { return a - b; };
+constexpr auto kMul = [](auto a, auto b) { return a * b; };
+constexpr auto kDiv = [](auto a, auto b) { return a / b; };
+constexpr auto kSquare = [](auto a) { return a * a; };
+// Float absolute value clears the sign bit, NaNs included.
+constexpr auto kAbs = [](auto a) { return simd::abs(a); };
 
-template <class Op>
-void map32f(const float* s, float* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 1
-    for (; i + 8 <= n; i += 8) {
-        const __m128 a = _mm_loadu_ps(s + i), b = _mm_loadu_ps(s + i + 4);
-        _mm_storeu_ps(d + i, op.vec(a));
-        _mm_storeu_ps(d + i + 4, op.vec(b));
-    }
-    for (; i + 4 <= n; i += 4) _mm_storeu_ps(d + i, op.vec(_mm_loadu_ps(s + i)));
-#endif
-    for (; i < n; ++i) d[i] = op(s[i]);
-}
-
-template <class Op>
-void map32f(const float* s1, const float* s2, float* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 1
-    for (; i + 8 <= n; i += 8) {
-        const __m128 a0 = _mm_loadu_ps(s1 + i), a1 = _mm_loadu_ps(s1 + i + 4);
-        const __m128 b0 = _mm_loadu_ps(s2 + i), b1 = _mm_loadu_ps(s2 + i + 4);
-        _mm_storeu_ps(d + i, op.vec(a0, b0));
-        _mm_storeu_ps(d + i + 4, op.vec(a1, b1));
-    }
-    for (; i + 4 <= n; i += 4)
-        _mm_storeu_ps(d + i, op.vec(_mm_loadu_ps(s1 + i), _mm_loadu_ps(s2 + i)));
-#endif
-    for (; i < n; ++i) d[i] = op(s1[i], s2[i]);
-}
-
-struct AddF { float operator()(float a, float b) const { return a + b; } ZOR_VEC2(_mm_add_ps(a, b)) };
-struct SubF { float operator()(float a, float b) const { return a - b; } ZOR_VEC2(_mm_sub_ps(a, b)) };
-struct MulF { float operator()(float a, float b) const { return a * b; } ZOR_VEC2(_mm_mul_ps(a, b)) };
-struct DivF { float operator()(float a, float b) const { return a / b; } ZOR_VEC2(_mm_div_ps(a, b)) };
-
-// Operations with a constant keep it both as a scalar and broadcast.
-struct ConstF {
-    float c;
-#if ZOR_SIMD >= 1
-    __m128 vc;
-    explicit ConstF(float v) : c(v), vc(_mm_set1_ps(v)) {}
-#else
-    explicit ConstF(float v) : c(v) {}
-#endif
-};
-struct AddCF : ConstF { using ConstF::ConstF; float operator()(float a) const { return a + c; } ZOR_VEC1(_mm_add_ps(a, vc)) };
-struct SubCF : ConstF { using ConstF::ConstF; float operator()(float a) const { return a - c; } ZOR_VEC1(_mm_sub_ps(a, vc)) };
-struct MulCF : ConstF { using ConstF::ConstF; float operator()(float a) const { return a * c; } ZOR_VEC1(_mm_mul_ps(a, vc)) };
-
-struct SqrF { float operator()(float a) const { return a * a; } ZOR_VEC1(_mm_mul_ps(a, a)) };
-
-// Absolute value clears the sign bit, NaNs included.
-struct AbsF {
-    float operator()(float a) const { return floatOf(bitsOf(a) & 0x7FFFFFFFu); }
-    ZOR_VEC1(_mm_andnot_ps(_mm_set1_ps(-0.0f), a))
-};
-
-#if ZOR_SIMD >= 1
-// a where mask is clear, b where it is set.
-inline __m128 select(__m128 mask, __m128 a, __m128 b) {
-    return _mm_or_ps(_mm_andnot_ps(mask, a), _mm_and_ps(mask, b));
-}
-#endif
+// Operations with a constant c.
+inline auto addConst(float c) { return [c](auto a) { return a + simd::set1<decltype(a)>(c); }; }
+inline auto subConst(float c) { return [c](auto a) { return a - simd::set1<decltype(a)>(c); }; }
+inline auto mulConst(float c) { return [c](auto a) { return a * simd::set1<decltype(a)>(c); }; }
 
 // Clipping keeps NaN elements (no comparison holds for them).
-struct ClipAbove : ConstF {
-    using ConstF::ConstF;
-    float operator()(float a) const { return a > c ? c : a; }
-    ZOR_VEC1(select(_mm_cmpgt_ps(a, vc), a, vc))
-};
-struct ClipBelow : ConstF {
-    using ConstF::ConstF;
-    float operator()(float a) const { return a < c ? c : a; }
-    ZOR_VEC1(select(_mm_cmplt_ps(a, vc), a, vc))
-};
+inline auto clipAbove(float c) {
+    return [c](auto a) {
+        const auto v = simd::set1<decltype(a)>(c);
+        return simd::select(simd::gt(a, v), v, a);
+    };
+}
+inline auto clipBelow(float c) {
+    return [c](auto a) {
+        const auto v = simd::set1<decltype(a)>(c);
+        return simd::select(simd::lt(a, v), v, a);
+    };
+}
 // Replaces every element that is not >= level (so NaNs too) by value.
-struct BelowToValue : ConstF {
-    float value;
-#if ZOR_SIMD >= 1
-    __m128 vvalue;
-    BelowToValue(float level, float v) : ConstF(level), value(v), vvalue(_mm_set1_ps(v)) {}
-#else
-    BelowToValue(float level, float v) : ConstF(level), value(v) {}
-#endif
-    float operator()(float a) const { return a >= c ? a : value; }
-    ZOR_VEC1(select(_mm_cmpnge_ps(a, vc), a, vvalue))
-};
+inline auto belowToValue(float level, float value) {
+    return [level, value](auto a) {
+        using A = decltype(a);
+        return simd::select(simd::ge(a, simd::set1<A>(level)), a, simd::set1<A>(value));
+    };
+}
 
 void copy32f(const float* s, float* d, int n) {
     if (s != d) std::memmove(d, s, static_cast<size_t>(n) * sizeof(float));
@@ -147,165 +86,85 @@ void zero32f(float* d, int n) { std::memset(d, 0, static_cast<size_t>(n) * sizeo
 
 // ---- 16-bit integer kernels ---------------------------------------------------
 
-#if ZOR_SIMD >= 2
-#  define ZOR_VEC16_1(expr) \
-      __m128i vec(__m128i a) const { return expr; }
-#  define ZOR_VEC16_2(expr) \
-      __m128i vec(__m128i a, __m128i b) const { return expr; }
-#else
-#  define ZOR_VEC16_1(expr)
-#  define ZOR_VEC16_2(expr)
-#endif
-
-template <class Op>
-void map16s(const int16_t* s, int16_t* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    if (op.simd()) {
-        for (; i + 8 <= n; i += 8) {
-            const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s + i));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i), op.vec(a));
-        }
-    }
-#endif
-    for (; i < n; ++i) d[i] = op(s[i]);
-}
-
-template <class Op>
-void map16s(const int16_t* s1, const int16_t* s2, int16_t* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    if (op.simd()) {
-        for (; i + 16 <= n; i += 16) {
-            const __m128i a0 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s1 + i));
-            const __m128i b0 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s2 + i));
-            const __m128i a1 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s1 + i + 8));
-            const __m128i b1 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s2 + i + 8));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i), op.vec(a0, b0));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i + 8), op.vec(a1, b1));
-        }
-        for (; i + 8 <= n; i += 8) {
-            const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s1 + i));
-            const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s2 + i));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i), op.vec(a, b));
-        }
-    }
-#endif
-    for (; i < n; ++i) d[i] = op(s1[i], s2[i]);
-}
-
 // |x| with -32768 saturating to 32767: max(x, 0 -sat x).
-struct Abs16 {
-    bool simd() const { return true; }
-    int16_t operator()(int16_t a) const { return saturate<int16_t>(a < 0 ? -int32_t(a) : int32_t(a)); }
-    ZOR_VEC16_1(_mm_max_epi16(a, _mm_subs_epi16(_mm_setzero_si128(), a)))
-};
+constexpr auto kAbs16 = [](auto a) { return simd::max(a, simd::subSat(simd::zero<decltype(a)>(), a)); };
 
-// Saturated sum with a constant (a difference is a sum with -val, formed
-// in 32 bits so that -(-32768) is exact).
-struct AddC16 {
-    int32_t c;
-    bool simd() const { return c >= -32768 && c <= 32767; }
-    int16_t operator()(int16_t a) const { return saturate<int16_t>(int32_t(a) + c); }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a) const { return _mm_adds_epi16(a, _mm_set1_epi16(static_cast<int16_t>(c))); }
-#endif
-};
+// Saturated sum with a constant in -32768 .. 32768 (a difference is a sum
+// with -val, formed in 32 bits so that -(-32768) is exact; that one constant
+// goes element by element).
+template <class Run>
+void addConst16(int32_t c, Run&& run) {
+    if (c <= 32767)
+        run([v = int16_t(c)](auto a) { return simd::addSat(a, simd::set1<decltype(a)>(v)); });
+    else
+        run([c](int16_t a) { return saturate<int16_t>(int32_t(a) + c); });
+}
 
 // Sum of two vectors scaled by 2^-sf with ties to even (see zorsAdd_16s_Sfs).
-struct AddSfs16 {
+struct AddScaled16 {
     int sf;
-    bool simd() const { return true; }
     int16_t operator()(int16_t a, int16_t b) const {
         return saturate<int16_t>(scaleRound(int32_t(a) + int32_t(b), sf));
     }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a, __m128i b) const {
-        if (sf == 0) return _mm_adds_epi16(a, b);
-        if (sf > 16) return _mm_setzero_si128();
+    template <int B>
+    simd::Vec<int16_t, B> operator()(simd::Vec<int16_t, B> a, simd::Vec<int16_t, B> b) const {
+        using namespace simd;
+        using V = Vec<int16_t, B>;
+        using W = Vec<int32_t, B>;
+        if (sf == 0) return addSat(a, b);
+        if (sf > 16) return zero<V>();
         if (sf <= -16) {
             // Only the sign of the sum survives; the saturating sum keeps it.
-            const __m128i s = _mm_adds_epi16(a, b), z = _mm_setzero_si128();
-            const __m128i pos = _mm_and_si128(_mm_cmpgt_epi16(s, z), _mm_set1_epi16(32767));
-            const __m128i neg = _mm_and_si128(_mm_cmplt_epi16(s, z), _mm_set1_epi16(-32768));
-            return _mm_or_si128(pos, neg);
+            const V s = addSat(a, b), z = zero<V>();
+            return (gt(s, z) & set1<V>(32767)) | (lt(s, z) & set1<V>(-32768));
         }
-        // Widen to 32 bits: the low/high halves sign-extended.
-        __m128i lo = _mm_add_epi32(_mm_srai_epi32(_mm_unpacklo_epi16(a, a), 16),
-                                   _mm_srai_epi32(_mm_unpacklo_epi16(b, b), 16));
-        __m128i hi = _mm_add_epi32(_mm_srai_epi32(_mm_unpackhi_epi16(a, a), 16),
-                                   _mm_srai_epi32(_mm_unpackhi_epi16(b, b), 16));
+        W lo = widenLo(a) + widenLo(b), hi = widenHi(a) + widenHi(b);
         if (sf < 0) {
-            const __m128i cnt = _mm_cvtsi32_si128(-sf);
-            lo = _mm_sll_epi32(lo, cnt);
-            hi = _mm_sll_epi32(hi, cnt);
+            lo = shl(lo, -sf);
+            hi = shl(hi, -sf);
         } else {
-            const __m128i cnt = _mm_cvtsi32_si128(sf);
-            const __m128i half = _mm_set1_epi32((1 << (sf - 1)) - 1), one = _mm_set1_epi32(1);
-            lo = _mm_sra_epi32(_mm_add_epi32(_mm_add_epi32(lo, half),
-                                             _mm_and_si128(_mm_sra_epi32(lo, cnt), one)), cnt);
-            hi = _mm_sra_epi32(_mm_add_epi32(_mm_add_epi32(hi, half),
-                                             _mm_and_si128(_mm_sra_epi32(hi, cnt), one)), cnt);
+            const W half = set1<W>((1 << (sf - 1)) - 1), one = set1<W>(1);
+            lo = shr(lo + half + (shr(lo, sf) & one), sf);
+            hi = shr(hi + half + (shr(hi, sf) & one), sf);
         }
-        return _mm_packs_epi32(lo, hi);
+        return narrowSat<int16_t>(lo, hi);
     }
-#endif
 };
 
-// Product scaled by 2^-sf, rounded half up (toward +inf), saturated.  The
-// SIMD path covers 0 <= sf <= 30, where p + 2^(sf-1) stays inside 32 bits.
-struct MulNR16 {
+// Product scaled by 2^-sf, rounded half up (toward +inf), saturated.  In
+// registers for 0 <= sf <= 30, where p + 2^(sf-1) stays inside 32 bits.
+struct MulRounded16 {
     int sf;
-#if ZOR_SIMD >= 2
-    __m128i cnt, half;
-    explicit MulNR16(int scale)
-        : sf(scale), cnt(_mm_cvtsi32_si128(scale)),
-          half(_mm_set1_epi32(scale > 0 && scale <= 30 ? 1 << (scale - 1) : 0)) {}
-#else
-    explicit MulNR16(int scale) : sf(scale) {}
-#endif
-    bool simd() const { return sf <= 30; }
+    bool fitsRegisters() const { return sf <= 30; }
     int16_t operator()(int16_t a, int16_t b) const {
         return saturate<int16_t>(scaleRoundHalfUp(int32_t(a) * int32_t(b), sf));
     }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a, __m128i b) const {
-        const __m128i pl = _mm_mullo_epi16(a, b), ph = _mm_mulhi_epi16(a, b);
-        __m128i lo = _mm_unpacklo_epi16(pl, ph), hi = _mm_unpackhi_epi16(pl, ph);
+    template <int B>
+    simd::Vec<int16_t, B> operator()(simd::Vec<int16_t, B> a, simd::Vec<int16_t, B> b) const {
+        using namespace simd;
+        using W = Vec<int32_t, B>;
+        const auto low = a * b, high = mulHi(a, b);
         // With sf 0 both the half and the shift are 0.
-        lo = _mm_sra_epi32(_mm_add_epi32(lo, half), cnt);
-        hi = _mm_sra_epi32(_mm_add_epi32(hi, half), cnt);
-        return _mm_packs_epi32(lo, hi);
+        const W half = set1<W>(sf > 0 ? 1 << (sf - 1) : 0);
+        const W lo = shr(bitcast<int32_t>(zipLo(low, high)) + half, sf);
+        const W hi = shr(bitcast<int32_t>(zipHi(low, high)) + half, sf);
+        return narrowSat<int16_t>(lo, hi);
     }
-#endif
-};
-struct MulCNR16 : MulNR16 {
-    int16_t c;
-    MulCNR16(int scale, int16_t v) : MulNR16(scale), c(v) {}
-    int16_t operator()(int16_t a) const { return MulNR16::operator()(a, c); }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a) const { return MulNR16::vec(a, _mm_set1_epi16(c)); }
-#endif
 };
 
-// ---- 64-bit float absolute value ---------------------------------------------
-
-[[maybe_unused]] void abs64f(const double* s, double* d, int n) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    const __m128d m = _mm_castsi128_pd(_mm_set1_epi64x(0x7FFFFFFFFFFFFFFFll));
-    for (; i + 4 <= n; i += 4) {
-        const __m128d a = _mm_loadu_pd(s + i), b = _mm_loadu_pd(s + i + 2);
-        _mm_storeu_pd(d + i, _mm_and_pd(a, m));
-        _mm_storeu_pd(d + i + 2, _mm_and_pd(b, m));
-    }
-#endif
-    for (; i < n; ++i) {
-        uint64_t u;
-        std::memcpy(&u, s + i, 8);
-        u &= 0x7FFFFFFFFFFFFFFFull;
-        std::memcpy(d + i, &u, 8);
-    }
+// MulRounded16 on registers where it can, element by element otherwise.
+[[maybe_unused]] void mulRounded16(const int16_t* a, const int16_t* b, int16_t* d, int n, MulRounded16 op) {
+    if (op.fitsRegisters())
+        simd::mapLanes(a, b, d, n, op);
+    else
+        simd::mapLanes(a, b, d, n, [op](int16_t x, int16_t y) { return op(x, y); });
+}
+[[maybe_unused]] void mulRounded16(const int16_t* s, int16_t c, int16_t* d, int n, MulRounded16 op) {
+    const auto withC = [op, c](auto a) { return op(a, simd::set1<decltype(a)>(c)); };
+    if (op.fitsRegisters())
+        simd::mapLanes(s, d, n, withC);
+    else
+        simd::mapLanes(s, d, n, [withC](int16_t x) { return withC(x); });
 }
 
 // ---- square root and logarithm -------------------------------------------------
@@ -313,15 +172,17 @@ struct MulCNR16 : MulNR16 {
 void sqrtInPlace(float* p, int n, bool& negative) {
     int i = 0;
 #if ZOR_SIMD >= 1
-    const __m128 zero = _mm_setzero_ps(), nan = _mm_set1_ps(floatOf(kNegNaN));
-    __m128 seen = _mm_setzero_ps();
-    for (; i + 4 <= n; i += 4) {
-        const __m128 x = _mm_loadu_ps(p + i);
-        const __m128 bad = _mm_cmpnge_ps(x, zero);  // negative or NaN
-        seen = _mm_or_ps(seen, bad);
-        _mm_storeu_ps(p + i, select(bad, _mm_sqrt_ps(x), nan));
+    using namespace simd;
+    using V = Vec<float>;
+    const V z = zero<V>(), nan = set1<V>(floatOf(kNegNaN));
+    V allGood = ~z;
+    for (; i + V::kLanes <= n; i += V::kLanes) {
+        const V x = load<V>(p + i);
+        const V good = ge(x, z);  // neither negative nor NaN
+        allGood = allGood & good;
+        store(p + i, select(good, sqrt(x), nan));
     }
-    if (_mm_movemask_ps(seen)) negative = true;
+    if (!allTrue(allGood)) negative = true;
 #endif
     for (; i < n; ++i) {
         if (p[i] >= 0.0f) {
@@ -357,6 +218,12 @@ inline float lnElement(float x, Status& first) {
 // elements (about one in ten thousand) are recomputed with the library.
 
 #if ZOR_SIMD >= 2
+// Both kernels work on four elements as two pairs of doubles, with table
+// rows fetched per element: 16-byte registers.
+using F4 = simd::Vec<float, 16>;
+using I4 = simd::Vec<int32_t, 16>;
+using D2 = simd::Vec<double, 16>;
+
 // Lanes (of the four doubles y0[0], y0[1], y1[0], y1[1], normal-range float
 // values) that lie within Margin double ulps of a float rounding midpoint.
 // A double rounds to float by its 29 low mantissa bits: the midpoints are
@@ -364,17 +231,12 @@ inline float lnElement(float x, Status& first) {
 // midpoint below a power of two (whose float neighbour below is closer) lies
 // 2^27 ulps away, beyond any Margin used here.
 template <int Margin>
-inline __m128i nearMidpoint(__m128d y0, __m128d y1) {
+inline I4 nearMidpoint(D2 y0, D2 y1) {
+    using namespace simd;
     static_assert(Margin > 0 && Margin < (1 << 26), "margin must stay inside one float ulp");
-    const __m128i low = _mm_castps_si128(
-        _mm_shuffle_ps(_mm_castpd_ps(y0), _mm_castpd_ps(y1), _MM_SHUFFLE(2, 0, 2, 0)));
-    const __m128i off = _mm_and_si128(_mm_add_epi32(low, _mm_set1_epi32(Margin - (1 << 28))),
-                                      _mm_set1_epi32(0x1FFFFFFF));
-    return _mm_cmplt_epi32(off, _mm_set1_epi32(2 * Margin));
-}
-
-inline __m128d loadRow(const void* table, int byteOffset) {
-    return _mm_load_pd(reinterpret_cast<const double*>(static_cast<const char*>(table) + byteOffset));
+    const I4 low = concatEven(bitcast<int32_t>(y0), bitcast<int32_t>(y1));
+    const I4 off = (low + set1<I4>(Margin - (1 << 28))) & set1<I4>(0x1FFFFFFF);
+    return lt(off, set1<I4>(2 * Margin));
 }
 
 // ---- logarithm ----
@@ -484,45 +346,50 @@ inline int lnRowOffset(const float* p) {
     return static_cast<int>(((u + 0x4000u) >> (15 - 4)) & 0xFF0u);
 }
 
-// log x for two lanes: e as integers, d = m - c (exact in float), table rows
-// at the byte offsets o0, o1.  The polynomial is evaluated in a split form
-// for a shorter dependency chain.
-inline __m128d lnPair(__m128i e, __m128 d, int o0, int o1) {
-    const __m128d row0 = loadRow(kLnTable.row, o0), row1 = loadRow(kLnTable.row, o1);
-    const __m128d r = _mm_mul_pd(_mm_cvtps_pd(d), _mm_unpacklo_pd(row0, row1));
-    const __m128d hi = _mm_add_pd(_mm_mul_pd(_mm_cvtepi32_pd(e), _mm_set1_pd(kLn2)), _mm_unpackhi_pd(row0, row1));
-    const __m128d r2 = _mm_mul_pd(r, r);
-    // r + r2 (a + b) with a = r/3 - 1/2 and b = -r2/4 computed side by side.
-    const __m128d a = _mm_add_pd(_mm_mul_pd(r, _mm_set1_pd(1.0 / 3)), _mm_set1_pd(-0.5));
-    const __m128d b = _mm_mul_pd(r2, _mm_set1_pd(-0.25));
-    return _mm_add_pd(_mm_add_pd(hi, r), _mm_mul_pd(r2, _mm_add_pd(a, b)));
+// The table row at a byte offset from lnRowOffset.
+inline const double* lnRow(int byteOffset) {
+    return reinterpret_cast<const double*>(reinterpret_cast<const char*>(kLnTable.row) + byteOffset);
 }
-#endif
 
-#if ZOR_SIMD >= 2
+// log x for two lanes (0 and 1, or 2 and 3 with Upper): e as integers,
+// d = m - c (exact in float), table rows at the byte offsets o0, o1.  The
+// polynomial is evaluated in a split form for a shorter dependency chain.
+template <bool Upper>
+inline D2 lnPair(I4 e, F4 d, int o0, int o1) {
+    using namespace simd;
+    const D2 row0 = loadAligned<D2>(lnRow(o0)), row1 = loadAligned<D2>(lnRow(o1));
+    const D2 r = (Upper ? widenHi(d) : widenLo(d)) * zipLo(row0, row1);
+    const D2 hi = (Upper ? toDoubleHi(e) : toDoubleLo(e)) * set1<D2>(kLn2) + zipHi(row0, row1);
+    const D2 r2 = r * r;
+    // r + r2 (a + b) with a = r/3 - 1/2 and b = -r2/4 computed side by side.
+    const D2 a = r * set1<D2>(1.0 / 3) + set1<D2>(-0.5);
+    const D2 b = r2 * set1<D2>(-0.25);
+    return (hi + r) + r2 * (a + b);
+}
+
 // The logarithms of q[0 .. 3] in place, unless one of them is not a
 // positive normal finite float or lies near a rounding midpoint: then false
 // and nothing is written.
 inline bool lnBlock(float* q) {
-    const __m128i one = _mm_set1_epi32(0x3F800000);
-    const __m128i u = _mm_loadu_si128(reinterpret_cast<const __m128i*>(q));
+    using namespace simd;
+    const I4 one = set1<I4>(0x3F800000);
+    const I4 u = loadFrom<I4>(q);
     // Round the mantissa to 8 bits: a carry moves into the exponent.
     // Lanes other than positive normal finite floats compute garbage
     // harmlessly and are redone element by element.
-    const __m128i t = _mm_add_epi32(u, _mm_set1_epi32(0x4000));
-    const __m128i expo = _mm_and_si128(t, _mm_set1_epi32(0x7F800000));
-    const __m128i kbits = _mm_and_si128(t, _mm_set1_epi32(0x007F8000));
-    const __m128 m = _mm_castsi128_ps(_mm_add_epi32(_mm_sub_epi32(u, expo), one));
-    const __m128 d = _mm_sub_ps(m, _mm_castsi128_ps(_mm_or_si128(kbits, one)));
-    const __m128i e = _mm_sub_epi32(_mm_srli_epi32(expo, 23), _mm_set1_epi32(127));
-    const __m128d y0 = lnPair(e, d, lnRowOffset(q), lnRowOffset(q + 1));
-    const __m128d y1 = lnPair(_mm_shuffle_epi32(e, 0xEE), _mm_movehl_ps(d, d), lnRowOffset(q + 2), lnRowOffset(q + 3));
+    const I4 t = u + set1<I4>(0x4000);
+    const I4 expo = t & set1<I4>(0x7F800000);
+    const I4 kbits = t & set1<I4>(0x007F8000);
+    const F4 m = bitcast<float>(u - expo + one);
+    const F4 d = m - bitcast<float>(kbits | one);
+    const I4 e = shr<23>(expo) - set1<I4>(127);
+    const D2 y0 = lnPair<false>(e, d, lnRowOffset(q), lnRowOffset(q + 1));
+    const D2 y1 = lnPair<true>(e, d, lnRowOffset(q + 2), lnRowOffset(q + 3));
     // Not a positive normal finite float: u outside [0x00800000,
     // 0x7F800000), tested as one signed compare.
-    const __m128i special = _mm_cmpgt_epi32(_mm_add_epi32(u, _mm_set1_epi32(0x7F800000)),
-                                            _mm_set1_epi32(-0x01000001));
-    if (_mm_movemask_epi8(_mm_or_si128(special, nearMidpoint<kLnMargin>(y0, y1))) != 0) return false;
-    _mm_storeu_ps(q, _mm_movelh_ps(_mm_cvtpd_ps(y0), _mm_cvtpd_ps(y1)));
+    const I4 special = gt(u + set1<I4>(0x7F800000), set1<I4>(-0x01000001));
+    if (anyTrue(special | nearMidpoint<kLnMargin>(y0, y1))) return false;
+    store(q, narrowSat<float>(y0, y1));
     return true;
 }
 #endif
@@ -612,17 +479,19 @@ constexpr PhaseTable makePhaseTable() {
 }
 constexpr PhaseTable kPhaseTable = makePhaseTable();
 
-inline double phaseBase(int row) { return kPhaseTable.base[row]; }
-
-// Two lanes of atan(z) with snum = sigma num, den and sc = sigma c as floats
-// (widened exactly), plus T.
-inline __m128d phasePair(__m128 snum, __m128 den, __m128 sc, int row0, int row1) {
-    const __m128d c = _mm_cvtps_pd(sc), nd = _mm_cvtps_pd(snum), dd = _mm_cvtps_pd(den);
-    const __m128d z = _mm_div_pd(_mm_sub_pd(nd, _mm_mul_pd(c, dd)), _mm_add_pd(dd, _mm_mul_pd(c, nd)));
-    const __m128d z2 = _mm_mul_pd(z, z);
-    const __m128d q = _mm_add_pd(_mm_mul_pd(z2, _mm_set1_pd(1.0 / 5)), _mm_set1_pd(-1.0 / 3));
-    const __m128d t = _mm_set_pd(phaseBase(row1), phaseBase(row0));
-    return _mm_add_pd(_mm_add_pd(t, z), _mm_mul_pd(_mm_mul_pd(z, z2), q));
+// Two lanes (0 and 1, or 2 and 3 with Upper) of atan(z) with snum = sigma
+// num, den and sc = sigma c as floats (widened exactly), plus T from the
+// table rows row0, row1.
+template <bool Upper>
+inline D2 phasePair(F4 snum, F4 den, F4 sc, int row0, int row1) {
+    using namespace simd;
+    const auto widen = [](F4 v) { return Upper ? widenHi(v) : widenLo(v); };
+    const D2 c = widen(sc), nd = widen(snum), dd = widen(den);
+    const D2 z = (nd - c * dd) / (dd + c * nd);
+    const D2 z2 = z * z;
+    const D2 q = z2 * set1<D2>(1.0 / 5) + set1<D2>(-1.0 / 3);
+    const D2 t = zipLo(loadHalf<D2>(kPhaseTable.base + row0), loadHalf<D2>(kPhaseTable.base + row1));
+    return (t + z) + (z * z2) * q;
 }
 #endif
 
@@ -630,38 +499,35 @@ inline __m128d phasePair(__m128 snum, __m128 den, __m128 sc, int row0, int row1)
 [[maybe_unused]] void atan2Vec(const float* py, const float* px, float* d, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    const __m128i signBit = _mm_set1_epi32(INT32_MIN);
+    using namespace simd;
+    const I4 signBit = set1<I4>(INT32_MIN);
     for (; i + 4 <= n; i += 4) {
-        const __m128i yb = _mm_loadu_si128(reinterpret_cast<const __m128i*>(py + i));
-        const __m128i xb = _mm_loadu_si128(reinterpret_cast<const __m128i*>(px + i));
-        const __m128i ya = _mm_andnot_si128(signBit, yb), xa = _mm_andnot_si128(signBit, xb);
+        const I4 yb = loadFrom<I4>(py + i), xb = loadFrom<I4>(px + i);
+        const I4 ya = andNot(signBit, yb), xa = andNot(signBit, xb);
         // A NaN in either makes num (x's) or den (y's) NaN.
-        const __m128 num = _mm_min_ps(_mm_castsi128_ps(ya), _mm_castsi128_ps(xa));
-        const __m128 den = _mm_max_ps(_mm_castsi128_ps(xa), _mm_castsi128_ps(ya));
+        const F4 num = min(bitcast<float>(ya), bitcast<float>(xa));
+        const F4 den = max(bitcast<float>(xa), bitcast<float>(ya));
         // t + 2^17 rounds t to a multiple of 1/64: the low bits hold k, and
         // subtracting 2^17 again leaves c = k/64 exactly.  The reciprocal
         // estimate (12 bits) keeps |t - c| <= 2^-7 + 2^-11.4 and k <= 64.
-        const __m128 tk = _mm_add_ps(_mm_mul_ps(num, _mm_rcp_ps(den)), _mm_set1_ps(0x1p17f));
-        const __m128i steep = _mm_cmpgt_epi32(ya, xa);  // positive floats order as integers
-        const __m128i left = _mm_srai_epi32(xb, 31);
-        const __m128i row = _mm_or_si128(_mm_and_si128(_mm_castps_si128(tk), _mm_set1_epi32(127)),
-                                         _mm_or_si128(_mm_and_si128(steep, _mm_set1_epi32(128)),
-                                                      _mm_and_si128(left, _mm_set1_epi32(256))));
-        const __m128 sigma = _mm_castsi128_ps(_mm_slli_epi32(_mm_xor_si128(steep, left), 31));
-        const __m128 snum = _mm_xor_ps(num, sigma);
-        const __m128 sc = _mm_xor_ps(_mm_sub_ps(tk, _mm_set1_ps(0x1p17f)), sigma);
-        const __m128d r0 = phasePair(snum, den, sc, _mm_extract_epi16(row, 0), _mm_extract_epi16(row, 2));
-        const __m128d r1 = phasePair(_mm_movehl_ps(snum, snum), _mm_movehl_ps(den, den), _mm_movehl_ps(sc, sc),
-                                     _mm_extract_epi16(row, 4), _mm_extract_epi16(row, 6));
+        const F4 tk = num * recipApprox(den) + set1<F4>(0x1p17f);
+        const I4 steep = gt(ya, xa);  // positive floats order as integers
+        const I4 left = shr<31>(xb);
+        const I4 row = (bitcast<int32_t>(tk) & set1<I4>(127)) |
+                       ((steep & set1<I4>(128)) | (left & set1<I4>(256)));
+        const F4 sigma = bitcast<float>(shl<31>(steep ^ left));
+        const F4 snum = num ^ sigma;
+        const F4 sc = (tk - set1<F4>(0x1p17f)) ^ sigma;
+        const auto rows = bitcast<uint16_t>(row);  // each row below 512: the low halves of the lanes
+        const D2 r0 = phasePair<false>(snum, den, sc, getLane<0>(rows), getLane<2>(rows));
+        const D2 r1 = phasePair<true>(snum, den, sc, getLane<4>(rows), getLane<6>(rows));
         // Both magnitudes must lie in [2^-60, 2^60): zeros, infinities, NaNs
         // and extreme ratios (a result below the normal floats, a reciprocal
         // estimate out of range) are left to the library, like results near
         // a rounding midpoint.
-        const __m128 special = _mm_or_ps(_mm_cmpnle_ps(_mm_set1_ps(0x1p-60f), num),
-                                         _mm_cmpnlt_ps(den, _mm_set1_ps(0x1p60f)));
-        if (_mm_movemask_ps(_mm_or_ps(special, _mm_castsi128_ps(nearMidpoint<kPhaseMargin>(r0, r1)))) == 0) {
-            const __m128 r = _mm_movelh_ps(_mm_cvtpd_ps(r0), _mm_cvtpd_ps(r1));
-            _mm_storeu_ps(d + i, _mm_or_ps(r, _mm_castsi128_ps(_mm_and_si128(yb, signBit))));
+        const F4 inRange = ge(num, set1<F4>(0x1p-60f)) & lt(den, set1<F4>(0x1p60f));
+        if (allTrue(andNot(bitcast<float>(nearMidpoint<kPhaseMargin>(r0, r1)), inRange))) {
+            storeTo(d + i, narrowSat<float>(r0, r1) | bitcast<float>(yb & signBit));
             continue;
         }
         for (int j = i; j < i + 4; ++j) d[j] = atan2Element(py[j], px[j]);
@@ -679,17 +545,16 @@ template <bool Root>
 void squaresSum(const float* re, const float* im, float* d, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    for (; i + 4 <= n; i += 4) {
-        const __m128 r = _mm_loadu_ps(re + i), m = _mm_loadu_ps(im + i);
-        const __m128d r0 = _mm_cvtps_pd(r), m0 = _mm_cvtps_pd(m);
-        const __m128d r1 = _mm_cvtps_pd(_mm_movehl_ps(r, r)), m1 = _mm_cvtps_pd(_mm_movehl_ps(m, m));
-        __m128d s0 = _mm_add_pd(_mm_mul_pd(r0, r0), _mm_mul_pd(m0, m0));
-        __m128d s1 = _mm_add_pd(_mm_mul_pd(r1, r1), _mm_mul_pd(m1, m1));
-        if (Root) {
-            s0 = _mm_sqrt_pd(s0);
-            s1 = _mm_sqrt_pd(s1);
-        }
-        _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(s0), _mm_cvtpd_ps(s1)));
+    using namespace simd;
+    using F = Vec<float>;
+    const auto sum = [](auto a, auto b) {
+        const auto s = a * a + b * b;
+        if constexpr (Root) return sqrt(s);
+        else return s;
+    };
+    for (; i + F::kLanes <= n; i += F::kLanes) {
+        const F r = load<F>(re + i), m = load<F>(im + i);
+        store(d + i, narrowSat<float>(sum(widenLo(r), widenLo(m)), sum(widenHi(r), widenHi(m))));
     }
 #else
     DoublePrecisionScope precision;
@@ -704,21 +569,16 @@ void squaresSum(const float* re, const float* im, float* d, int n) {
 [[maybe_unused]] void magnitudeComplex(const Complex32f* src, float* d, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
+    // re, im pairs summed across the two lanes of a register of doubles
+    using namespace simd;
     const float* p = reinterpret_cast<const float*>(src);
+    const auto squares = [](D2 v) { return v * v; };
     for (; i + 4 <= n; i += 4) {
         const float* q = p + 2 * static_cast<ptrdiff_t>(i);
-        const __m128 a = _mm_loadu_ps(q), b = _mm_loadu_ps(q + 4);
-        __m128d q0 = _mm_cvtps_pd(a), q1 = _mm_cvtps_pd(_mm_movehl_ps(a, a));
-        __m128d q2 = _mm_cvtps_pd(b), q3 = _mm_cvtps_pd(_mm_movehl_ps(b, b));
-        q0 = _mm_mul_pd(q0, q0); q1 = _mm_mul_pd(q1, q1);
-        q2 = _mm_mul_pd(q2, q2); q3 = _mm_mul_pd(q3, q3);
-#  if ZOR_SIMD >= 3
-        const __m128d s0 = _mm_hadd_pd(q0, q1), s1 = _mm_hadd_pd(q2, q3);
-#  else
-        const __m128d s0 = _mm_add_pd(_mm_unpacklo_pd(q0, q1), _mm_unpackhi_pd(q0, q1));
-        const __m128d s1 = _mm_add_pd(_mm_unpacklo_pd(q2, q3), _mm_unpackhi_pd(q2, q3));
-#  endif
-        _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(_mm_sqrt_pd(s0)), _mm_cvtpd_ps(_mm_sqrt_pd(s1))));
+        const F4 a = load<F4>(q), b = load<F4>(q + 4);
+        const D2 s0 = addPairs(squares(widenLo(a)), squares(widenHi(a)));
+        const D2 s1 = addPairs(squares(widenLo(b)), squares(widenHi(b)));
+        store(d + i, narrowSat<float>(sqrt(s0), sqrt(s1)));
     }
 #else
     DoublePrecisionScope precision;
@@ -733,12 +593,13 @@ void squaresSum(const float* re, const float* im, float* d, int n) {
 [[maybe_unused]] void normalizeVec(const float* s, float* d, int n, float sub, double rcp) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    const __m128d vs = _mm_set1_pd(sub), vr = _mm_set1_pd(rcp);
-    for (; i + 4 <= n; i += 4) {
-        const __m128 x = _mm_loadu_ps(s + i);
-        const __m128d a = _mm_mul_pd(_mm_sub_pd(_mm_cvtps_pd(x), vs), vr);
-        const __m128d b = _mm_mul_pd(_mm_sub_pd(_mm_cvtps_pd(_mm_movehl_ps(x, x)), vs), vr);
-        _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(a), _mm_cvtpd_ps(b)));
+    using namespace simd;
+    using F = Vec<float>;
+    using D = Vec<double>;
+    const D vs = set1<D>(sub), vr = set1<D>(rcp);
+    for (; i + F::kLanes <= n; i += F::kLanes) {
+        const F x = load<F>(s + i);
+        store(d + i, narrowSat<float>((widenLo(x) - vs) * vr, (widenHi(x) - vs) * vr));
     }
 #else
     DoublePrecisionScope precision;
@@ -748,7 +609,7 @@ void squaresSum(const float* re, const float* im, float* d, int n) {
 
 // ---- sort -------------------------------------------------------------------------
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 inline void swapAt(float* a, int i, int j) {
     const float t = a[i];
     a[i] = a[j];
@@ -855,16 +716,15 @@ void sortDescend(float* a, int n) {
 [[maybe_unused]] void deinterleave2(const int16_t* s, int16_t* d0, int16_t* d1, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    for (; i + 8 <= n; i += 8) {
+    // pairs counted out per 16-byte register
+    using namespace simd;
+    using V = Vec<int16_t, 16>;
+    for (; i + V::kLanes <= n; i += V::kLanes) {
         const int16_t* p = s + 2 * static_cast<ptrdiff_t>(i);
-        const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
-        const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + 8));
-        // Even elements sign-extended from the low halves, odd ones from the high.
-        const __m128i e = _mm_packs_epi32(_mm_srai_epi32(_mm_slli_epi32(a, 16), 16),
-                                          _mm_srai_epi32(_mm_slli_epi32(b, 16), 16));
-        const __m128i o = _mm_packs_epi32(_mm_srai_epi32(a, 16), _mm_srai_epi32(b, 16));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(d0 + i), e);
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(d1 + i), o);
+        const auto a = bitcast<int32_t>(load<V>(p)), b = bitcast<int32_t>(load<V>(p + V::kLanes));
+        // Even elements are the low halves of the 32-bit lanes, odd ones the high.
+        store(d0 + i, narrowTrunc<int16_t>(a, b));
+        store(d1 + i, narrowSat<int16_t>(shr<16>(a), shr<16>(b)));
     }
 #endif
     for (; i < n; ++i) {
@@ -875,35 +735,40 @@ void sortDescend(float* a, int n) {
 
 [[maybe_unused]] bool misaligned16(const void* p) { return (reinterpret_cast<uintptr_t>(p) & 15) != 0; }
 
+// The plain elementwise exports: pointers and length checked, then op over
+// every element.
+template <class S, class D, class Op>
+Status checkedMap(const S* s, D* d, int len, Op op) {
+    if (Status st = checkFirst(anyNull(s, d), badLength(len))) return st;
+    simd::mapLanes(s, d, len, op);
+    return StatusOk;
+}
+template <class S, class D, class Op>
+Status checkedMap(const S* a, const S* b, D* d, int len, Op op) {
+    if (Status st = checkFirst(anyNull(a, b, d), badLength(len))) return st;
+    simd::mapLanes(a, b, d, len, op);
+    return StatusOk;
+}
+
 }  // namespace
 
 // ---- exports ---------------------------------------------------------------------------
 
 Status ZOR_CALL zorsAdd_32f(const float* pSrc1, const float* pSrc2, float* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDst), badLength(len))) return s;
-    map32f(pSrc1, pSrc2, pDst, len, AddF{});
-    return StatusOk;
+    return checkedMap(pSrc1, pSrc2, pDst, len, kAdd);
 }
 Status ZOR_CALL zorsAdd_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, AddF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kAdd);
 }
 Status ZOR_CALL zorsSub_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, SubF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kSub);
 }
 Status ZOR_CALL zorsMul_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, MulF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kMul);
 }
 // No check for zero divisors: IEEE infinities and NaNs result.
 Status ZOR_CALL zorsDiv_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, DivF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kDiv);
 }
 
 // The constant shortcuts (add 0, multiply by 1 or 0, subtract 0) skip the
@@ -912,7 +777,7 @@ Status ZOR_CALL zorsDiv_32f_I(const float* pSrc, float* pSrcDst, int len) {
 Status ZOR_CALL zorsAddC_32f_I(float val, float* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (val == 0.0f) return StatusOk;
-    map32f(pSrcDst, pSrcDst, len, AddCF(val));
+    simd::mapLanes(pSrcDst, pSrcDst, len, addConst(val));
     return StatusOk;
 }
 Status ZOR_CALL zorsSubC_32f(const float* pSrc, float val, float* pDst, int len) {
@@ -920,13 +785,11 @@ Status ZOR_CALL zorsSubC_32f(const float* pSrc, float val, float* pDst, int len)
     if (val == 0.0f)
         copy32f(pSrc, pDst, len);
     else
-        map32f(pSrc, pDst, len, SubCF(val));
+        simd::mapLanes(pSrc, pDst, len, subConst(val));
     return StatusOk;
 }
 Status ZOR_CALL zorsSubC_32f_I(float val, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, SubCF(val));
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, subConst(val));
 }
 Status ZOR_CALL zorsMulC_32f(const float* pSrc, float val, float* pDst, int len) {
     if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
@@ -935,7 +798,7 @@ Status ZOR_CALL zorsMulC_32f(const float* pSrc, float val, float* pDst, int len)
     else if (val == 0.0f)
         zero32f(pDst, len);
     else
-        map32f(pSrc, pDst, len, MulCF(val));
+        simd::mapLanes(pSrc, pDst, len, mulConst(val));
     return StatusOk;
 }
 Status ZOR_CALL zorsMulC_32f_I(float val, float* pSrcDst, int len) {
@@ -944,7 +807,7 @@ Status ZOR_CALL zorsMulC_32f_I(float val, float* pSrcDst, int len) {
     if (val == 0.0f)
         zero32f(pSrcDst, len);
     else
-        map32f(pSrcDst, pSrcDst, len, MulCF(val));
+        simd::mapLanes(pSrcDst, pSrcDst, len, mulConst(val));
     return StatusOk;
 }
 // Division by a constant multiplies by its float reciprocal (formed in double
@@ -962,7 +825,7 @@ Status ZOR_CALL zorsDivC_32f_I(float val, float* pSrcDst, int len) {
     return zorsMulC_32f(pSrcDst, toFloat(1.0 / static_cast<double>(val)), pSrcDst, len);
 }
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 Status ZOR_CALL zorsAdd_16s_Sfs(const int16_t* pSrc1, const int16_t* pSrc2, int16_t* pDst, int len,
                                 int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDst), badLength(len))) return s;
@@ -970,19 +833,19 @@ Status ZOR_CALL zorsAdd_16s_Sfs(const int16_t* pSrc1, const int16_t* pSrc2, int1
         std::memset(pDst, 0, static_cast<size_t>(len) * sizeof(int16_t));
         return StatusOk;
     }
-    map16s(pSrc1, pSrc2, pDst, len, AddSfs16{scaleFactor});
+    simd::mapLanes(pSrc1, pSrc2, pDst, len, AddScaled16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsAddC_16s_I(int16_t val, int16_t* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (val == 0) return StatusOk;
-    map16s(pSrcDst, pSrcDst, len, AddC16{val});
+    addConst16(val, [&](auto op) { simd::mapLanes(pSrcDst, pSrcDst, len, op); });
     return StatusOk;
 }
 Status ZOR_CALL zorsSubC_16s_I(int16_t val, int16_t* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (val == 0) return StatusOk;
-    map16s(pSrcDst, pSrcDst, len, AddC16{-int32_t(val)});
+    addConst16(-int32_t(val), [&](auto op) { simd::mapLanes(pSrcDst, pSrcDst, len, op); });
     return StatusOk;
 }
 
@@ -992,70 +855,54 @@ Status ZOR_CALL zorsMul_NR_16s_Sfs(const int16_t* pSrc1, const int16_t* pSrc2, i
                                    int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrc1, pSrc2, pDst, len, MulNR16(scaleFactor));
+    mulRounded16(pSrc1, pSrc2, pDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsMul_NR_16s_ISfs(const int16_t* pSrc, int16_t* pSrcDst, int len, int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrc, pSrcDst, pSrcDst, len, MulNR16(scaleFactor));
+    mulRounded16(pSrc, pSrcDst, pSrcDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsMulC_NR_16s_Sfs(const int16_t* pSrc, int16_t val, int16_t* pDst, int len,
                                     int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrc, pDst, len, MulCNR16(scaleFactor, val));
+    mulRounded16(pSrc, val, pDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsMulC_NR_16s_ISfs(int16_t val, int16_t* pSrcDst, int len, int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrcDst, pSrcDst, len, MulCNR16(scaleFactor, val));
+    mulRounded16(pSrcDst, val, pSrcDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 
 Status ZOR_CALL zorsAbs_16s(const int16_t* pSrc, int16_t* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map16s(pSrc, pDst, len, Abs16{});
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kAbs16);
 }
 Status ZOR_CALL zorsAbs_16s_I(int16_t* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map16s(pSrcDst, pSrcDst, len, Abs16{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kAbs16);
 }
 Status ZOR_CALL zorsAbs_64f(const double* pSrc, double* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    abs64f(pSrc, pDst, len);
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kAbs);
 }
 Status ZOR_CALL zorsAbs_64f_I(double* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    abs64f(pSrcDst, pSrcDst, len);
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kAbs);
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 Status ZOR_CALL zorsAbs_32f(const float* pSrc, float* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map32f(pSrc, pDst, len, AbsF{});
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kAbs);
 }
 Status ZOR_CALL zorsAbs_32f_I(float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, AbsF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kAbs);
 }
 Status ZOR_CALL zorsSqr_32f(const float* pSrc, float* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map32f(pSrc, pDst, len, SqrF{});
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kSquare);
 }
 Status ZOR_CALL zorsSqr_32f_I(float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, SqrF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kSquare);
 }
 // Negative elements and NaNs become the quiet NaN 0xFFC00000; +-0 stays.
 Status ZOR_CALL zorsSqrt_32f_I(float* pSrcDst, int len) {
@@ -1069,23 +916,19 @@ Status ZOR_CALL zorsSqrt_32f_I(float* pSrcDst, int len) {
 Status ZOR_CALL zorsThreshold_32f_I(float* pSrcDst, int len, float level, int relOp) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (relOp == CmpGreater)
-        map32f(pSrcDst, pSrcDst, len, ClipAbove(level));
+        simd::mapLanes(pSrcDst, pSrcDst, len, clipAbove(level));
     else
-        map32f(pSrcDst, pSrcDst, len, ClipBelow(level));
+        simd::mapLanes(pSrcDst, pSrcDst, len, clipBelow(level));
     return StatusOk;
 }
 Status ZOR_CALL zorsThreshold_LTVal_32f(const float* pSrc, float* pDst, int len, float level, float value) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map32f(pSrc, pDst, len, BelowToValue(level, value));
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, belowToValue(level, value));
 }
 Status ZOR_CALL zorsThreshold_LTVal_32f_I(float* pSrcDst, int len, float level, float value) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, BelowToValue(level, value));
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, belowToValue(level, value));
 }
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 // The logarithm reports the first special element it met: a zero
 // (StatusWarnLnZero) or anything with the sign bit set (StatusWarnLnNegative).
 Status ZOR_CALL zorsLn_32f_I(float* pSrcDst, int len) {
@@ -1157,9 +1000,9 @@ Status ZOR_CALL zorsDeinterleave_16s(const int16_t* pSrc, int channels, int len,
     }
     return misaligned ? StatusWarnMisaligned : StatusOk;
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 // Sorting is the same comparison sequence on every processor.
 Status ZOR_CALL zorsSortDescend_32f_I(float* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
