@@ -567,8 +567,8 @@ struct Isa<16> {
         else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, uint16_t>) {
             // clamp to 0..65535, move into the signed range, pack, move back
             const __m128i bias = _mm_set1_epi32(32768), zero = _mm_setzero_si128();
-            const __m128i l = _mm_sub_epi32(select<int32_t>(_mm_cmpgt_epi32(lo, zero), lo, zero), bias);
-            const __m128i h = _mm_sub_epi32(select<int32_t>(_mm_cmpgt_epi32(hi, zero), hi, zero), bias);
+            const __m128i l = _mm_sub_epi32(_mm_and_si128(lo, _mm_cmpgt_epi32(lo, zero)), bias);
+            const __m128i h = _mm_sub_epi32(_mm_and_si128(hi, _mm_cmpgt_epi32(hi, zero)), bias);
             return _mm_xor_si128(_mm_packs_epi32(l, h), _mm_set1_epi16(short(0x8000)));
         } else static_assert(sizeof(To) == 0, "no such saturating narrowing");
     }
