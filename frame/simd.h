@@ -15,8 +15,8 @@
 // What exists in which column:
 //   ZOR_SIMD >= 1  float lanes
 //   ZOR_SIMD >= 2  every lane type
-//   ZOR_SIMD >= 4  shuffleBytes, alignBytes, mulAddPairs on bytes, mulHiRound
-//                  (and abs/sign without emulation)
+//   ZOR_SIMD >= 4  shuffleBytes, mulAddPairs on bytes, mulHiRound (and abs,
+//                  alignBytes without emulation)
 // simd::kHas<T> tells a template whether Vec<T> exists in this column.
 //
 // Lane order.  Operations act lane by lane and keep lane order, except those
@@ -584,25 +584,6 @@ struct Isa<16> {
             return _mm_packs_epi32(l, h);
         } else static_assert(sizeof(To) == 0, "no such truncating narrowing");
     }
-    // Interleaves the lower (upper) halves of a and b: a0 b0 a1 b1 ...
-    template <class T>
-    static R<T> zipLo(R<T> a, R<T> b) {
-        if constexpr (isF<T>) return _mm_unpacklo_ps(a, b);
-        else if constexpr (isD<T>) return _mm_unpacklo_pd(a, b);
-        else if constexpr (sizeof(T) == 1) return _mm_unpacklo_epi8(a, b);
-        else if constexpr (sizeof(T) == 2) return _mm_unpacklo_epi16(a, b);
-        else if constexpr (sizeof(T) == 4) return _mm_unpacklo_epi32(a, b);
-        else return _mm_unpacklo_epi64(a, b);
-    }
-    template <class T>
-    static R<T> zipHi(R<T> a, R<T> b) {
-        if constexpr (isF<T>) return _mm_unpackhi_ps(a, b);
-        else if constexpr (isD<T>) return _mm_unpackhi_pd(a, b);
-        else if constexpr (sizeof(T) == 1) return _mm_unpackhi_epi8(a, b);
-        else if constexpr (sizeof(T) == 2) return _mm_unpackhi_epi16(a, b);
-        else if constexpr (sizeof(T) == 4) return _mm_unpackhi_epi32(a, b);
-        else return _mm_unpackhi_epi64(a, b);
-    }
     // pmaddwd: a0 b0 + a1 b1 of neighbouring 16-bit lanes, as 32-bit lanes.
     static __m128i mulAddPairs16(__m128i a, __m128i b) { return _mm_madd_epi16(a, b); }
     // psadbw: per 8 bytes the sum of |a - b|, in the low 16 bits of a 64-bit lane.
@@ -614,6 +595,31 @@ struct Isa<16> {
     static __m128i shiftBytesDown(__m128i a) { return _mm_srli_si128(a, N); }
     // One bit per byte, lane order.
     static int byteMask(__m128i a) { return _mm_movemask_epi8(a); }
+    // Bytes N .. N+15 of the 32-byte value hi:lo (per 16-byte block):
+    // palignr from SSSE3; before it a shuffle of halves (N = 8) or two byte
+    // shifts.
+    template <int N, class T>
+    static R<T> alignBytes(R<T> hi, R<T> lo) {
+        static_assert(N >= 0 && N <= 16, "alignBytes takes 0 .. 16 bytes");
+        if constexpr (N == 0) {
+            return lo;
+        } else if constexpr (N == 16) {
+            return hi;
+        } else if constexpr (N == 8 && !isInt<T>) {  // float lanes stay in the float unit
+            const __m128d h = bitcast<double, T>(hi), l = bitcast<double, T>(lo);
+            return bitcast<T, double>(_mm_shuffle_pd(l, h, 1));
+        } else {
+            const __m128i h = bitcast<int32_t, T>(hi), l = bitcast<int32_t, T>(lo);
+#    if ZOR_SIMD >= 4
+            return bitcast<T, int32_t>(_mm_alignr_epi8(h, l, N));
+#    else
+            if constexpr (N == 8)
+                return bitcast<T, int32_t>(_mm_castpd_si128(_mm_shuffle_pd(_mm_castsi128_pd(l), _mm_castsi128_pd(h), 1)));
+            else
+                return bitcast<T, int32_t>(_mm_or_si128(_mm_srli_si128(l, N), _mm_slli_si128(h, 16 - N)));
+#    endif
+        }
+    }
 
     // -- conversions
     static __m128 int32ToFloat(__m128i a) { return _mm_cvtepi32_ps(a); }
@@ -643,6 +649,30 @@ struct Isa<16> {
 #    endif
     }
 #  endif  // ZOR_SIMD >= 2
+
+    // Interleaves the lower (upper) halves of a and b: a0 b0 a1 b1 ...
+    template <class T>
+    static R<T> zipLo(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_unpacklo_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_unpacklo_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_unpacklo_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_unpacklo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_unpacklo_epi32(a, b);
+        else return _mm_unpacklo_epi64(a, b);
+#  endif
+    }
+    template <class T>
+    static R<T> zipHi(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_unpackhi_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_unpackhi_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_unpackhi_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_unpackhi_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_unpackhi_epi32(a, b);
+        else return _mm_unpackhi_epi64(a, b);
+#  endif
+    }
 
     // One bit per lane of 32 or 64-bit lanes (their sign bits).
     template <class T>
@@ -775,9 +805,6 @@ struct Isa<16> {
     // pshufb: byte i of the result is table[idx[i] & 15], or 0 where idx[i]
     // has its top bit set (per 16-byte block).
     static __m128i shuffleBytes(__m128i table, __m128i idx) { return _mm_shuffle_epi8(table, idx); }
-    // palignr: bytes N .. N+15 of the 32-byte value hi:lo (per 16-byte block).
-    template <int N>
-    static __m128i alignBytes(__m128i hi, __m128i lo) { return _mm_alignr_epi8(hi, lo, N); }
     // pmaddubsw: u0 s0 + u1 s1 of neighbouring bytes (unsigned times signed),
     // saturated to 16 bits.
     static __m128i mulAddPairs8(__m128i u, __m128i s) { return _mm_maddubs_epi16(u, s); }
@@ -1056,7 +1083,7 @@ inline Vec<uint8_t, B> shuffleBytes(Vec<uint8_t, B> table, Vec<uint8_t, B> idx) 
 // Per 16-byte block: bytes N .. N+15 of hi:lo.
 template <int N, class T, int B>
 inline Vec<T, B> alignBytes(Vec<T, B> hi, Vec<T, B> lo) {
-    return {Isa<B>::template alignBytes<N>(hi.raw, lo.raw)};
+    return {Isa<B>::template alignBytes<N, T>(hi.raw, lo.raw)};
 }
 // Per 16-byte block: moves the bytes N places up (towards the last lane),
 // shifting in zeros; shiftBytesDown the other way.

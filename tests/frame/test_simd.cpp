@@ -145,6 +145,12 @@ TEST(SimdLanes, LaneOrderAndAccess) {
     EXPECT_TRUE(anyTrue(mask) && !allTrue(mask) && allTrue(eq(mask, mask)));
     const double p[2] = {1.5, -2.0}, q[2] = {0.25, 8.0};
     EXPECT_EQ(getLane<1>(addPairs(load<Vec<double>>(p), load<Vec<double>>(q))), 8.25);
+    EXPECT_EQ(getLane<0>(alignBytes<8>(load<Vec<double>>(q), load<Vec<double>>(p))), -2.0);
+    uint8_t bytes[32], shifted[16];
+    for (int i = 0; i < 32; ++i) bytes[i] = uint8_t(i);
+    using B = Vec<uint8_t>;
+    store(shifted, alignBytes<5>(load<B>(bytes + 16), load<B>(bytes)));
+    for (int i = 0; i < 16; ++i) EXPECT_EQ(shifted[i], 5 + i);
 }
 
 TEST(SimdLanes, LoadWidenedExtendsInOrder) {
