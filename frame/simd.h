@@ -864,6 +864,17 @@ inline V loadFrom(const U* p) { return load<V>(reinterpret_cast<const typename V
 template <class T, int B, class U>
 inline void storeTo(U* p, Vec<T, B> v) { store(reinterpret_cast<T*>(p), v); }
 
+// N consecutive registers from memory of any lane type, and back: blocks
+// that span several registers (48 bytes of three-channel pixels).
+template <class V, int N, class U>
+inline void loadBlock(const U* p, V (&v)[N]) {
+    for (int i = 0; i < N; ++i) v[i] = loadFrom<V>(reinterpret_cast<const uint8_t*>(p) + i * V::kBytes);
+}
+template <class T, int B, int N, class U>
+inline void storeBlock(U* p, const Vec<T, B> (&v)[N]) {
+    for (int i = 0; i < N; ++i) storeTo(reinterpret_cast<uint8_t*>(p) + i * B, v[i]);
+}
+
 template <class T, int B>
 inline Vec<T, B> operator+(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template add<T>(a.raw, b.raw)}; }
 template <class T, int B>

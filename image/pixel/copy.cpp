@@ -10,11 +10,12 @@
 // All of it is integer work: the SSE variant shares the generic entries.
 #include "frame/variant.h"
 #include "frame/status.h"
-#include "image/pixel/rows.h"
+#include "image/pixel/pixel_rows.h"
+#include "image/pixel/shuffle48.h"
 
 #include <cstring>
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -105,17 +106,15 @@ void swapRow(const E* s, E* d, ptrdiff_t n, int C, const int (&o)[3]) {
 #if ZOR_SIMD >= 2
 // Repeats the 48-byte pattern p (16 pixels of 8-bit or 8 of 16-bit
 // elements) over the first bytes of d; returns the bytes written (whole blocks).
-inline ptrdiff_t fill48(uint8_t* d, ptrdiff_t bytes, const __m128i (&p)[3]) {
-    return eachBlock<48>(bytes, [&](ptrdiff_t i) { store48(d + i, p); });
+inline ptrdiff_t fill48(uint8_t* d, ptrdiff_t bytes, const Bytes16 (&p)[3]) {
+    return eachBlock<48>(bytes, [&](ptrdiff_t i) { simd::storeBlock(d + i, p); });
 }
 
 template <class E>
 ptrdiff_t fillRowSimd(E* d, ptrdiff_t n, E v) {
-    __m128i p;
-    if constexpr (sizeof(E) == 1) p = _mm_set1_epi8(static_cast<char>(v));
-    else if constexpr (sizeof(E) == 2) p = _mm_set1_epi16(static_cast<short>(v));
-    else p = _mm_set1_epi32(static_cast<int>(v));
-    return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) { store16(d + x, p); });
+    using V = simd::Vec<E>;
+    const V p = simd::set1<V>(v);
+    return eachBlock<V::kLanes>(n, [&](ptrdiff_t x) { simd::store(d + x, p); });
 }
 #endif
 
@@ -135,12 +134,13 @@ ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
     E* p1 = planes[1];
     E* p2 = planes[2];
     return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) {
-        __m128i in[3], out[3];
-        load48(s + 3 * x, in);
+        using namespace simd;
+        Bytes16 in[3], out[3];
+        loadBlock(s + 3 * x, in);
         Shuffle48<SplitMap<sizeof(E)>>::apply(in, out);
-        store16(p0 + x, out[0]);
-        store16(p1 + x, out[1]);
-        store16(p2 + x, out[2]);
+        storeTo(p0 + x, out[0]);
+        storeTo(p1 + x, out[1]);
+        storeTo(p2 + x, out[2]);
     });
 }
 
@@ -168,72 +168,69 @@ struct MergeShuffles {
 
 template <class E>
 ptrdiff_t merge3Simd(const E* const* planes, E* d, ptrdiff_t n) {
+    using namespace simd;
+    using V = Vec<E, 16>;
     constexpr int e = sizeof(E);
     alignas(16) static constexpr MergeShuffles<e> t{};
-    const auto mask = [](const uint8_t* m) { return _mm_load_si128(reinterpret_cast<const __m128i*>(m)); };
     const E* p0 = planes[0];
     const E* p1 = planes[1];
     const E* p2 = planes[2];
-    return eachBlock<16 / e>(n, [&](ptrdiff_t x) {
-        const __m128i a = load16(p0 + x), b = load16(p1 + x), c = load16(p2 + x);
-        const __m128i lo = e == 1 ? _mm_unpacklo_epi8(a, b) : _mm_unpacklo_epi16(a, b);
-        const __m128i hi = e == 1 ? _mm_unpackhi_epi8(a, b) : _mm_unpackhi_epi16(a, b);
-        const __m128i mid = _mm_alignr_epi8(hi, lo, MergeShuffles<e>::kMid * 2 * e);
-        const __m128i pairs[3] = {lo, mid, hi};
+    return eachBlock<V::kLanes>(n, [&](ptrdiff_t x) {
+        const V a = load<V>(p0 + x), b = load<V>(p1 + x);
+        const Bytes16 c = loadFrom<Bytes16>(p2 + x);
+        const Bytes16 lo = bitcast<uint8_t>(zipLo(a, b)), hi = bitcast<uint8_t>(zipHi(a, b));
+        const Bytes16 mid = alignBytes<MergeShuffles<e>::kMid * 2 * e>(hi, lo);
+        const Bytes16 pairs[3] = {lo, mid, hi};
         E* out = d + 3 * x;
         for (int o = 0; o < 3; ++o)
-            store16(out + o * (16 / e),
-                    _mm_or_si128(_mm_shuffle_epi8(pairs[o], mask(t.pairs[o])), _mm_shuffle_epi8(c, mask(t.third[o]))));
+            storeTo(out + o * V::kLanes, shuffleBytes(pairs[o], loadAligned<Bytes16>(t.pairs[o])) |
+                                             shuffleBytes(c, loadAligned<Bytes16>(t.third[o])));
     });
 }
 
 // Four channels <-> four planes, 64 bytes at a time: one shuffle per
 // register groups each channel's elements into one 32-bit lane, then a 4 x 4
 // transpose of those lanes across the registers (its own inverse).
-inline void transpose4x4(__m128i (&v)[4]) {
-    const __m128i t0 = _mm_unpacklo_epi32(v[0], v[1]), t1 = _mm_unpackhi_epi32(v[0], v[1]);
-    const __m128i t2 = _mm_unpacklo_epi32(v[2], v[3]), t3 = _mm_unpackhi_epi32(v[2], v[3]);
-    v[0] = _mm_unpacklo_epi64(t0, t2);
-    v[1] = _mm_unpackhi_epi64(t0, t2);
-    v[2] = _mm_unpacklo_epi64(t1, t3);
-    v[3] = _mm_unpackhi_epi64(t1, t3);
-}
 // Lane k of the result holds channel k of the register's pixels.
 template <int E>
-inline __m128i groupChannels() {
-    if constexpr (E == 1) return _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
-    else return _mm_setr_epi8(0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15);
+inline Bytes16 groupChannels() {
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15});
+    else return simd::fromLanes<Bytes16>({0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15});
 }
 template <int E>
-inline __m128i spreadChannels() {  // the inverse of groupChannels
-    if constexpr (E == 1) return _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
-    else return _mm_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, 2, 3, 6, 7, 10, 11, 14, 15);
+inline Bytes16 spreadChannels() {  // the inverse of groupChannels
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15});
+    else return simd::fromLanes<Bytes16>({0, 1, 4, 5, 8, 9, 12, 13, 2, 3, 6, 7, 10, 11, 14, 15});
 }
+
+using Words4 = simd::Vec<uint32_t, 16>;
 
 template <class E>
 ptrdiff_t split4Simd(const E* s, E* const* planes, ptrdiff_t n) {
+    using namespace simd;
     constexpr ptrdiff_t per = 16 / sizeof(E);
-    const __m128i g = groupChannels<sizeof(E)>();
+    const Bytes16 g = groupChannels<sizeof(E)>();
     ptrdiff_t x = 0;
     for (; x + per <= n; x += per) {
-        __m128i v[4];
-        for (int k = 0; k < 4; ++k) v[k] = _mm_shuffle_epi8(load16(s + 4 * x + k * per), g);
-        transpose4x4(v);
-        for (int k = 0; k < 4; ++k) store16(planes[k] + x, v[k]);
+        Words4 v[4];
+        for (int k = 0; k < 4; ++k) v[k] = bitcast<uint32_t>(shuffleBytes(loadFrom<Bytes16>(s + 4 * x + k * per), g));
+        transpose4(v[0], v[1], v[2], v[3]);
+        for (int k = 0; k < 4; ++k) storeTo(planes[k] + x, v[k]);
     }
     return x;
 }
 
 template <class E>
 ptrdiff_t merge4Simd(const E* const* planes, E* d, ptrdiff_t n) {
+    using namespace simd;
     constexpr ptrdiff_t per = 16 / sizeof(E);
-    const __m128i sp = spreadChannels<sizeof(E)>();
+    const Bytes16 sp = spreadChannels<sizeof(E)>();
     ptrdiff_t x = 0;
     for (; x + per <= n; x += per) {
-        __m128i v[4];
-        for (int k = 0; k < 4; ++k) v[k] = load16(planes[k] + x);
-        transpose4x4(v);
-        for (int k = 0; k < 4; ++k) store16(d + 4 * x + k * per, _mm_shuffle_epi8(v[k], sp));
+        Words4 v[4];
+        for (int k = 0; k < 4; ++k) v[k] = loadFrom<Words4>(planes[k] + x);
+        transpose4(v[0], v[1], v[2], v[3]);
+        for (int k = 0; k < 4; ++k) storeTo(d + 4 * x + k * per, shuffleBytes(bitcast<uint8_t>(v[k]), sp));
     }
     return x;
 }
@@ -247,6 +244,7 @@ struct PickMap {
 };
 template <class E, int SC>
 ptrdiff_t pickOneSimd(const E* s, E* d, ptrdiff_t n) {
+    using namespace simd;
     constexpr ptrdiff_t per = 16 / sizeof(E);
     // masks for register r of the SC-register block: output lane j takes
     // byte src(j) - 16 r when it falls into register r
@@ -263,11 +261,9 @@ ptrdiff_t pickOneSimd(const E* s, E* d, ptrdiff_t n) {
     // last chosen element at (n-1)*SC: the block [x*SC, x*SC + per*SC) must end by it
     for (; (x + per) * SC <= (n - 1) * SC + 1; x += per) {
         const uint8_t* b = reinterpret_cast<const uint8_t*>(s + x * SC);
-        __m128i acc = _mm_shuffle_epi8(load16(b), _mm_load_si128(reinterpret_cast<const __m128i*>(masks.m[0])));
-        for (int r = 1; r < SC; ++r)
-            acc = _mm_or_si128(acc, _mm_shuffle_epi8(load16(b + 16 * r),
-                                                     _mm_load_si128(reinterpret_cast<const __m128i*>(masks.m[r]))));
-        store16(d + x, acc);
+        Bytes16 acc = shuffleBytes(load<Bytes16>(b), loadAligned<Bytes16>(masks.m[0]));
+        for (int r = 1; r < SC; ++r) acc = acc | shuffleBytes(load<Bytes16>(b + 16 * r), loadAligned<Bytes16>(masks.m[r]));
+        storeTo(d + x, acc);
     }
     return x;
 }
@@ -277,45 +273,48 @@ ptrdiff_t pickOneSimd(const E* s, E* d, ptrdiff_t n) {
 // (or spread from them), and byte shifts move the 12-byte groups between
 // registers.  E is the element size; the masks only differ by it.
 template <int E>
-inline __m128i packColour() {  // 16 bytes of 4-element pixels -> 12 bytes of colour, 4 zero
-    if constexpr (E == 1) return _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, -1, -1, -1, -1);
-    else return _mm_setr_epi8(0, 1, 2, 3, 4, 5, 8, 9, 10, 11, 12, 13, -1, -1, -1, -1);
+inline Bytes16 packColour() {  // 16 bytes of 4-element pixels -> 12 bytes of colour, 4 zero
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 255, 255, 255, 255});
+    else return simd::fromLanes<Bytes16>({0, 1, 2, 3, 4, 5, 8, 9, 10, 11, 12, 13, 255, 255, 255, 255});
 }
 template <int E>
-inline __m128i spreadColour() {  // 12 bytes of colour -> 16 bytes of pixels, alpha zero
-    if constexpr (E == 1) return _mm_setr_epi8(0, 1, 2, -1, 3, 4, 5, -1, 6, 7, 8, -1, 9, 10, 11, -1);
-    else return _mm_setr_epi8(0, 1, 2, 3, 4, 5, -1, -1, 6, 7, 8, 9, 10, 11, -1, -1);
+inline Bytes16 spreadColour() {  // 12 bytes of colour -> 16 bytes of pixels, alpha zero
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 1, 2, 255, 3, 4, 5, 255, 6, 7, 8, 255, 9, 10, 11, 255});
+    else return simd::fromLanes<Bytes16>({0, 1, 2, 3, 4, 5, 255, 255, 6, 7, 8, 9, 10, 11, 255, 255});
 }
 
 template <class E>
 ptrdiff_t dropAlphaSimd(const E* s, E* d, ptrdiff_t n) {
+    using namespace simd;
     constexpr ptrdiff_t per = 16 / sizeof(E);  // pixels per 64 source bytes
-    const __m128i m = packColour<sizeof(E)>();
+    const Bytes16 m = packColour<sizeof(E)>();
     const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
     uint8_t* db = reinterpret_cast<uint8_t*>(d);
     ptrdiff_t x = 0;
     for (; x + per <= n; x += per, sb += 64, db += 48) {
-        const __m128i a = _mm_shuffle_epi8(load16(sb), m), b = _mm_shuffle_epi8(load16(sb + 16), m);
-        const __m128i c = _mm_shuffle_epi8(load16(sb + 32), m), e = _mm_shuffle_epi8(load16(sb + 48), m);
-        store16(db, _mm_or_si128(a, _mm_slli_si128(b, 12)));
-        store16(db + 16, _mm_or_si128(_mm_srli_si128(b, 4), _mm_slli_si128(c, 8)));
-        store16(db + 32, _mm_or_si128(_mm_srli_si128(c, 8), _mm_slli_si128(e, 4)));
+        const auto colour = [&](int k) { return shuffleBytes(load<Bytes16>(sb + 16 * k), m); };
+        const Bytes16 a = colour(0), b = colour(1), c = colour(2), e = colour(3);
+        store(db, a | shiftBytesUp<12>(b));
+        store(db + 16, shiftBytesDown<4>(b) | shiftBytesUp<8>(c));
+        store(db + 32, shiftBytesDown<8>(c) | shiftBytesUp<4>(e));
     }
     return x;
 }
 
 template <class E>
 ptrdiff_t keepAlphaSimd(const E* s, E* d, ptrdiff_t n) {
+    using namespace simd;
     constexpr ptrdiff_t per = 16 / sizeof(E);
-    const __m128i m = spreadColour<sizeof(E)>(), alpha = alphaBytes<sizeof(E)>();
+    const Bytes16 m = spreadColour<sizeof(E)>(), alpha = alphaBytes<sizeof(E), 16>();
     const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
     uint8_t* db = reinterpret_cast<uint8_t*>(d);
     ptrdiff_t x = 0;
     for (; x + per <= n; x += per, sb += 48, db += 64) {
-        const __m128i i0 = load16(sb), i1 = load16(sb + 16), i2 = load16(sb + 32);
-        const __m128i g[4] = {i0, _mm_alignr_epi8(i1, i0, 12), _mm_alignr_epi8(i2, i1, 8), _mm_srli_si128(i2, 4)};
+        Bytes16 i[3];
+        loadBlock(sb, i);
+        const Bytes16 g[4] = {i[0], alignBytes<12>(i[1], i[0]), alignBytes<8>(i[2], i[1]), shiftBytesDown<4>(i[2])};
         for (int k = 0; k < 4; ++k)  // the destination's alpha is carried over as it is
-            store16(db + 16 * k, blend16(_mm_shuffle_epi8(g[k], m), load16(db + 16 * k), alpha));
+            store(db + 16 * k, select(alpha, load<Bytes16>(db + 16 * k), shuffleBytes(g[k], m)));
     }
     return x;
 }
@@ -326,19 +325,20 @@ struct DupMap {  // one plane into all three channels
 
 // Sixteen three-channel 8-bit pixels under a mask: where the mask byte is
 // non-zero the pixel takes `fresh`, elsewhere it keeps what it holds.
-inline void maskedStore48(uint8_t* d, const uint8_t* m, const __m128i (&fresh)[3]) {
-    const __m128i stays = _mm_cmpeq_epi8(load16(m), _mm_setzero_si128());
-    const __m128i in[3] = {stays, stays, stays};
-    __m128i keep[3];
+inline void maskedStore48(uint8_t* d, const uint8_t* m, const Bytes16 (&fresh)[3]) {
+    using namespace simd;
+    const Bytes16 stays = eq(load<Bytes16>(m), zero<Bytes16>());
+    const Bytes16 in[3] = {stays, stays, stays};
+    Bytes16 keep[3];
     Shuffle48<DupMap>::apply(in, keep);
-    for (int k = 0; k < 3; ++k) store16(d + 16 * k, blend16(fresh[k], load16(d + 16 * k), keep[k]));
+    for (int k = 0; k < 3; ++k) store(d + 16 * k, select(keep[k], load<Bytes16>(d + 16 * k), fresh[k]));
 }
 
 // Channel order applied to 48-byte blocks of three-element pixels: output
 // register k draws on input registers k-1..k+1 only (a pixel never moves
 // further than its own bytes).
 struct SwapShuffle {
-    __m128i m[3][3];
+    Bytes16 m[3][3];
     SwapShuffle(const int (&o)[3], int elemBytes) {
         alignas(16) uint8_t t[3][3][16];
         for (int j = 0; j < 48; ++j) {
@@ -348,30 +348,30 @@ struct SwapShuffle {
                 t[j / 16][r][j % 16] = s / 16 == r ? static_cast<uint8_t>(s % 16) : uint8_t(0x80);
         }
         for (int a = 0; a < 3; ++a)
-            for (int r = 0; r < 3; ++r) m[a][r] = _mm_load_si128(reinterpret_cast<const __m128i*>(t[a][r]));
+            for (int r = 0; r < 3; ++r) m[a][r] = simd::loadAligned<Bytes16>(t[a][r]);
     }
-    void apply(const __m128i (&in)[3], __m128i (&out)[3]) const {
-        out[0] = _mm_or_si128(_mm_shuffle_epi8(in[0], m[0][0]), _mm_shuffle_epi8(in[1], m[0][1]));
-        out[1] = _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(in[0], m[1][0]), _mm_shuffle_epi8(in[1], m[1][1])),
-                              _mm_shuffle_epi8(in[2], m[1][2]));
-        out[2] = _mm_or_si128(_mm_shuffle_epi8(in[1], m[2][1]), _mm_shuffle_epi8(in[2], m[2][2]));
+    void apply(const Bytes16 (&in)[3], Bytes16 (&out)[3]) const {
+        using simd::shuffleBytes;
+        out[0] = shuffleBytes(in[0], m[0][0]) | shuffleBytes(in[1], m[0][1]);
+        out[1] = (shuffleBytes(in[0], m[1][0]) | shuffleBytes(in[1], m[1][1])) | shuffleBytes(in[2], m[1][2]);
+        out[2] = shuffleBytes(in[1], m[2][1]) | shuffleBytes(in[2], m[2][2]);
     }
 };
 
 // Returns the bytes done (whole 48-byte blocks).
 ptrdiff_t swap3Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle& sh) {
     return eachBlock<48>(bytes, [&](ptrdiff_t i) {
-        __m128i in[3], out[3];
-        load48(s + i, in);
+        Bytes16 in[3], out[3];
+        simd::loadBlock(s + i, in);
         sh.apply(in, out);
-        store48(d + i, out);
+        simd::storeBlock(d + i, out);
     });
 }
 
 // Four-element pixels: the order picks colour elements inside 16 bytes; the
 // destination's alpha is carried over unchanged.
 struct SwapShuffle4 {
-    __m128i m, alpha;
+    Bytes16 m, alpha;
     SwapShuffle4(const int (&o)[3], int elemBytes) {
         alignas(16) uint8_t t[16], a[16];
         for (int j = 0; j < 16; ++j) {
@@ -379,15 +379,16 @@ struct SwapShuffle4 {
             t[j] = k == 3 ? uint8_t(0x80) : static_cast<uint8_t>((pixel * 4 + o[k]) * elemBytes + byte);
             a[j] = k == 3 ? 0xFF : 0;
         }
-        m = _mm_load_si128(reinterpret_cast<const __m128i*>(t));
-        alpha = _mm_load_si128(reinterpret_cast<const __m128i*>(a));
+        m = simd::loadAligned<Bytes16>(t);
+        alpha = simd::loadAligned<Bytes16>(a);
     }
 };
 
 ptrdiff_t swap4Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle4& sh) {
+    using namespace simd;
     ptrdiff_t i = 0;
     for (; i + 16 <= bytes; i += 16)
-        store16(d + i, blend16(_mm_shuffle_epi8(load16(s + i), sh.m), load16(d + i), sh.alpha));
+        store(d + i, select(sh.alpha, load<Bytes16>(d + i), shuffleBytes(load<Bytes16>(s + i), sh.m)));
     return i;
 }
 #endif
@@ -517,9 +518,8 @@ Status setC3(const T* value, T* pDst, int dstStep, ImageSize roi) {
 #if ZOR_SIMD >= 2
     alignas(16) E pattern[48 / sizeof(E)];
     for (size_t i = 0; i < 48 / sizeof(E); ++i) pattern[i] = v[i % 3];
-    const __m128i p[3] = {_mm_load_si128(reinterpret_cast<const __m128i*>(pattern)),
-                          _mm_load_si128(reinterpret_cast<const __m128i*>(pattern) + 1),
-                          _mm_load_si128(reinterpret_cast<const __m128i*>(pattern) + 2)};
+    Bytes16 p[3];
+    simd::loadBlock(pattern, p);
 #endif
     eachRow(r.count, [&](int y) {
         repeatFill(reinterpret_cast<uint8_t*>(rowAt(pDst, dstStep, y)), r.elems * ptrdiff_t(3 * sizeof(E)),
@@ -644,8 +644,8 @@ Status ZOR_CALL zoriCopy_8u_C3MR(const uint8_t* pSrc, int srcStep, uint8_t* pDst
         int x = 0;
 #if ZOR_SIMD >= 4
         for (; x + 16 <= roiSize.width; x += 16) {
-            __m128i fresh[3];
-            load48(s + 3 * x, fresh);
+            Bytes16 fresh[3];
+            simd::loadBlock(s + 3 * x, fresh);
             maskedStore48(d + 3 * x, m + x, fresh);
         }
 #endif
@@ -698,11 +698,11 @@ Status ZOR_CALL zoriDup_8u_C1C3R(const uint8_t* pSrc, int srcStep, uint8_t* pDst
         ptrdiff_t x = 0;
 #if ZOR_SIMD >= 4
         for (; x + 16 <= r.elems; x += 16) {
-            const __m128i v = load16(s + x);
-            const __m128i in[3] = {v, v, v};
-            __m128i out[3];
+            const Bytes16 v = simd::load<Bytes16>(s + x);
+            const Bytes16 in[3] = {v, v, v};
+            Bytes16 out[3];
             Shuffle48<DupMap>::apply(in, out);
-            store48(d + 3 * x, out);
+            simd::storeBlock(d + 3 * x, out);
         }
 #endif
         for (; x < r.elems; ++x) d[3 * x] = d[3 * x + 1] = d[3 * x + 2] = s[x];
@@ -739,8 +739,8 @@ Status ZOR_CALL zoriSet_8u_C3MR(const uint8_t* value, uint8_t* pDst, int dstStep
 #if ZOR_SIMD >= 4
     alignas(16) uint8_t pattern[48];
     for (int i = 0; i < 48; ++i) pattern[i] = value[i % 3];
-    __m128i fresh[3];
-    load48(pattern, fresh);
+    Bytes16 fresh[3];
+    simd::loadBlock(pattern, fresh);
 #endif
     for (int y = 0; y < roiSize.height; ++y) {
         uint8_t* d = rowAt(pDst, dstStep, y);
@@ -802,4 +802,4 @@ Status ZOR_CALL zoriCopyReplicateBorder_16s_C1R(const int16_t* pSrc, int srcStep
 
 }}  // namespace zor::ZOR_NS
 
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
