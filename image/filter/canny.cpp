@@ -22,6 +22,7 @@
 #include "frame/variant.h"
 #include "frame/row_address.h"
 #include "frame/status.h"
+#include "frame/simd.h"
 
 #include <climits>
 #include <cmath>
@@ -55,32 +56,20 @@ inline uint8_t* alignUp(uint8_t* p, size_t a) {
 void magnitudeRow(const int16_t* dx, const int16_t* dy, int32_t* m, int w, int low) {
     int x = 0;
 #if ZOR_SIMD >= 2
-    const __m128i lowV = _mm_set1_epi32(low);
+    // 8 pixels per 16-byte register of derivatives, their sums in two
+    using namespace simd;
+    using V = Vec<int16_t, 16>;
+    using W = Vec<int32_t, 16>;
+    const W lowV = set1<W>(low);
     for (; x + 8 <= w; x += 8) {
-        const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(dx + x));
-        const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(dy + x));
-#  if ZOR_SIMD >= 4
-        const __m128i zero = _mm_setzero_si128();
         // |v| fits 16 unsigned bits (|-32768| = 0x8000): zero-extend it
-        const __m128i aa = _mm_abs_epi16(a), ab = _mm_abs_epi16(b);
-        __m128i lo = _mm_add_epi32(_mm_unpacklo_epi16(aa, zero), _mm_unpacklo_epi16(ab, zero));
-        __m128i hi = _mm_add_epi32(_mm_unpackhi_epi16(aa, zero), _mm_unpackhi_epi16(ab, zero));
-#  else
-        // |v| as 32-bit: sign-extend, then (v ^ s) - s
-        const __m128i sa = _mm_srai_epi16(a, 15), sb = _mm_srai_epi16(b, 15);
-        const __m128i alo = _mm_unpacklo_epi16(a, sa), ahi = _mm_unpackhi_epi16(a, sa);
-        const __m128i blo = _mm_unpacklo_epi16(b, sb), bhi = _mm_unpackhi_epi16(b, sb);
-        auto absv = [](__m128i v) {
-            const __m128i s = _mm_srai_epi32(v, 31);
-            return _mm_sub_epi32(_mm_xor_si128(v, s), s);
-        };
-        __m128i lo = _mm_add_epi32(absv(alo), absv(blo));
-        __m128i hi = _mm_add_epi32(absv(ahi), absv(bhi));
-#  endif
-        lo = _mm_and_si128(lo, _mm_cmpgt_epi32(lo, lowV));
-        hi = _mm_and_si128(hi, _mm_cmpgt_epi32(hi, lowV));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(m + x), lo);
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(m + x + 4), hi);
+        const auto a = bitcast<uint16_t>(abs(load<V>(dx + x))), b = bitcast<uint16_t>(abs(load<V>(dy + x)));
+        W lo = bitcast<int32_t>(widenLo(a) + widenLo(b));
+        W hi = bitcast<int32_t>(widenHi(a) + widenHi(b));
+        lo = lo & gt(lo, lowV);
+        hi = hi & gt(hi, lowV);
+        store(m + x, lo);
+        store(m + x + 4, hi);
     }
 #endif
     for (; x < w; ++x) {
@@ -174,10 +163,10 @@ void detect(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, uint8_
 #if ZOR_SIMD >= 2
             // most magnitudes are cleared by the low threshold: skip 16 zeros at once
             if ((x & 15) == 0 && x + 16 <= w) {
-                const __m128i* q = reinterpret_cast<const __m128i*>(cur + x);
-                const __m128i any = _mm_or_si128(_mm_or_si128(_mm_loadu_si128(q), _mm_loadu_si128(q + 1)),
-                                                 _mm_or_si128(_mm_loadu_si128(q + 2), _mm_loadu_si128(q + 3)));
-                if (_mm_movemask_epi8(_mm_cmpeq_epi32(any, _mm_setzero_si128())) == 0xFFFF) {
+                using namespace simd;
+                using W = Vec<int32_t, 16>;
+                const W any = (load<W>(cur + x) | load<W>(cur + x + 4)) | (load<W>(cur + x + 8) | load<W>(cur + x + 12));
+                if (allTrue(eq(any, zero<W>()))) {
                     x += 15;
                     continue;
                 }
@@ -219,14 +208,13 @@ void detect(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, uint8_
 // Non-maximum suppression then runs on 8 pixels at a time, the direction
 // classes formed by the same double products as the scalar test.
 
-inline __m128i abs16(__m128i v) {  // |v| as an unsigned 16-bit value (|-32768| = 0x8000)
-#  if ZOR_SIMD >= 4
-    return _mm_abs_epi16(v);
-#  else
-    const __m128i s = _mm_srai_epi16(v, 15);
-    return _mm_sub_epi16(_mm_xor_si128(v, s), s);
-#  endif
-}
+// Blocks of 8 pixels: one 16-byte register of 16-bit lanes, one byte of the
+// candidate bitmap.
+using S8 = simd::Vec<int16_t, 16>;
+using U8 = simd::Vec<uint16_t, 16>;
+
+// |v| as an unsigned 16-bit value (|-32768| = 0x8000).
+inline U8 abs16(S8 v) { return simd::bitcast<uint16_t>(simd::abs(v)); }
 
 constexpr int16_t kBias = -32768;  // the stored form of a cleared magnitude
 
@@ -234,12 +222,12 @@ constexpr int16_t kBias = -32768;  // the stored form of a cleared magnitude
 // A magnitude of 65536 saturates to 65535 here: the suppression, which
 // visits every block that keeps a magnitude, looks for it (with low below
 // 65535 such a block always keeps one).
-inline __m128i codedBlock(const int16_t* dx, const int16_t* dy, int16_t* e, __m128i lowV) {
-    const __m128i a = abs16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(dx)));
-    const __m128i b = abs16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(dy)));
-    const __m128i m = _mm_subs_epu16(_mm_adds_epu16(a, b), lowV);  // M - L above L, else 0
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(e), _mm_xor_si128(m, _mm_set1_epi16(kBias)));
-    return _mm_cmpeq_epi16(m, _mm_setzero_si128());
+inline S8 codedBlock(const int16_t* dx, const int16_t* dy, int16_t* e, U8 lowV) {
+    using namespace simd;
+    const U8 a = abs16(load<S8>(dx)), b = abs16(load<S8>(dy));
+    const U8 m = subSat(addSat(a, b), lowV);  // M - L above L, else 0
+    store(e, bitcast<int16_t>(m ^ set1<U8>(0x8000)));
+    return bitcast<int16_t>(eq(m, zero<U8>()));
 }
 
 // Stored magnitudes of one ROI row into e[0 .. w-1], and the list of the
@@ -247,23 +235,24 @@ inline __m128i codedBlock(const int16_t* dx, const int16_t* dy, int16_t* e, __m1
 // block is always listed, it overlaps the one before).  Returns the count,
 // or -1 when the scalar tail holds a magnitude of 65536.
 int codedRow(const int16_t* dx, const int16_t* dy, int16_t* e, int w, int low, int32_t* blocks) {
-    const __m128i lowV = _mm_set1_epi16(static_cast<int16_t>(low));
+    using namespace simd;
+    const U8 lowV = set1<U8>(static_cast<uint16_t>(low));
     int x = 0, count = 0;
     // The kept blocks are few and scattered: they are listed without a
     // branch, two at a time from one mask of 16 cleared flags.
     for (; x + 16 <= w; x += 16) {
-        const __m128i c0 = codedBlock(dx + x, dy + x, e + x, lowV);
-        const __m128i c1 = codedBlock(dx + x + 8, dy + x + 8, e + x + 8, lowV);
-        const unsigned cleared = static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(c0, c1)));
+        const S8 c0 = codedBlock(dx + x, dy + x, e + x, lowV);
+        const S8 c1 = codedBlock(dx + x + 8, dy + x + 8, e + x + 8, lowV);
+        const unsigned cleared = static_cast<unsigned>(laneMask(narrowSat<int8_t>(c0, c1)));
         blocks[count] = x;
         count += (cleared & 0xFFu) != 0xFFu;
         blocks[count] = x + 8;
         count += cleared < 0xFF00u;
     }
     if (x + 8 <= w) {
-        const __m128i c0 = codedBlock(dx + x, dy + x, e + x, lowV);
+        const S8 c0 = codedBlock(dx + x, dy + x, e + x, lowV);
         blocks[count] = x;
-        count += _mm_movemask_epi8(c0) != 0xFFFF;
+        count += !allTrue(c0);
         x += 8;
     }
     if (x < w) blocks[count++] = x;
@@ -285,22 +274,18 @@ int codedRow(const int16_t* dx, const int16_t* dy, int16_t* e, int w, int low, i
 // differs only for dx = dy = 0, a magnitude that is always cleared.)
 // c1: the lanes of class 1 (ay < tan 22.5 * ax); notC3: the lanes outside
 // class 3 (ay <= tan 67.5 * ax).
-inline void directionClasses(__m128i ax, __m128i ay, __m128i& c1, __m128i& notC3) {
-    const __m128i zero = _mm_setzero_si128();
-    const __m128i kHi = _mm_set1_epi16(0x6A09), kLo = _mm_set1_epi16(static_cast<int16_t>(0xE667));
+inline void directionClasses(U8 ax, U8 ay, S8& c1, S8& notC3) {
+    using namespace simd;
+    const U8 z = zero<U8>();
+    const U8 kHi = set1<U8>(0x6A09), kLo = set1<U8>(0xE667);
     // ax * 0x6A09E667 / 2^32 = (ax * 0x6A09 + ax * 0xE667 / 2^16) / 2^16
-    const __m128i hi = _mm_mulhi_epu16(ax, kHi), lo = _mm_mullo_epi16(ax, kHi);
-    const __m128i part = _mm_mulhi_epu16(ax, kLo);
-    const __m128i noCarry = _mm_cmpeq_epi16(_mm_add_epi16(lo, part), _mm_adds_epu16(lo, part));
-    const __m128i f = _mm_add_epi16(_mm_sub_epi16(hi, _mm_set1_epi16(-1)), noCarry);  // hi + carry
-    c1 = _mm_cmpeq_epi16(_mm_subs_epu16(ay, f), zero);
+    const U8 hi = mulHi(ax, kHi), lo = ax * kHi;
+    const U8 part = mulHi(ax, kLo);
+    const U8 noCarry = eq(lo + part, addSat(lo, part));
+    const U8 f = (hi - set1<U8>(0xFFFF)) + noCarry;  // hi + carry
+    c1 = bitcast<int16_t>(eq(subSat(ay, f), z));
     // 2 ax + F saturates at 65535 from ax = 16384 on, where ay cannot exceed it anyway
-    notC3 = _mm_cmpeq_epi16(_mm_subs_epu16(ay, _mm_adds_epu16(_mm_adds_epu16(ax, ax), f)), zero);
-}
-
-inline __m128i loadAt(const int16_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
-inline __m128i select(__m128i mask, __m128i a, __m128i b) {
-    return _mm_or_si128(_mm_and_si128(mask, a), _mm_andnot_si128(mask, b));
+    notC3 = bitcast<int16_t>(eq(subSat(ay, addSat(addSat(ax, ax), f)), z));
 }
 
 // The vector detector keeps its candidates in a bitmap: bit c + 8 of row
@@ -405,10 +390,10 @@ bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, u
     for (size_t i = 0; i < 3 * pw; ++i) ringBase[i] = kBias;
     size_t waitingCount = 0;
 
-    const __m128i bias = _mm_set1_epi16(kBias), ones = _mm_set1_epi16(-1);
-    const __m128i strongV = _mm_set1_epi16(static_cast<int16_t>((strongFrom < 0 ? 0 : strongFrom) ^ 0x8000));
-    const __m128i canBeStrong = strongFrom < 0 ? _mm_setzero_si128() : ones;
-    const __m128i zero = _mm_setzero_si128();
+    using namespace simd;
+    const S8 bias = set1<S8>(kBias), ones = set1<S8>(-1);
+    const S8 strongV = set1<S8>(static_cast<int16_t>((strongFrom < 0 ? 0 : strongFrom) ^ 0x8000));
+    const S8 canBeStrong = strongFrom < 0 ? zero<S8>() : ones;
     auto magRow = [&](ptrdiff_t r) { return mag[(r + 1) % 3] + 1; };
     blockCount[0] = codedRow(dx, dy, magRow(0), w, low, blockList[0]);
     if (blockCount[0] < 0) return false;
@@ -436,31 +421,27 @@ bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, u
         for (int b = 0; b < count; ++b) {
             const int x0 = blocks[b];
             const int x = x0 + 8 <= w ? x0 : w - 8;
-            const __m128i m = loadAt(cur + x);
-            const __m128i cleared = _mm_cmpeq_epi16(m, bias);
-            const __m128i gx = loadAt(dxr + x), gy = loadAt(dyr + x);
-            const __m128i ax = abs16(gx), ay = abs16(gy);
-            if (_mm_movemask_epi8(_mm_and_si128(ax, ay)) & 0xAAAA) return false;  // a magnitude of 65536
-            __m128i c1, notC3;
+            const S8 m = load<S8>(cur + x);
+            const S8 cleared = eq(m, bias);
+            const S8 gx = load<S8>(dxr + x), gy = load<S8>(dyr + x);
+            const U8 ax = abs16(gx), ay = abs16(gy);
+            if (laneMask(bitcast<int16_t>(ax & ay))) return false;  // a magnitude of 65536
+            S8 c1, notC3;
             directionClasses(ax, ay, c1, notC3);
             // a > b and a >= b (= not b > a) on the stored form
-            const __m128i k1 = _mm_andnot_si128(_mm_cmpgt_epi16(loadAt(cur + x + 1), m),
-                                                _mm_cmpgt_epi16(m, loadAt(cur + x - 1)));
-            const __m128i k3 = _mm_andnot_si128(_mm_cmpgt_epi16(loadAt(below + x), m),
-                                                _mm_cmpgt_epi16(m, loadAt(above + x)));
-            const __m128i k2 = _mm_cmpgt_epi16(m, _mm_max_epi16(loadAt(above + x + 1), loadAt(below + x - 1)));
-            const __m128i k4 = _mm_cmpgt_epi16(m, _mm_max_epi16(loadAt(above + x - 1), loadAt(below + x + 1)));
-            const __m128i differ = _mm_srai_epi16(_mm_xor_si128(gx, gy), 15);  // signs of dx and dy differ
-            const __m128i keep = _mm_andnot_si128(
-                cleared, select(c1, k1, select(notC3, select(differ, k2, k4), k3)));
-            const __m128i strong = _mm_and_si128(
-                _mm_and_si128(keep, canBeStrong), _mm_xor_si128(_mm_cmpgt_epi16(strongV, m), ones));
-            const __m128i strongBytes = _mm_packs_epi16(strong, strong);
-            const __m128i weakBytes = _mm_packs_epi16(_mm_andnot_si128(strong, keep), zero);
-            map.set8(r, x, static_cast<unsigned>(_mm_movemask_epi8(weakBytes)));
-            unsigned push = static_cast<unsigned>(_mm_movemask_epi8(strongBytes)) & 0xFFu;
+            const S8 k1 = andNot(gt(load<S8>(cur + x + 1), m), gt(m, load<S8>(cur + x - 1)));
+            const S8 k3 = andNot(gt(load<S8>(below + x), m), gt(m, load<S8>(above + x)));
+            const S8 k2 = gt(m, max(load<S8>(above + x + 1), load<S8>(below + x - 1)));
+            const S8 k4 = gt(m, max(load<S8>(above + x - 1), load<S8>(below + x + 1)));
+            const S8 differ = shr<15>(gx ^ gy);  // signs of dx and dy differ
+            const S8 keep = andNot(cleared, select(c1, k1, select(notC3, select(differ, k2, k4), k3)));
+            const S8 strong = (keep & canBeStrong) & (gt(strongV, m) ^ ones);
+            const auto strongBytes = bitcast<uint8_t>(narrowSat<int8_t>(strong, strong));
+            const auto weakBytes = narrowSat<int8_t>(andNot(strong, keep), zero<S8>());
+            map.set8(r, x, static_cast<unsigned>(laneMask(weakBytes)));
+            unsigned push = static_cast<unsigned>(laneMask(strongBytes)) & 0xFFu;
             if (!push) continue;
-            _mm_storel_epi64(reinterpret_cast<__m128i*>(dstRow + x), strongBytes);
+            storeHalf(dstRow + x, strongBytes);
             push &= 0xFFu << (x0 - x);  // pixels of an overlapping block are pushed once
             while (push) {
                 const int i = __builtin_ctz(push);
@@ -485,7 +466,7 @@ bool detectCoded(const int16_t* dx, int dxStep, const int16_t* dy, int dyStep, u
 
 }  // namespace
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 Status ZOR_CALL zoriCannyGetSize(ImageSize roiSize, int* pBufferSize) {
     return cannySize(roiSize, pBufferSize);
 }
