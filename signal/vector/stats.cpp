@@ -207,6 +207,25 @@ Status extremeOf(const T* pSrc, int len, T* pValue, int* pIndx = nullptr) {
 
 // ---- exact integer sums ------------------------------------------------------------
 
+#if ZOR_SIMD >= 2
+// The 32-bit lanes pairs(x) gives for the registers of 16-bit elements x =
+// 0, L, 2L ... below n, summed exactly in 64 bits (Lane: int32_t or
+// uint32_t, how the lanes extend); x ends where the registers ended.
+template <class Lane, class Pairs>
+int64_t sumOfPairs(int n, int& x, Pairs pairs) {
+    using namespace simd;
+    using Q = Vec<std::conditional_t<std::is_signed_v<Lane>, int64_t, uint64_t>>;
+    constexpr int L = Vec<int16_t>::kLanes;
+    Q lo = zero<Q>(), hi = lo;
+    for (; x + L <= n; x += L) {
+        const auto t = bitcast<Lane>(pairs(x));
+        lo = lo + widenLo(t);
+        hi = hi + widenHi(t);
+    }
+    return int64_t(reduceAdd(lo + hi));
+}
+#endif
+
 // Sum of products.  pmaddwd pairs lie in [-2^31 + 2^16, 2^31]; only 2^31
 // (two products of -32768 by -32768) wraps, so each pair is taken minus
 // 2^16, which fits in 32 bits exactly, and the 2^16 added back at the end.
@@ -217,15 +236,9 @@ Status extremeOf(const T* pSrc, int len, T* pValue, int* pIndx = nullptr) {
     using namespace simd;
     using V = Vec<int16_t>;
     using W = Vec<int32_t>;
-    using Q = Vec<int64_t>;
     const W bias = set1<W>(65536);
-    Q lo = zero<Q>(), hi = lo;
-    for (; i + V::kLanes <= n; i += V::kLanes) {
-        const W w = mulAddPairs(load<V>(a + i), load<V>(b + i)) - bias;
-        lo = lo + widenLo(w);
-        hi = hi + widenHi(w);
-    }
-    total = reduceAdd(lo + hi) + int64_t(i / 2) * 65536;
+    total = sumOfPairs<int32_t>(n, i, [&](int x) { return mulAddPairs(load<V>(a + x), load<V>(b + x)) - bias; });
+    total += int64_t(i / 2) * 65536;
 #endif
     for (; i < n; ++i) total += int32_t(a[i]) * int32_t(b[i]);
     return total;
@@ -238,15 +251,10 @@ Status extremeOf(const T* pSrc, int len, T* pValue, int* pIndx = nullptr) {
 #if ZOR_SIMD >= 2
     using namespace simd;
     using V = Vec<int16_t>;
-    using Q = Vec<uint64_t>;
-    Q lo = zero<Q>(), hi = lo;
-    for (; i + V::kLanes <= n; i += V::kLanes) {
-        const V x = load<V>(a + i);
-        const auto q = bitcast<uint32_t>(mulAddPairs(x, x));
-        lo = lo + widenLo(q);
-        hi = hi + widenHi(q);
-    }
-    total = int64_t(reduceAdd(lo + hi));
+    total = sumOfPairs<uint32_t>(n, i, [&](int x) {
+        const V v = load<V>(a + x);
+        return mulAddPairs(v, v);
+    });
 #endif
     for (; i < n; ++i) total += int32_t(a[i]) * int32_t(a[i]);
     return total;
@@ -260,16 +268,11 @@ Status extremeOf(const T* pSrc, int len, T* pValue, int* pIndx = nullptr) {
 #if ZOR_SIMD >= 2
     using namespace simd;
     using V = Vec<int16_t>;
-    using Q = Vec<uint64_t>;
     const V one = set1<V>(1);
-    Q lo = zero<Q>(), hi = lo;
-    for (; i + V::kLanes <= n; i += V::kLanes) {
-        const V x = load<V>(a + i), sign = shr<15>(x);
-        const auto t = bitcast<uint32_t>(mulAddPairs(x ^ sign, one) - mulAddPairs(sign, one));
-        lo = lo + widenLo(t);
-        hi = hi + widenHi(t);
-    }
-    total = int64_t(reduceAdd(lo + hi));
+    total = sumOfPairs<uint32_t>(n, i, [&](int x) {
+        const V v = load<V>(a + x), sign = shr<15>(v);
+        return mulAddPairs(v ^ sign, one) - mulAddPairs(sign, one);
+    });
 #endif
     for (; i < n; ++i) total += std::abs(int32_t(a[i]));
     return total;
