@@ -18,7 +18,6 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-
 // ---- 3x3 ----------------------------------------------------------------------------
 
 // One result row from source rows above, at and below p (column 0).

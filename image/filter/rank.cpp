@@ -25,7 +25,6 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-
 Status checkRank(const void* src, int srcStep, const void* dst, int dstStep, ImageSize roi,
                  ImageSize mask, ImagePoint anchor, bool oddOnly) {
     if (Status s = checkFirst(anyNull(src, dst), badRoi(roi), badSteps(srcStep, dstStep)))
