@@ -786,6 +786,24 @@ struct Isa<16> {
     // About 12 bits of 1/a (rcpps).
     static __m128 recipApprox(__m128 a) { return _mm_rcp_ps(a); }
 
+    // The float sums of reduceAdd through addss/addsd, which keep the
+    // left operand first (the compiler may swap the operands of a plain +).
+    template <class T>
+    static T reduceAdd(R<T> a) {
+        if constexpr (isF<T>) {
+            const __m128 hi = _mm_movehl_ps(a, a);                                     // l2 l3
+            const __m128 s02 = _mm_add_ss(a, hi);                                      // l0 + l2
+            const __m128 s13 = _mm_add_ss(_mm_shuffle_ps(a, a, 1), _mm_shuffle_ps(hi, hi, 1));  // l1 + l3
+            return _mm_cvtss_f32(_mm_add_ss(s02, s13));
+        }
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) {
+            return _mm_cvtsd_f64(_mm_add_sd(a, _mm_unpackhi_pd(a, a)));
+        }
+#  endif
+        else static_assert(sizeof(T) == 0, "reduceAdd of float lanes here");
+    }
+
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
@@ -1110,10 +1128,13 @@ inline V fromLanes(const typename V::Lane (&lanes)[V::kLanes]) { return load<V>(
 // ---- horizontal reductions ----------------------------------------------------
 // Integer sums wrap around in the lane type.  Float sums add in a fixed
 // order: lane i and lane i + n/2, halving until one is left, so four lanes
-// give (l0 + l2) + (l1 + l3).  Widen first where a sum needs more range.
+// give (l0 + l2) + (l1 + l3), each addition with its left operand first (the
+// NaN a sum of two NaNs keeps is the left one's, as the scalar a + b of the
+// generic code gives it).  Widen first where a sum needs more range.
 
 template <class T, int B>
 inline T reduceAdd(Vec<T, B> v) {
+    if constexpr (std::is_floating_point_v<T>) return Isa<B>::template reduceAdd<T>(v.raw);
     alignas(64) T l[Vec<T, B>::kLanes];
     storeAligned(l, v);
     for (int half = Vec<T, B>::kLanes / 2; half >= 1; half /= 2)

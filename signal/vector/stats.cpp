@@ -45,8 +45,8 @@ SumAndSquares pairSums(const float* s, int n) {
         acc = acc + a + b;
         if (Squares) accq = accq + a * a + b * b;
     }
-    t = getLane<0>(acc) + getLane<1>(acc);
-    if (Squares) q = getLane<0>(accq) + getLane<1>(accq);
+    t = reduceAdd(acc);
+    if (Squares) q = reduceAdd(accq);
 #else
     double s0 = 0.0, s1 = 0.0, q0 = 0.0, q1 = 0.0;
     for (; i + 4 <= n; i += 4) {
@@ -103,7 +103,7 @@ double eightSums(const float* a, const float* b, int n) {
         c3 = c3 + term<K>(at(a + 6), at(b + 6));
     }
     const D2 s = (c0 + c1) + (c2 + c3);
-    t = getLane<0>(s) + getLane<1>(s);
+    t = reduceAdd(s);
 #else
     double s[8] = {0, 0, 0, 0, 0, 0, 0, 0};
     for (; i + 8 <= n; i += 8)
