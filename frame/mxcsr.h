@@ -21,6 +21,8 @@
 
 #include "frame/abi.h"
 
+#include <cstdint>
+
 #if ZOR_SIMD >= 2
 #  include <emmintrin.h>
 
@@ -68,6 +70,16 @@ private:
     const unsigned entry_;
     unsigned kept_ = 0;
 };
+
+// Everything the roundings of float and double arithmetic depend on: the
+// SSE control bits (rounding, flush-to-zero, denormals-are-zero; not the
+// sticky flags) and the x87 control word, which library functions may use.
+// Equal states round every operation alike.
+inline uint32_t arithmeticState() {
+    uint16_t cw;
+    __asm__ volatile("fnstcw %0" : "=m"(cw));
+    return (_mm_getcsr() & 0xFFC0u) | (uint32_t(cw) << 16);
+}
 
 }}  // namespace zor::ZOR_INLINE_NS
 #endif
