@@ -88,9 +88,27 @@ public:
         }
         return p;
     }
+    // A copy of v (built from rng(), say zt::randomFloats(n, c.rng()())).
+    template <class T>
+    T* in(const std::vector<T>& v) { return copyOf(v, false); }
     // count elements compared after the call (pre-filled with a pattern).
     template <class T>
     T* out(size_t count) { return alloc<T>(count, true); }
+    // Inputs compared after the call too: in-place exports.
+    template <class T>
+    T* inOut(size_t count) {
+        T* p = alloc<T>(count, true);
+        fillRandom(p, count, rng_);
+        return p;
+    }
+    template <class T>
+    T* inOut(const std::vector<T>& v) { return copyOf(v, true); }
+    // Floats over [-scale, scale], NaN, infinities, signed zeros and
+    // denormals mixed in (one NaN pattern: which operand's NaN an operation
+    // keeps is the processor's business).
+    std::vector<float> floats(size_t count, float scale = 1000.0f) {
+        return randomFloats(count, rng_(), scale, true);
+    }
 
     // Images of `elems` elements a row (pixels times channels), rows padded
     // to a step that is no multiple of 16 bytes.
@@ -117,6 +135,12 @@ private:
     }
     static size_t bytesFor(int step, int rowBytes, int rows) {
         return static_cast<size_t>(step) * (rows - 1) + rowBytes;
+    }
+    template <class T>
+    T* copyOf(const std::vector<T>& v, bool output) {
+        T* p = alloc<T>(v.size(), output);
+        if (!v.empty()) std::memcpy(p, v.data(), v.size() * sizeof(T));
+        return p;
     }
     template <class T>
     T* alloc(size_t count, bool output) {

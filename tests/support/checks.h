@@ -12,6 +12,9 @@
 //                      zt::bad(StatusBadSize, zt::arg<4>(ImageSize{0, 1})),
 //                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr),   // order: null first
 //                              zt::arg<4>(ImageSize{0, 0})));
+//
+// Vector exports: zt::badLength<I>() stands for the two rows that set the
+// length, argument I, to 0 and to -1 (StatusBadSize).
 #pragma once
 
 #include <gtest/gtest.h>
@@ -64,6 +67,12 @@ struct EachNull {
 inline EachNull eachNull(Status expected = StatusNullPointer, std::vector<size_t> allowed = {}) {
     return {expected, std::move(allowed)};
 }
+
+// Rows setting length argument I to 0 and to -1: StatusBadSize.
+template <size_t I>
+struct BadLength {};
+template <size_t I>
+BadLength<I> badLength() { return {}; }
 
 template <class T>
 struct Same { using type = T; };
@@ -128,6 +137,15 @@ void nullRows(Fn fn, const Tuple& good, const std::vector<Watch>& outs, const Ea
 template <class Fn, class Tuple>
 void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, const EachNull& e, int index) {
     nullRows(fn, good, outs, e, index, std::make_index_sequence<std::tuple_size_v<Tuple>>{});
+}
+
+template <class Fn, class Tuple, size_t I>
+void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, BadLength<I>, int index) {
+    for (int len : {0, -1}) {
+        Tuple call = good;
+        std::get<I>(call) = len;
+        expectRow(fn, outs, StatusBadSize, call, "row " + std::to_string(index) + " (length " + std::to_string(len) + ")");
+    }
 }
 
 }  // namespace detail
