@@ -37,16 +37,18 @@ struct ImageBuf {
     int step;  // bytes
 };
 
-// Random lanes: integers over their whole range, floats over [-1000, 1000].
+// Random lanes: floats over [-1000, 1000], anything else (integers,
+// complex integers) random bits.
 template <class T>
 void fillRandom(T* p, size_t n, std::mt19937& rng) {
     if constexpr (std::is_floating_point_v<T>) {
         std::uniform_real_distribution<double> d(-1000.0, 1000.0);
         for (size_t i = 0; i < n; ++i) p[i] = static_cast<T>(d(rng));
     } else {
-        for (size_t i = 0; i < n; ++i) {
-            const uint64_t bits = (uint64_t(rng()) << 32) | rng();
-            std::memcpy(p + i, &bits, sizeof(T));
+        auto* b = reinterpret_cast<uint8_t*>(p);
+        for (size_t i = 0; i < n * sizeof(T); i += 4) {
+            const uint32_t bits = rng();
+            std::memcpy(b + i, &bits, n * sizeof(T) - i < 4 ? n * sizeof(T) - i : 4);
         }
     }
 }
