@@ -14,7 +14,9 @@
 //                              zt::arg<4>(ImageSize{0, 0})));
 //
 // Vector exports: zt::badLength<I>() stands for the two rows that set the
-// length, argument I, to 0 and to -1 (StatusBadSize).
+// length, argument I, to 0 and to -1 (StatusBadSize); image exports:
+// zt::badRoi<I>() for the rows that set the ImageSize argument I to a width
+// and to a height of 0 (StatusBadSize).
 #pragma once
 
 #include <gtest/gtest.h>
@@ -73,6 +75,12 @@ template <size_t I>
 struct BadLength {};
 template <size_t I>
 BadLength<I> badLength() { return {}; }
+
+// Rows setting ImageSize argument I to {0, 1} and to {1, 0}: StatusBadSize.
+template <size_t I>
+struct BadRoi {};
+template <size_t I>
+BadRoi<I> badRoi() { return {}; }
 
 template <class T>
 struct Same { using type = T; };
@@ -137,6 +145,17 @@ void nullRows(Fn fn, const Tuple& good, const std::vector<Watch>& outs, const Ea
 template <class Fn, class Tuple>
 void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, const EachNull& e, int index) {
     nullRows(fn, good, outs, e, index, std::make_index_sequence<std::tuple_size_v<Tuple>>{});
+}
+
+template <class Fn, class Tuple, size_t I>
+void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, BadRoi<I>, int index) {
+    for (ImageSize roi : {ImageSize{0, 1}, ImageSize{1, 0}}) {
+        Tuple call = good;
+        std::get<I>(call) = roi;
+        expectRow(fn, outs, StatusBadSize, call,
+                  "row " + std::to_string(index) + " (roi " + std::to_string(roi.width) + "x" +
+                      std::to_string(roi.height) + ")");
+    }
 }
 
 template <class Fn, class Tuple, size_t I>
