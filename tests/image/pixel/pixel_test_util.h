@@ -59,9 +59,10 @@ std::vector<T> contents(const zt::GuardedImage<T>& g) {
 
 // For every size and pair of layouts (packed or not on either side): a
 // random source of sc-element pixels and a random destination of
-// dc-element ones; run(src, dst, roi) calls the export and expect(s, d)
-// turns the contents into what the destination must hold; nothing outside
-// its ROI may change.
+// dc-element ones; run(src, dst, roi) calls the export (it may first put
+// other values into the source) and expect(s, d) turns the source's and
+// the destination's contents into what the destination must hold; nothing
+// outside its ROI may change.
 template <class S, class D, class Run, class Expect>
 ::testing::AssertionResult movesAsExpected(int sc, int dc, uint32_t seed, Run run, Expect expect,
                                            const std::vector<ImageSize>& sizes = shapes()) {
@@ -74,8 +75,8 @@ template <class S, class D, class Run, class Expect>
             auto src = image<S>(roi, sc, l, rng);
             auto dst = image<D>(roi, dc, pair[1], rng);
             std::vector<D> want = contents(*dst);
-            expect(contents(*src), want);
             if (run(*src, *dst, roi) != StatusOk) return ::testing::AssertionFailure() << "status";
+            expect(contents(*src), want);
             const std::vector<D> got = contents(*dst);
             for (size_t i = 0; i < got.size(); ++i)
                 if (std::memcmp(&got[i], &want[i], sizeof(D)) != 0)
