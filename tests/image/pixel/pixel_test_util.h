@@ -9,6 +9,7 @@
 #include <cstring>
 #include <memory>
 #include <random>
+#include <type_traits>
 #include <vector>
 
 #include "tests/support/guarded.h"
@@ -61,8 +62,9 @@ std::vector<T> contents(const zt::GuardedImage<T>& g) {
 // random source of sc-element pixels and a random destination of
 // dc-element ones; run(src, dst, roi) calls the export (it may first put
 // other values into the source) and expect(s, d) turns the source's and
-// the destination's contents into what the destination must hold; nothing
-// outside its ROI may change.
+// the destination's contents into what the destination must hold (given
+// the ROI size too, if it takes a third argument); nothing outside its ROI
+// may change.
 template <class S, class D, class Run, class Expect>
 ::testing::AssertionResult movesAsExpected(int sc, int dc, uint32_t seed, Run run, Expect expect,
                                            const std::vector<ImageSize>& sizes = shapes()) {
@@ -76,7 +78,10 @@ template <class S, class D, class Run, class Expect>
             auto dst = image<D>(roi, dc, pair[1], rng);
             std::vector<D> want = contents(*dst);
             if (run(*src, *dst, roi) != StatusOk) return ::testing::AssertionFailure() << "status";
-            expect(contents(*src), want);
+            if constexpr (std::is_invocable_v<Expect, const std::vector<S>&, std::vector<D>&, ImageSize>)
+                expect(contents(*src), want, roi);
+            else
+                expect(contents(*src), want);
             const std::vector<D> got = contents(*dst);
             for (size_t i = 0; i < got.size(); ++i)
                 if (std::memcmp(&got[i], &want[i], sizeof(D)) != 0)
