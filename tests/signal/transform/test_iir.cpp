@@ -4,24 +4,16 @@
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
-#include <random>
 #include <vector>
 
 #include "frame/memory.h"
+#include "tests/support/agree.h"
 #include "tests/support/checks.h"
 #include "tests/support/variants.h"
 
 namespace {
 
 class Iir : public zt::VariantTest {};
-
-std::vector<float> noise(size_t n, unsigned seed, float lo = -1, float hi = 1) {
-    std::mt19937 g(seed);
-    std::uniform_real_distribution<float> u(lo, hi);
-    std::vector<float> v(n);
-    for (float& f : v) f = u(g);
-    return v;
-}
 
 // The definition: taps normalised by a0 in double (rounded to float), then
 // per sample y = b0 x + d0, d_i = (b_(i+1) x - a_(i+1) y) + d_(i+1) and
@@ -45,9 +37,9 @@ std::vector<float> filtered(const std::vector<float>& taps, int order, std::vect
 
 TEST_P(Iir, MatchesTheDefinitionAcrossOrdersAndBlocks) {
     for (int order : {1, 2, 3, 5, 8, 9, 13}) {
-        std::vector<float> taps = noise(2 * order + 2, order, -0.3f, 0.3f);  // small feedback: stable
+        std::vector<float> taps = zt::randomFloats(2 * order + 2, order, 0.3f);  // small feedback: stable
         taps[order + 1] = 1.25f;
-        const auto dly = noise(order, 100 + order), x = noise(301, 7 * order);
+        const auto dly = zt::randomFloats(order, 100 + order, 1.0f), x = zt::randomFloats(301, 7 * order, 1.0f);
         const auto want = filtered(taps, order, dly, x);
         void* st = nullptr;
         ASSERT_EQ(z().zorsIIRInitAlloc_32f(&st, taps.data(), order, dly.data()), StatusOk);
