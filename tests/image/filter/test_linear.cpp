@@ -102,36 +102,22 @@ uint8_t one8u(const zt::Api& z, uint8_t pixel, int32_t coefficient, int divisor)
     return d;
 }
 
-TEST_P(LinearFilter, DivisorModesRoundHalfUpAndDropNonPositive) {
+// The extremes the random kernels do not reach: shift mode saturating, sums
+// near the 32-bit limits (exact products, no overflow in the scaling), a sum
+// that wraps in 32 bits, the divisor -2^31 (1 for sums <= -2^30, else 0).
+TEST_P(LinearFilter, DivisorModesAtTheExtremes) {
     const auto& z = this->z();
-    EXPECT_EQ(one8u(z, 6, 1, 4), 2);
-    EXPECT_EQ(one8u(z, 5, 1, 4), 1);
-    EXPECT_EQ(one8u(z, 0, 1, 4), 0);
-    EXPECT_EQ(one8u(z, 6, -1, 4), 0);
-    EXPECT_EQ(one8u(z, 4, 1, 3), 1);
-    EXPECT_EQ(one8u(z, 5, 1, 3), 2);
-    EXPECT_EQ(one8u(z, 7, -1, -1), 7);
-    EXPECT_EQ(one8u(z, 7, 1, -1), 0);
-    EXPECT_EQ(one8u(z, 255, 3, 1), 255);
-    EXPECT_EQ(one8u(z, 255, -3, 1), 0);
-    EXPECT_EQ(one8u(z, 255, 1 << 22, 1 << 20), 255);  // shift mode saturates
-    // sums near the 32-bit limits: exact products, no overflow in the scaling
-    EXPECT_EQ(one8u(z, 255, 8421504, 1 << 30), 2);          // 2147483520 / 2^30 = 1.99999988
-    EXPECT_EQ(one8u(z, 255, 8421504, 3), 255);
-    EXPECT_EQ(one8u(z, 255, -8421504, -16777216), 128);    // 2147483520 / 2^24 = 127.99999
-    // the sum wraps in 32 bits: 2 * 255 * 8421504 = 4294967040 -> -256
-    {
-        const uint8_t px[2] = {255, 255};
-        const int32_t k[2] = {8421504, 8421504};
-        uint8_t d = 9;
-        ASSERT_EQ(z.zoriFilter_8u_C1R(px + 1, 2, &d, 1, {1, 1}, k, {2, 1}, {0, 0}, -1), StatusOk);
-        EXPECT_EQ(d, 255);  // -256 / -1 = 256, saturated
-    }
-    // divisor -2^31: 1 for sums <= -2^30, 0 otherwise
     const int divMin = std::numeric_limits<int32_t>::min();
-    EXPECT_EQ(one8u(z, 128, -(1 << 23), divMin), 1);
-    EXPECT_EQ(one8u(z, 127, -(1 << 23), divMin), 0);
-    EXPECT_EQ(one8u(z, 128, 1 << 23, divMin), 0);
+    const struct { uint8_t px; int32_t k; int divisor; uint8_t want; } cases[] = {
+        {255, 1 << 22, 1 << 20, 255}, {255, 8421504, 1 << 30, 2}, {255, 8421504, 3, 255},
+        {255, -8421504, -16777216, 128}, {128, -(1 << 23), divMin, 1}, {127, -(1 << 23), divMin, 0},
+        {128, 1 << 23, divMin, 0}, {6, 1, 4, 2}, {6, -1, 4, 0}, {7, -1, -1, 7}};
+    for (const auto& c : cases) EXPECT_EQ(one8u(z, c.px, c.k, c.divisor), c.want) << c.k << " / " << c.divisor;
+    const uint8_t px[2] = {255, 255};
+    const int32_t k[2] = {8421504, 8421504};  // 2 * 255 * 8421504 = 4294967040 wraps to -256
+    uint8_t d = 9;
+    ASSERT_EQ(z.zoriFilter_8u_C1R(px + 1, 2, &d, 1, {1, 1}, k, {2, 1}, {0, 0}, -1), StatusOk);
+    EXPECT_EQ(d, 255);  // -256 / -1 = 256, saturated
 }
 
 // The float-kernel 8u result as defined: the sum accumulated in double in
