@@ -73,11 +73,7 @@ public:
 
     // count random elements (fillRandom), or uniform over [lo, hi].
     template <class T>
-    T* in(size_t count) {
-        T* p = alloc<T>(count, false);
-        fillRandom(p, count, rng_);
-        return p;
-    }
+    T* in(size_t count) { return randomIn<T>(count, false); }
     template <class T>
     T* in(size_t count, double lo, double hi) {
         T* p = alloc<T>(count, false);
@@ -98,11 +94,7 @@ public:
     T* out(size_t count) { return alloc<T>(count, true); }
     // Inputs compared after the call too: in-place exports.
     template <class T>
-    T* inOut(size_t count) {
-        T* p = alloc<T>(count, true);
-        fillRandom(p, count, rng_);
-        return p;
-    }
+    T* inOut(size_t count) { return randomIn<T>(count, true); }
     template <class T>
     T* inOut(const std::vector<T>& v) { return copyOf(v, true); }
     // Floats over [-scale, scale], NaN, infinities, signed zeros and
@@ -137,6 +129,12 @@ private:
     }
     static size_t bytesFor(int step, int rowBytes, int rows) {
         return static_cast<size_t>(step) * (rows - 1) + rowBytes;
+    }
+    template <class T>
+    T* randomIn(size_t count, bool output) {
+        T* p = alloc<T>(count, output);
+        fillRandom(p, count, rng_);
+        return p;
     }
     template <class T>
     T* copyOf(const std::vector<T>& v, bool output) {
