@@ -27,7 +27,7 @@ template <class T, class F, class Pick>
     zt::GuardedBuffer buf(sizeof(T) * size_t(rowLen) * rows, w % 2 ? zt::Guard::After : zt::Guard::Before);
     T* s = buf.as<T>();
     for (int i = 0; i < rowLen * rows; ++i) s[i] = T(range ? int(rng() % range) - range / 2 : int(rng()));
-    zt::GuardedImage<T> d(w, roi.height, 0, 3);
+    zt::GuardedImage<T> d(w, roi.height, 0, 3 * int(sizeof(T)));  // padded rows
     const T* origin = s + size_t(a.y) * rowLen + a.x;
     if (fn(origin, rowLen * int(sizeof(T)), d.roi(), d.step(), roi, m, a) != StatusOk)
         return ::testing::AssertionFailure() << "status";

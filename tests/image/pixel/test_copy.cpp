@@ -251,7 +251,7 @@ TEST_P(Copy, Checks) {
     const int order[3] = {2, 1, 0}, three[3] = {0, 3, 1}, minus[3] = {-1, 0, 1};
     zt::expectChecks(a.zoriCopy_8u_C1R, {s, 8, d, 8, ImageSize{8, 8}}, w, zt::eachNull(), zt::badRoi<4>(),
                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<4>(ImageSize{0, 1})));
-    zt::expectChecks(a.zoriCopy_16s_C4C1R, {(const int16_t*)s, 8, (int16_t*)d, 8, ImageSize{2, 8}}, w, zt::eachNull(), zt::badRoi<4>());
+    zt::expectChecks(a.zoriCopy_16s_C4C1R, {(const int16_t*)s, 16, (int16_t*)d, 8, ImageSize{2, 2}}, w, zt::eachNull(), zt::badRoi<4>());
     zt::expectChecks(a.zoriDup_8u_C1C3R, {s, 2, d, 6, ImageSize{2, 8}}, w, zt::eachNull(), zt::badRoi<4>());
     zt::expectChecks(a.zoriCopy_8u_C3MR, {s, 6, d, 6, ImageSize{2, 8}, s, 2}, w, zt::eachNull(), zt::badRoi<4>());
     zt::expectChecks(a.zoriCopy_8u_C3P3R, {s, 12, planes, 4, ImageSize{4, 4}}, w, zt::eachNull(), zt::badRoi<4>(),
