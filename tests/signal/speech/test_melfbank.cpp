@@ -26,7 +26,12 @@ struct BankHead {
     uint8_t initialised;
 };
 
-float melOf(double f) { return static_cast<float>(2595.0 * std::log(1.0 + f / 700.0)); }
+// Each value rounded to float where the definition rounds it (volatile: the
+// x87 unit would keep more).
+float melOf(double f) {
+    volatile float m = static_cast<float>(2595.0 * std::log(1.0 + f / 700.0));
+    return m;
+}
 
 // The filters by their definition: nf + 2 centres evenly spaced in mel,
 // their bins (truncated for mel weights, nearest for linear ones), then each
@@ -38,12 +43,12 @@ struct Filters {
     std::vector<int> bins;
     std::vector<float> out;
     Filters(int n, float fs, float lo, float hi, int nf, bool mel, const std::vector<float>& s) {
-        const float melLow = melOf(lo), diff = melOf(hi) - melLow;
+        volatile float melLow = melOf(lo), melHigh = melOf(hi), diff = melHigh - melLow;
         std::vector<float> centre(nf + 2);
         for (int k = 0; k < nf + 2; ++k) {
             centre[k] = static_cast<float>(k * double(diff) / double(float(nf + 1)) + melLow);
-            const float e = static_cast<float>(std::exp(double(centre[k]) / 2595.0) - 1.0);
-            const float p = static_cast<float>(double(n) / fs * 700.0 * e);
+            volatile float e = static_cast<float>(std::exp(double(centre[k]) / 2595.0) - 1.0);
+            volatile float p = static_cast<float>(double(n) / fs * 700.0 * e);
             bins.push_back(mel ? static_cast<int>(p) : static_cast<int>(std::nearbyint(p)));
         }
         const auto melBin = [&](int i) { return double(melOf(double(i) * fs / n)); };
@@ -114,6 +119,12 @@ TEST_P(MelFBank, OwnTransformIsTheTransformThenTheMagnitude) {
         EXPECT_EQ(a.zorsFBankFree_32f(bank), StatusOk);
         EXPECT_EQ(a.zorsFBankFree_32f(plain), StatusOk);
     }
+#if defined(__i386__)
+    const int reference = 1;  // the generic variant's transform sums on the x87 unit
+#else
+    const int reference = 0;
+#endif
+    if (variant() == 0 && reference) return;
     zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
         void* bank = nullptr;
         int order = 0;
@@ -121,7 +132,7 @@ TEST_P(MelFBank, OwnTransformIsTheTransformThenTheMagnitude) {
         if (z.zorsMelFBankInitAlloc_32f(&bank, &order, win, 16000, 64, 8000, 12, 2595, 700, mode)) return -1;
         const Status s = z.zorsEvalFBank_32f(c.in<float>(1 << order), c.out<float>(12), bank);
         return s + z.zorsFBankFree_32f(bank);
-    });
+    }, reference);
 }
 
 TEST_P(MelFBank, ChecksAndCodes) {

@@ -276,21 +276,23 @@ TEST_P(VecInit, FloatToIntegerKeepsTheCallersFloatingPointState) {
         EXPECT_TRUE(after == fe && invalidKept);
         for (int i = 0; i < n; ++i) ASSERT_EQ(d[i], expectNarrow<int32_t>(src[i], RoundNear, 0)) << fe << " " << src[i];
     }
+    // Values the rule saturates raise nothing; with the invalid exception
+    // unmasked they do not trap either.
     src.assign(64, 2.5f);
     src[50] = 3e9f;
-    src[41] = -1e30f;
     std::vector<int16_t> s16(64);
     std::feclearexcept(FE_ALL_EXCEPT);
-#if defined(__GLIBC__)
-    feenableexcept(FE_INVALID);  // and no trap with the exception unmasked
-#endif
-    const Status s = z.zorsConvert_32f16s_Sfs(src.data(), s16.data(), 64, RoundNear, 0);
-#if defined(__GLIBC__)
-    fedisableexcept(FE_INVALID);
-#endif
+    ASSERT_EQ(z.zorsConvert_32f16s_Sfs(src.data(), s16.data(), 64, RoundNear, 0), StatusOk);
     EXPECT_FALSE(std::fetestexcept(FE_INVALID));
+#if defined(__GLIBC__)
+    src[41] = -1e30f;
+    feenableexcept(FE_INVALID);
+    const Status s = z.zorsConvert_32f16s_Sfs(src.data(), s16.data(), 64, RoundNear, 0);
+    fedisableexcept(FE_INVALID);
     ASSERT_EQ(s, StatusOk);
-    EXPECT_TRUE(s16[50] == 32767 && s16[41] == -32768 && s16[0] == 2);
+    EXPECT_EQ(s16[41], -32768);
+#endif
+    EXPECT_TRUE(s16[50] == 32767 && s16[0] == 2);
 }
 
 ZT_ALL_VARIANTS(VecInit);
