@@ -90,48 +90,42 @@ ptrdiff_t s16ToFloatSimd(const int16_t* s, float* d, ptrdiff_t n) {
     });
 }
 
-// Float to 8 bits, sixteen values at a time.  Unclamped, cvtps2dq (or
-// cvttps2dq) is right for every input it can represent, and the packs
-// saturate: negative values end as 0, large ones as 255.  The inputs it
-// cannot represent (NaN, values outside the int32 range) raise the invalid
-// flag, and the row is converted again with the upper clamp in float first:
+// Float to 8 bits, sixteen values at a time: the upper clamp in float, then
+// cvtps2dq (or cvttps2dq) and saturating packs.  Negative values end as 0;
 // min returns its second operand when one is NaN, so NaN stays NaN, becomes
-// INT_MIN and ends as 0; 255 and above end as 255.
+// INT_MIN and ends as 0; 255 and above (up to infinity) end as 255.
 //
 // With Aligned the loads fold into the conversions (legacy SSE takes only
 // aligned memory operands), which leaves more room in the out-of-order
 // window for loads in flight.
-template <bool Nearest, bool Clamp, bool Aligned>
+template <bool Nearest, bool Aligned>
 inline I4 floatToInt(const float* s) {
     using namespace simd;
     F4 v = Aligned ? loadAligned<F4>(s) : load<F4>(s);
-    if constexpr (Clamp) v = min(set1<F4>(255.0f), v);
+    v = min(set1<F4>(255.0f), v);
     return Nearest ? toInt32(v) : toInt32Trunc(v);
 }
-template <bool Nearest, bool Clamp, bool Aligned>
-inline simd::Vec<int16_t, 16> floatToI16x8(const float* s) {
-    return simd::narrowSat<int16_t>(floatToInt<Nearest, Clamp, Aligned>(s), floatToInt<Nearest, Clamp, Aligned>(s + 4));
-}
-
-template <bool Nearest, bool Clamp, bool Aligned>
-[[gnu::noinline]] ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
-    return eachBlock<16>(n, [&](ptrdiff_t x) {
-        simd::store(d + x, simd::narrowSat<uint8_t>(floatToI16x8<Nearest, Clamp, Aligned>(s + x),
-                                                    floatToI16x8<Nearest, Clamp, Aligned>(s + x + 8)));
-    });
-}
-
-// The blocks of a row: fast, and again clamped if the fast pass met an
-// input it cannot take.  With the invalid exception unmasked, where a SIMD
-// conversion of such an input would trap, the row goes element by element.
 template <bool Nearest, bool Aligned>
-ptrdiff_t floatToU8Blocks(const float* s, uint8_t* d, ptrdiff_t n, ConversionScope& csr) {
-    if (!csr.armed()) return 0;
-    ptrdiff_t done = 0;
-    csr.run([&](bool clamp) {
-        done = clamp ? floatToU8Simd<Nearest, true, Aligned>(s, d, n) : floatToU8Simd<Nearest, false, Aligned>(s, d, n);
+inline simd::Vec<int16_t, 16> floatToI16x8(const float* s) {
+    return simd::narrowSat<int16_t>(floatToInt<Nearest, Aligned>(s), floatToInt<Nearest, Aligned>(s + 4));
+}
+
+template <bool Nearest, bool Aligned>
+ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
+    return eachBlock<16>(n, [&](ptrdiff_t x) {
+        simd::store(d + x, simd::narrowSat<uint8_t>(floatToI16x8<Nearest, Aligned>(s + x),
+                                                    floatToI16x8<Nearest, Aligned>(s + x + 8)));
     });
-    return done;
+}
+
+// The blocks of a row, clamped on the way (see narrowFloats in the vector
+// initialisers: no status flag decides anything).  With the invalid
+// exception unmasked, where a SIMD conversion of a NaN would trap, the row
+// goes element by element.
+template <bool Nearest, bool Aligned>
+ptrdiff_t floatToU8Blocks(const float* s, uint8_t* d, ptrdiff_t n, const ConversionScope& csr) {
+    if (!csr.armed()) return 0;
+    return floatToU8Simd<Nearest, Aligned>(s, d, n);
 }
 
 // Multiplies 24 words (three 16-byte registers) by a repeating pattern of
@@ -189,8 +183,7 @@ struct RowScope {};  // the generic rule needs no state
 
 // The blocks start where the source is 16-byte aligned (when it is at least
 // float aligned).  The elements before and after them go one by one, after
-// the blocks: their comparisons flag a NaN as invalid too, which must not
-// count against the blocks.
+// the blocks.
 template <bool Nearest>
 void toU8Row(const float* s, uint8_t* d, ptrdiff_t n, [[maybe_unused]] RowScope& csr) {
     ptrdiff_t head = 0, end = 0;

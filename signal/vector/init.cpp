@@ -261,16 +261,13 @@ inline void packStore(D* d, const I4 (&r)[4]) {
 // Float sources, unscaled, 16 elements.  Ties to even come from the
 // conversion itself (round to nearest, as float sources are exact).
 //
-// Unclamped, cvtps2dq (or cvttps2dq) is right for every input it can
-// represent, and the packs saturate to D's range.  The inputs it cannot
-// represent (NaN, values outside the int32 range) raise the invalid flag,
-// and their elements are converted again clamped.
-//
-// The clamps: min(hi, x) keeps a NaN (the second operand wins), which the
+// cvtps2dq (or cvttps2dq) is right for every input it can represent, and
+// the packs saturate to D's range; the clamps before it take care of the
+// rest (NaN, values outside the int32 range): min(hi, x) keeps a NaN (the second operand wins), which the
 // conversion turns into INT_MIN and the signed packs into the lowest value;
 // max(x, 0) turns a NaN into 0 for unsigned destinations.  For 32s the
 // conversion's INT_MIN at and above 2^31 is flipped to INT_MAX.
-template <class D, bool Nearest, bool Clamp>
+template <class D, bool Nearest>
 inline void narrowFloatBlock(const float* s, D* d) {
     using namespace simd;
     using L = std::numeric_limits<D>;
@@ -278,38 +275,34 @@ inline void narrowFloatBlock(const float* s, D* d) {
     for (int k = 0; k < 4; ++k) {
         F4 x = load<F4>(s + 4 * k);
         I4 over = zero<I4>();
-        if constexpr (Clamp && sizeof(D) == 4) {
+        if constexpr (sizeof(D) == 4) {
             over = bitcast<int32_t>(ge(x, set1<F4>(2147483648.0f)));
-        } else if constexpr (Clamp) {
+        } else {
             if constexpr (!std::is_signed_v<D>) x = max(x, zero<F4>());
             x = min(set1<F4>(float(L::max())), x);
         }
         r[k] = Nearest ? toInt32(x) : toInt32Trunc(x);
-        if constexpr (Clamp && sizeof(D) == 4) r[k] = r[k] ^ over;
+        if constexpr (sizeof(D) == 4) r[k] = r[k] ^ over;
     }
     packStore(d, r);
 }
 
-template <class D, bool Nearest, bool Clamp>
-[[gnu::noinline]] void narrowFloatRun(const float* s, D* d, int n) {
-    for (int i = 0; i + 16 <= n; i += 16) narrowFloatBlock<D, Nearest, Clamp>(s + i, d + i);
+template <class D, bool Nearest>
+void narrowFloatRun(const float* s, D* d, int n) {
+    for (int i = 0; i + 16 <= n; i += 16) narrowFloatBlock<D, Nearest>(s + i, d + i);
 }
 
-// The first n elements (a multiple of 16), in runs of 1024: each run fast,
-// and again clamped if it met an input the fast form cannot take.  With the
-// invalid exception unmasked, where a SIMD conversion of such an input would
-// trap, nothing is done here and the caller's element loop does it all.
+// The first n elements (a multiple of 16), clamped on the way: the clamps
+// cost a compare or two per register, far less than the memory traffic, and
+// give every input its value without consulting the processor's status
+// flags (which tools such as valgrind do not model).  With the invalid
+// exception unmasked, where a SIMD conversion of a NaN would trap, nothing
+// is done here and the caller's element loop does it all.
 template <class D, bool Nearest>
 int narrowFloats(const float* s, D* d, int n) {
-    ConversionScope csr;
-    if (!csr.armed()) return 0;
-    for (int i = 0; i < n; i += 1024) {
-        const int m = std::min(1024, n - i);
-        csr.run([&](bool clamp) {
-            if (clamp) narrowFloatRun<D, Nearest, true>(s + i, d + i, m);
-            else narrowFloatRun<D, Nearest, false>(s + i, d + i, m);
-        });
-    }
+    ConversionScope nearestEven;
+    if (!nearestEven.armed()) return 0;
+    narrowFloatRun<D, Nearest>(s, d, n);
     return n;
 }
 
