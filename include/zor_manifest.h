@@ -557,15 +557,15 @@ ZOR_FN(ZOR_GENERIC, Status, zoriGetRotateBound,
  * there; every other destination pixel is left untouched.  Only pixels of
  * the clipped srcRoi are read: neighbours outside it are replaced by the
  * nearest edge pixel of the ROI.
- * The source point is carried with 32 fraction bits (within 2^-32 of the
+ * The source point is carried with 32 fraction bits (within 2^-31 of the
  * double value).  Interpolation:
  *   InterNearest  the pixel at floor(x + 0.5), floor(y + 0.5);
  *   InterLinear   bilinear over the 2 x 2 pixels from floor(x), floor(y);
  *   InterCubic    Catmull-Rom (a = -0.5), separable over 4 x 4 pixels.
  * Results: 8u and 16u round half up and saturate, within 1 of the exact
  * double-precision value of the definition (8u linear weighs the pixels with
- * 14-bit fractions, the point first kept 2^-14 inside the last pixel
- * interval: within 0.04 before rounding); 32f within 1e-5 of it relative
+ * 14-bit fractions, the point first kept 2^-14 inside the ROI's last pixel
+ * interval: within 0.07 before rounding); 32f within 1e-5 of it relative
  * to the largest neighbour's magnitude.  Every code variant gives the same
  * bits.
  * Checks, first failure wins, nothing written on failure: null pSrc, pDst
@@ -585,10 +585,10 @@ ZOR_FN(ZOR_GENERIC, Status, zoriGetRotateBound,
  * coefficients that map those four corners of srcRoi (clockwise from the
  * top left) to quad[0] .. quad[3].  The quad must be convex with no three
  * points on a line (the cross products of consecutive edges of one strict
- * sign; either orientation, so mirror images are fine).  Affine maps the
- * first three corners exactly; the fourth must land within 1e-9 of the
- * quad's extent (its larger side of the bounding box) of quad[3] in each
- * coordinate.  Perspective coefficients are scaled so that the denominator
+ * sign; either orientation, so mirror images are fine).  Affine takes its
+ * coefficients from the first three corners; the fourth must land within
+ * 1e-9 of the quad's extent (its larger side of the bounding box) of
+ * quad[3] in each coordinate.  Perspective coefficients are scaled so that the denominator
  * is 1 at the top-left corner.  Checks: null quad or coeffs -8, ROI
  * dimension below 1 -6, a ROI dimension of 1, a non-finite quad, a quad
  * that breaks the rules above: -5; nothing is written on failure. */

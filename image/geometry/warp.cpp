@@ -182,7 +182,9 @@ public:
         const double reach = std::max({std::fabs(a_ * x0_), std::fabs(a_ * last), std::fabs(d_ * x0_),
                                        std::fabs(d_ * last)});
         if (!(reach < kReach)) return true;  // pixel by pixel
-        table_ = static_cast<int64_t*>(mem::alignedAlloc(uint32_t(2 * (size_t(n_) + kSlack) * sizeof(int64_t))));
+        const uint64_t bytes = 2 * (uint64_t(n_) + kSlack) * sizeof(int64_t);
+        if (bytes > 0xFFFF0000u) return false;
+        table_ = static_cast<int64_t*>(mem::alignedAlloc(uint32_t(bytes)));
         if (!table_) return false;
         std::fill(table_, table_ + 2 * (n_ + kSlack), 0);
         for (int i = 0; i < n_; ++i) {
@@ -198,10 +200,10 @@ public:
     void rows(int y0, int y1, RunWriter& out) const {
         Span spans[kBand];
         for (int y = y0; y < y1; ++y) spans[y - y0] = spanOf(y, out);
-        for (int x = x0_; x < x0_ + n_; x += kTile)
+        for (int x = x0_, end = x0_ + n_; x < end; x += std::min(kTile, end - x))
             for (int y = y0; y < y1; ++y) {
                 const Span& r = spans[y - y0];
-                const int lo = std::max(r.lo, x), hi = std::min(r.hi, x + kTile);
+                const int lo = std::max(r.lo, x), hi = std::min(r.hi, x + std::min(kTile, end - x));
                 if (lo >= hi) continue;
                 const int inLo = std::clamp(r.inLo, lo, hi), inHi = std::clamp(r.inHi, inLo, hi);
                 auto clamped = [&](int from, int to) {
@@ -391,8 +393,8 @@ constexpr int kPixelBytes = int(sizeof(T)) * C;
 template <class T, int C, class Rows>
 void warpRows(const Clipped& c, const void* pSrc, int srcStep, void* pDst, int dstStep, int interpolation,
               ptrdiff_t nextRow, Rows rows) {
-    const Source src{static_cast<const uint8_t*>(pSrc) + ptrdiff_t(c.src.y) * srcStep + ptrdiff_t(c.src.x) * kPixelBytes<T, C>,
-                     srcStep, c.src.width, c.src.height, nextRow};
+    const uint8_t* origin = static_cast<const uint8_t*>(pSrc) + ptrdiff_t(c.src.y) * srcStep;
+    const Source src{origin + ptrdiff_t(c.src.x) * kPixelBytes<T, C>, srcStep, c.src.width, c.src.height, nextRow};
     const bool wide = c.src.width > 1 && c.src.height > 1;
     const bool clamps = std::is_same_v<T, uint8_t> && interpolation == InterLinear;
     RunWriter out(src, sampleRunFor<T, C>(interpolation, wide), clamps, static_cast<uint8_t*>(pDst), dstStep,
@@ -466,14 +468,10 @@ Status warpAffineImage(WarpPixels pixels, const void* pSrc, ImageSize srcSize, i
         return warpAffine<uint8_t, 1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
     case WarpPixels::u8C3:
         return warpAffine<uint8_t, 3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-    case WarpPixels::u8C4:
-        return warpAffine<uint8_t, 4>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
     case WarpPixels::u16C1:
         return warpAffine<uint16_t, 1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
     case WarpPixels::u16C3:
         return warpAffine<uint16_t, 3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-    case WarpPixels::f32C1:
-        return warpAffine<float, 1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
     case WarpPixels::f32C3:
         return warpAffine<float, 3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
     }
@@ -594,7 +592,8 @@ Status ZOR_CALL zoriGetAffineTransform(ImageRect srcRoi, const double quad[4][2]
         for (int r = 0; r < 2; ++r) lo[r] = std::min(lo[r], quad[i][r]), hi[r] = std::max(hi[r], quad[i][r]);
     const double extent = std::max(hi[0] - lo[0], hi[1] - lo[1]);
     for (int r = 0; r < 2; ++r)  // the parallelogram's fourth point
-        if (!(std::fabs(quad[0][r] + quad[2][r] - quad[1][r] - quad[3][r]) <= 1e-9 * extent)) return StatusBadArgument;
+        if (!(std::fabs(quad[0][r] + quad[2][r] - quad[1][r] - quad[3][r]) <= 1e-9 * extent))
+            return StatusBadArgument;
     const double w = srcRoi.width - 1, h = srcRoi.height - 1;
     for (int r = 0; r < 2; ++r) {
         const double cx = (quad[1][r] - quad[0][r]) / w, cy = (quad[2][r] - quad[1][r]) / h;
@@ -638,9 +637,12 @@ Status ZOR_CALL zoriGetPerspectiveTransform(ImageRect srcRoi, const double quad[
         g = cross(sx, sy, dx2, dy2) / den;
         h = cross(dx1, dy1, sx, sy) / den;
     }
-    const double m[3][3] = {{quad[1][0] - quad[0][0] + g * quad[1][0], quad[3][0] - quad[0][0] + h * quad[3][0], quad[0][0]},
-                            {quad[1][1] - quad[0][1] + g * quad[1][1], quad[3][1] - quad[0][1] + h * quad[3][1], quad[0][1]},
-                            {g, h, 1}};
+    double m[3][3] = {{0, 0, 0}, {0, 0, 0}, {g, h, 1}};
+    for (int r = 0; r < 2; ++r) {
+        m[r][0] = quad[1][r] - quad[0][r] + g * quad[1][r];
+        m[r][1] = quad[3][r] - quad[0][r] + h * quad[3][r];
+        m[r][2] = quad[0][r];
+    }
     const double x0 = srcRoi.x, y0 = srcRoi.y, w = srcRoi.width - 1, hh = srcRoi.height - 1;
     double out[3][3];
     for (int r = 0; r < 3; ++r) {
