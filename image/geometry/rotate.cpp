@@ -76,36 +76,18 @@ Status rotate(WarpPixels pixels, const void* pSrc, ImageSize srcSize, int srcSte
 
 #if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
-Status ZOR_CALL zoriRotate_8u_C1R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                  uint8_t* pDst, int dstStep, ImageRect dstRoi, double angle, double xShift,
-                                  double yShift, int interpolation) {
-    return rotate(WarpPixels::u8C1, pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, angle, xShift, yShift,
-                  interpolation);
-}
-Status ZOR_CALL zoriRotate_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                  uint8_t* pDst, int dstStep, ImageRect dstRoi, double angle, double xShift,
-                                  double yShift, int interpolation) {
-    return rotate(WarpPixels::u8C3, pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, angle, xShift, yShift,
-                  interpolation);
-}
-Status ZOR_CALL zoriRotate_16u_C1R(const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                   uint16_t* pDst, int dstStep, ImageRect dstRoi, double angle, double xShift,
-                                   double yShift, int interpolation) {
-    return rotate(WarpPixels::u16C1, pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, angle, xShift, yShift,
-                  interpolation);
-}
-Status ZOR_CALL zoriRotate_16u_C3R(const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                   uint16_t* pDst, int dstStep, ImageRect dstRoi, double angle, double xShift,
-                                   double yShift, int interpolation) {
-    return rotate(WarpPixels::u16C3, pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, angle, xShift, yShift,
-                  interpolation);
-}
-Status ZOR_CALL zoriRotate_32f_C3R(const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                   float* pDst, int dstStep, ImageRect dstRoi, double angle, double xShift,
-                                   double yShift, int interpolation) {
-    return rotate(WarpPixels::f32C3, pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, angle, xShift, yShift,
-                  interpolation);
-}
+#define ZOR_ROTATE(name, T, pixels)                                                                           \
+    Status ZOR_CALL name(const T* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, T* pDst, int dstStep,    \
+                         ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation) {      \
+        return rotate(WarpPixels::pixels, pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, angle, xShift, \
+                      yShift, interpolation);                                                                   \
+    }
+ZOR_ROTATE(zoriRotate_8u_C1R, uint8_t, u8C1)
+ZOR_ROTATE(zoriRotate_8u_C3R, uint8_t, u8C3)
+ZOR_ROTATE(zoriRotate_16u_C1R, uint16_t, u16C1)
+ZOR_ROTATE(zoriRotate_16u_C3R, uint16_t, u16C3)
+ZOR_ROTATE(zoriRotate_32f_C3R, float, f32C3)
+#undef ZOR_ROTATE
 
 Status ZOR_CALL zoriRotateCenter_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
                                         uint8_t* pDst, int dstStep, ImageRect dstRoi, double angle, double xCenter,

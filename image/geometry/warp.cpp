@@ -478,53 +478,21 @@ Status warpAffineImage(WarpPixels pixels, const void* pSrc, ImageSize srcSize, i
     return StatusBadArgument;
 }
 
-Status ZOR_CALL zoriWarpAffine_8u_C1R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                      uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][3],
-                                      int interpolation) {
-    return warpAffine<uint8_t, 1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-Status ZOR_CALL zoriWarpAffine_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                      uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][3],
-                                      int interpolation) {
-    return warpAffine<uint8_t, 3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-Status ZOR_CALL zoriWarpAffine_8u_C4R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                      uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][3],
-                                      int interpolation) {
-    return warpAffine<uint8_t, 4>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-Status ZOR_CALL zoriWarpAffine_32f_C1R(const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                       float* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][3],
-                                       int interpolation) {
-    return warpAffine<float, 1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-Status ZOR_CALL zoriWarpAffine_32f_C3R(const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                       float* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][3],
-                                       int interpolation) {
-    return warpAffine<float, 3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-
-Status ZOR_CALL zoriWarpBilinear_8u_C1R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                        uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][4],
-                                        int interpolation) {
-    return warpBilinear<1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-Status ZOR_CALL zoriWarpBilinear_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                        uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[2][4],
-                                        int interpolation) {
-    return warpBilinear<3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-
-Status ZOR_CALL zoriWarpPerspective_8u_C1R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                           uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[3][3],
-                                           int interpolation) {
-    return warpPerspective<1>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
-Status ZOR_CALL zoriWarpPerspective_8u_C3R(const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi,
-                                           uint8_t* pDst, int dstStep, ImageRect dstRoi, const double coeffs[3][3],
-                                           int interpolation) {
-    return warpPerspective<3>(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);
-}
+#define ZOR_WARP(name, T, dims, warp)                                                                         \
+    Status ZOR_CALL name(const T* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, T* pDst, int dstStep,    \
+                         ImageRect dstRoi, const double coeffs dims, int interpolation) {                        \
+        return warp(pSrc, srcSize, srcStep, srcRoi, pDst, dstStep, dstRoi, coeffs, interpolation);             \
+    }
+ZOR_WARP(zoriWarpAffine_8u_C1R, uint8_t, [2][3], (warpAffine<uint8_t, 1>))
+ZOR_WARP(zoriWarpAffine_8u_C3R, uint8_t, [2][3], (warpAffine<uint8_t, 3>))
+ZOR_WARP(zoriWarpAffine_8u_C4R, uint8_t, [2][3], (warpAffine<uint8_t, 4>))
+ZOR_WARP(zoriWarpAffine_32f_C1R, float, [2][3], (warpAffine<float, 1>))
+ZOR_WARP(zoriWarpAffine_32f_C3R, float, [2][3], (warpAffine<float, 3>))
+ZOR_WARP(zoriWarpBilinear_8u_C1R, uint8_t, [2][4], warpBilinear<1>)
+ZOR_WARP(zoriWarpBilinear_8u_C3R, uint8_t, [2][4], warpBilinear<3>)
+ZOR_WARP(zoriWarpPerspective_8u_C1R, uint8_t, [3][3], warpPerspective<1>)
+ZOR_WARP(zoriWarpPerspective_8u_C3R, uint8_t, [3][3], warpPerspective<3>)
+#undef ZOR_WARP
 
 #endif
 
