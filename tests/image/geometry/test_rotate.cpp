@@ -16,7 +16,7 @@ TEST_P(Rotate, HelpersKeepTheCentreAndBoundTheCorners) {
     for (const auto& p : cases) {
         ASSERT_EQ(z().zoriGetRotateShift(p[0], p[1], p[2], &x, &y), StatusOk);
         EXPECT_TRUE(std::isnan(p[3]) || (x == p[3] && y == p[4])) << p[2];
-        const double r = p[2] * M_PI / 180, c = std::cos(r), s = std::sin(r);  // the centre stays
+        const double r = p[2] * std::atan(1.0) / 45, c = std::cos(r), s = std::sin(r);  // (pi / 180); the centre stays
         EXPECT_NEAR(std::hypot(p[0] * c + p[1] * s + x - p[0], p[1] * c - p[0] * s + y - p[1]), 0, 1e-12);
     }
     EXPECT_TRUE(z().zoriAddRotateShift(1, 1, 180, &ax, &ay) == StatusOk && ax == 3 && ay == 4 &&

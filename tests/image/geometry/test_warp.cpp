@@ -156,7 +156,8 @@ TEST_P(Warp, AffineFollowsTheDefinition) {
         expectAll<float, 3>(bind(z().zoriWarpAffine_32f_C3R, c), affineInverse(c));
     }
     for (double angle : {0.0, 90.0, 33.0, -151.0}) {  // (x, y) -> (x c + y s + 17.25, -x s + y c + 3.5)
-        const double t = angle * M_PI / 180, c = std::cos(t), s = std::sin(t), m[2][3] = {{c, s, 17.25}, {-s, c, 3.5}};
+        const double t = angle * std::atan(1.0) / 45, c = std::cos(t), s = std::sin(t);  // (pi / 180)
+        const double m[2][3] = {{c, s, 17.25}, {-s, c, 3.5}};
         expectAll<uint16_t, 1>(bind(z().zoriRotate_16u_C1R, angle, 17.25, 3.5), affineInverse(m));
         expectAll<uint16_t, 3>(bind(z().zoriRotate_16u_C3R, angle, 17.25, 3.5), affineInverse(m));
         expectAll<uint8_t, 1>(bind(z().zoriRotate_8u_C1R, angle, 17.25, 3.5), affineInverse(m));
@@ -271,7 +272,7 @@ TEST_P(Warp, VariantsAgree) {
         const double a[2][3] = {{co, si, xs}, {-si, co, ys}};
         const double b[2][4] = {{0.002, a[0][0], a[0][1], xs}, {-0.001, a[1][0], a[1][1], ys}};
         const double p[3][3] = {{a[0][0], a[0][1], xs}, {a[1][0], a[1][1], ys}, {0.001, -0.002, 1}};
-        const double deg = t * 180 / M_PI, (*ac)[3] = a, (*bc)[4] = b, (*pc)[3] = p;
+        const double deg = t * 45 / std::atan(1.0), (*ac)[3] = a, (*bc)[4] = b, (*pc)[3] = p;
         return warpCase<uint8_t, 1>(c, bind(z.zoriWarpAffine_8u_C1R, ac)) +
                warpCase<uint8_t, 3>(c, bind(z.zoriWarpAffine_8u_C3R, ac)) +
                warpCase<uint8_t, 4>(c, bind(z.zoriWarpAffine_8u_C4R, ac)) +
