@@ -634,9 +634,138 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriResizeShift_8u_C3R, (const uint8_t* pSrc, ImageSi
 ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C1R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
 ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
 
-/* ---- image/geometry/rotate ---- */
+/* ---- image/geometry/rotate ----
+ * Rotation by an angle in degrees: the source point (x, y) (image
+ * coordinates, y downwards) goes to
+ *   x' = x c + y s + xShift,   y' = -x s + y c + yShift,
+ * with a = angle - 360 trunc(angle / 360), plus 360 when negative, and
+ * c = cos(a pi / 180), s = sin(a pi / 180); a = 0, 90, 180, 270 take the
+ * exact values (1, 0), (0, 1), (-1, 0), (0, -1), so those rotations carry
+ * no rounding error.  Rotate and RotateCenter are the affine warp of that
+ * matrix (see image/geometry/warp: pointers are image origins, the same
+ * ROIs, checks, interpolation and accuracy rules, a non-finite angle or
+ * shift is a bad coefficient: StatusBadArgument).  RotateCenter takes the
+ * point (xCenter, yCenter) that stays fixed instead of the shifts.
+ * GetRotateShift: the shifts that keep (xCenter, yCenter) fixed:
+ *   a = 0: 0, 0;  90: xc - yc, xc + yc;  180: 2 xc, 2 yc;  270: xc + yc, yc - xc;
+ *   else xShift = (xc - xc c) - yc s,  yShift = (yc - c yc) + s xc,
+ * in double; a null output: StatusNullPointer, nothing else fails.
+ * AddRotateShift adds those shifts to the values in its outputs.
+ * GetRotateBound: bound[0] = {xmin, ymin}, bound[1] = {xmax, ymax} of the
+ * mapped corners (x, y), (x + w - 1, y), (x + w - 1, y + h - 1),
+ * (x, y + h - 1) of srcRoi (not clipped to any image).  Checks: null bound
+ * -8, ROI width or height below 1 -6, a non-finite angle or shift -5;
+ * nothing is written on failure. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_16u_C1R,
+       (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_16u_C3R,
+       (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_32f_C3R,
+       (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotateCenter_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xCenter, double yCenter, int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetRotateShift,
+       (double xCenter, double yCenter, double angle, double* pxShift, double* pyShift))
+ZOR_FN(ZOR_GENERIC, Status, zoriAddRotateShift,
+       (double xCenter, double yCenter, double angle, double* pxShift, double* pyShift))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetRotateBound,
+       (ImageRect srcRoi, double bound[2][2], double angle, double xShift, double yShift))
 
-/* ---- image/geometry/warp ---- */
+/* ---- image/geometry/warp ----
+ * Warps map source image coordinates to destination image coordinates
+ * (x, y: pixel centres at whole numbers, y downwards):
+ *   Affine       x' = c00 x + c01 y + c02,          y' = c10 x + c11 y + c12
+ *   Bilinear     x' = c00 x y + c01 x + c02 y + c03, y' likewise with c1*
+ *   Perspective  x' = (c00 x + c01 y + c02) / (c20 x + c21 y + c22),
+ *                y' = (c10 x + c11 y + c12) / (c20 x + c21 y + c22)
+ * and are inverted internally.  pSrc and pDst point at pixel (0, 0) of
+ * their images; srcRoi and dstRoi are rectangles in them.  srcRoi is
+ * clipped to the srcSize image, dstRoi to x >= 0, y >= 0.  Every
+ * destination pixel of the clipped dstRoi whose source point (the inverse
+ * map in double precision) lies in the closed rectangle of the clipped
+ * srcRoi's pixel centres, [x, x + w - 1] x [y, y + h - 1], is interpolated
+ * there; every other destination pixel is left untouched.  Only pixels of
+ * the clipped srcRoi are read: neighbours outside it are replaced by the
+ * nearest edge pixel of the ROI.
+ * The source point is carried with 32 fraction bits (within 2^-31 of the
+ * double value).  Interpolation:
+ *   InterNearest  the pixel at floor(x + 0.5), floor(y + 0.5);
+ *   InterLinear   bilinear over the 2 x 2 pixels from floor(x), floor(y);
+ *   InterCubic    Catmull-Rom (a = -0.5), separable over 4 x 4 pixels.
+ * Results: 8u and 16u round half up and saturate, within 1 of the exact
+ * double-precision value of the definition (8u linear weighs the pixels with
+ * 14-bit fractions, the point first kept 2^-14 inside the ROI's last pixel
+ * interval: within 0.07 before rounding); 32f within 1e-5 of it relative
+ * to the largest neighbour's magnitude.  Every code variant gives the same
+ * bits.
+ * Checks, first failure wins, nothing written on failure: null pSrc, pDst
+ * or coefficients -8; srcSize, srcRoi or dstRoi with a dimension below 1
+ * -6; a step below 1 -14; interpolation other than 1, 2, 4 -22; bad
+ * coefficients -5: not finite, or singular (affine, perspective: zero
+ * determinant; bilinear: the Jacobian determinant, affine in x and y, not of
+ * one strict sign at the four corners of srcRoi as given, which keeps the
+ * map one-to-one on it); then srcRoi outside srcSize or dstRoi outside
+ * x >= 0, y >= 0: warning StatusWarnNoOperation (29), nothing written.
+ * Work memory that cannot be had: StatusNoMemory.
+ * GetAffineBound: bound[0] = {xmin, ymin}, bound[1] = {xmax, ymax} of the
+ * corners (x, y), (x + w - 1, y), (x + w - 1, y + h - 1), (x, y + h - 1) of
+ * srcRoi mapped by coeffs.  Checks: null -8, ROI dimension below 1 -6, bad
+ * coefficients -5 (as the warp's).
+ * GetAffineTransform, GetBilinearTransform, GetPerspectiveTransform: the
+ * coefficients that map those four corners of srcRoi (clockwise from the
+ * top left) to quad[0] .. quad[3].  The quad must be convex with no three
+ * points on a line (the cross products of consecutive edges of one strict
+ * sign; either orientation, so mirror images are fine).  Affine takes its
+ * coefficients from the first three corners; the fourth must land within
+ * 1e-9 of the quad's extent (its larger side of the bounding box) of
+ * quad[3] in each coordinate.  Perspective coefficients are scaled so that the denominator
+ * is 1 at the top-left corner.  Checks: null quad or coeffs -8, ROI
+ * dimension below 1 -6, a ROI dimension of 1, a non-finite quad, a quad
+ * that breaks the rules above: -5; nothing is written on failure. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_8u_C4R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_32f_C1R,
+       (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_32f_C3R,
+       (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetAffineBound, (ImageRect srcRoi, double bound[2][2], const double coeffs[2][3]))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetAffineTransform,
+       (ImageRect srcRoi, const double quad[4][2], double coeffs[2][3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpBilinear_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][4], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpBilinear_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][4], int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetBilinearTransform,
+       (ImageRect srcRoi, const double quad[4][2], double coeffs[2][4]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpPerspective_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[3][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpPerspective_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[3][3], int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetPerspectiveTransform,
+       (ImageRect srcRoi, const double quad[4][2], double coeffs[3][3]))
 
 /* ---- image/filter/smoothing ---- */
 
