@@ -648,6 +648,9 @@ struct Isa<16> {
     static __m128i doubleToInt32(__m128d lo, __m128d hi) {
         return _mm_unpacklo_epi64(_mm_cvtpd_epi32(lo), _mm_cvtpd_epi32(hi));
     }
+    static __m128i doubleToInt32Trunc(__m128d lo, __m128d hi) {
+        return _mm_unpacklo_epi64(_mm_cvttpd_epi32(lo), _mm_cvttpd_epi32(hi));
+    }
 #  endif  // ZOR_SIMD >= 2
 
     // Even and odd lanes of the run a0 .. a3 b0 .. b3 (float lanes).
@@ -908,6 +911,11 @@ inline Vec<double, B> toDoubleHi(Vec<int32_t, B> a) { return {Isa<B>::int32ToDou
 template <int B>
 inline Vec<int32_t, B> toInt32(Vec<double, B> lo, Vec<double, B> hi) {
     return {Isa<B>::doubleToInt32(lo.raw, hi.raw)};
+}
+// The same, rounded toward zero whatever MXCSR says.
+template <int B>
+inline Vec<int32_t, B> toInt32Trunc(Vec<double, B> lo, Vec<double, B> hi) {
+    return {Isa<B>::doubleToInt32Trunc(lo.raw, hi.raw)};
 }
 
 // Neighbouring 16-bit lanes multiplied and summed into 32-bit lanes.
