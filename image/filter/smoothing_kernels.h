@@ -151,7 +151,8 @@ void recurrence(const T* g, T* h, ptrdiff_t n, ptrdiff_t back, ptrdiff_t ahead) 
         using W = std::conditional_t<simd::kHas<T>, simd::Vec<T>, T>;
         constexpr int L = kStep<T>;
         W last[S];
-        for (int r = 0; r < S; ++r) last[r] = simd::load<W>(h + r * L);
+        if (i + back <= n)
+            for (int r = 0; r < S; ++r) last[r] = simd::load<W>(h + r * L);
         for (; i + back <= n; i += back)
             for (int r = 0; r < S; ++r) {
                 const ptrdiff_t k = i + r * L;
@@ -230,7 +231,7 @@ template <class RowDone, class... Sums>
 void slideBoxes(const uint8_t* top, int step, int rows, int maskRows, RowDone rowDone, Sums&... sums) {
     (sums.start(top, step, maskRows), ...);
     for (int y = 0; y < rows; ++y) {
-        if (y > 0) (sums.slide(rowAt(top, step, y + maskRows - 1), rowAt(top, step, y - 1)), ...);
+        if (y > 0) (sums.slide(rowAt(top, step, ptrdiff_t(y) + maskRows - 1), rowAt(top, step, y - 1)), ...);
         rowDone(y);
     }
 }
