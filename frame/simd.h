@@ -1248,6 +1248,7 @@ template <int B>
 inline Vec<int32_t, B> toInt32(Vec<double, B> lo, Vec<double, B> hi) {
     return {Isa<B>::doubleToInt32(lo.raw, hi.raw)};
 }
+// The same, rounded toward zero whatever MXCSR says.
 template <int B>
 inline Vec<int32_t, B> toInt32Trunc(Vec<double, B> lo, Vec<double, B> hi) {
     return {Isa<B>::doubleToInt32Trunc(lo.raw, hi.raw)};

@@ -767,7 +767,88 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriWarpPerspective_8u_C3R,
 ZOR_FN(ZOR_GENERIC, Status, zoriGetPerspectiveTransform,
        (ImageRect srcRoi, const double quad[4][2], double coeffs[3][3]))
 
-/* ---- image/filter/smoothing ---- */
+/* ---- image/filter/smoothing ----
+ * Fixed smoothing filters, the Wiener filter and full convolution.  The
+ * neighbourhood filters do no border handling: the caller passes the ROI
+ * inside a larger image and every source pixel a neighbourhood touches must
+ * exist.  C3 forms filter each channel on its own.
+ * Checks, in this order, first failure wins, nothing written on failure:
+ * null pointers (StatusNullPointer), ROI or image width or height below 1
+ * (StatusBadSize), a step below 1 (StatusBadStep; steps are not compared
+ * with the widths), then the function's own arguments as listed below.
+ * Every variant gives the same bytes (the same bits for floats).
+ *
+ * FilterBox_8u_C1R, _C3R: with anchor (ax, ay) the neighbourhood of ROI pixel
+ *   (x, y) is source columns x - ax .. x - ax + mW - 1 and rows y - ay ..
+ *   y - ay + mH - 1 (no flipping); dst = (sum + N / 2) / N in integers,
+ *   N = mW mH: the mean rounded half up.  mW or mH below 1:
+ *   StatusBadMaskSize; ax outside 0 .. mW - 1 or ay outside 0 .. mH - 1:
+ *   StatusBadAnchor.  Running sums: the time per pixel does not grow with
+ *   the mask.
+ * FilterGauss_8u_C1R, _C3R: mask 33 (MaskSize3x3): weights [1 2 1] x [1 2 1],
+ *   dst = (sum + 8) >> 4; mask 55: [1 4 6 4 1] x [1 4 6 4 1], dst = (sum +
+ *   128) >> 8; centred on the pixel (reads 1 or 2 pixels around the ROI);
+ *   any other mask: StatusBadMaskSize.
+ * FilterLowpass_8u_C1R: mask 33 or 55: the centred 3x3 or 5x5 box mean of
+ *   FilterBox, (sum + 4) / 9 or (sum + 12) / 25; other: StatusBadMaskSize.
+ * FilterHipass_8u_C1R: mask 33: weight 8 at the centre and -1 at the other
+ *   8 pixels; 55: 24 at the centre, -1 at the other 24; centred; the sum
+ *   saturated to 0 .. 255.  Other mask: StatusBadMaskSize.
+ * FilterWienerGetBufferSize: the bytes of pBuffer that FilterWiener needs
+ *   for that ROI size, mask and channel count (a size for more channels
+ *   covers fewer).  Null pBufferSize -8, ROI below 1 -6, a mask that
+ *   FilterWiener refuses StatusBadMaskSize, channels below 1
+ *   StatusBadChannelCount, a size beyond the int range StatusBadSize.
+ * FilterWiener_8u_C1R: over the neighbourhood of FilterBox (checked the
+ *   same way, and more than 2^18 mask pixels is StatusBadMaskSize too; then
+ *   noise[0]) with S the sum and Q the sum of squares of its N pixels and
+ *   p = src(x, y):
+ *     mean m = S / N, variance v = Q / N - m^2 = (N Q - S^2) / N^2,
+ *     noise variance n = noise[0] 255^2,
+ *     dst = m + max(v - n, 0) / max(v, n) (p - m), and m where v = n = 0,
+ *   computed in double as D = N Q - S^2 (exact), g = max(D - n N^2, 0) /
+ *   max(D, n N^2) (0 where both are 0), dst = floor((S + g (N p - S)) / N
+ *   + 0.5) clamped to 0 .. 255.  noise[0] outside [0, 1) (NaN included):
+ *   StatusBadArgument.  noise[0] = 0 asks for an estimate: n becomes the
+ *   mean of v over the ROI pixels (exact sum of D, then divided by N^2 and
+ *   the pixel count in double), noise[0] is set to (float)(n / 255^2) and
+ *   that float is used, so a second call with the returned value gives the
+ *   same image.  pBuffer: at least the FilterWienerGetBufferSize bytes (with
+ *   channels 1), any alignment.
+ * ConvFull_32f_C1R: full two-dimensional convolution, dst W x H with W =
+ *   w1 + w2 - 1, H = h1 + h2 - 1 (beyond the int range: StatusBadSize):
+ *     dst(x, y) = sum over j, i of src2(i, j) src1(x - i, y - j)
+ *   over the terms whose two pixels exist; products and sum in double,
+ *   starting from +0 and adding in order of j then i ascending, rounded once
+ *   to float.
+ * ConvFull_8u_C1R: the same sum in exact integers, dst = floor(sum /
+ *   divisor + 1/2) saturated to 0 .. 255 (so a negative divisor gives 0
+ *   everywhere); divisor 0: StatusBadDivisor. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterBox_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
+        ImagePoint anchor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterBox_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
+        ImagePoint anchor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterGauss_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterGauss_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterLowpass_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterHipass_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_GENERIC, Status, zoriFilterWienerGetBufferSize,
+       (ImageSize dstRoiSize, ImageSize maskSize, int channels, int* pBufferSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterWiener_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
+        ImagePoint anchor, float noise[1], uint8_t* pBuffer))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvFull_32f_C1R,
+       (const float* pSrc1, int src1Step, ImageSize src1Size, const float* pSrc2, int src2Step,
+        ImageSize src2Size, float* pDst, int dstStep))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvFull_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, ImageSize src1Size, const uint8_t* pSrc2, int src2Step,
+        ImageSize src2Size, uint8_t* pDst, int dstStep, int divisor))
 
 /* ---- image/pixel/arith ----
  * Pixel arithmetic, logic, threshold, compare, alpha composition and
