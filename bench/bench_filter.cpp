@@ -11,30 +11,19 @@
 #include <vector>
 
 #include "bench/pairs.h"
+#include "bench/picture.h"
 #include "zor.h"
 
 namespace {
 
 constexpr int kW = 1920, kH = 1080, kB = 3;
 
-// A deterministic picture: smooth shading, a few shapes, mild noise.
+// The test picture, with a border and its derivatives.
 struct Scene {
     cv::Mat plain;    // kW x kH
     cv::Mat padded;   // plain with a replicated border of kB pixels
     cv::Mat dx, dy;   // Sobel derivatives (16s) of plain
-    Scene() {
-        plain.create(kH, kW, CV_8UC1);
-        uint32_t r = 12345;
-        for (int y = 0; y < kH; ++y)
-            for (int x = 0; x < kW; ++x) {
-                r = r * 1664525u + 1013904223u;
-                double v = 110 + 50 * std::sin(x / 57.0) * std::cos(y / 41.0);
-                if ((x / 160 + y / 120) % 3 == 0) v += 60;
-                const double cx = x - 960.0, cy = y - 540.0;
-                if (cx * cx + cy * cy < 300.0 * 300.0) v -= 70;
-                v += double(r >> 28) - 8;
-                plain.at<uint8_t>(y, x) = cv::saturate_cast<uint8_t>(v);
-            }
+    Scene() : plain(zb::testPicture(kW, kH)) {
         cv::copyMakeBorder(plain, padded, kB, kB, kB, kB, cv::BORDER_REPLICATE);
         cv::Sobel(plain, dx, CV_16S, 1, 0, 3, 1, 0, cv::BORDER_REPLICATE);
         cv::Sobel(plain, dy, CV_16S, 0, 1, 3, 1, 0, cv::BORDER_REPLICATE);

@@ -126,7 +126,8 @@ enum {
     InterNearest = 1,
     InterLinear  = 2,
     InterCubic   = 4,
-    InterSuper   = 8
+    InterSuper   = 8,
+    InterLanczos = 16   /* resize only: 3 lobes, 6 x 6 taps */
 };
 
 /* Mask codes: tens digit is the width, units digit the height. */
@@ -170,6 +171,19 @@ typedef struct ConnectedComp {
     double    value[3];  /* newVal, 0, 0 */
     ImageRect rect;      /* bounding box of the filled pixels */
 } ConnectedComp;
+
+/* Moment state (zoriMomentInitAlloc_64f ... zoriGetSpatialMoment_64f):
+   created by zoriMomentInitAlloc_64f, filled by zoriMoments64f_32f_C1R,
+   released by zoriMomentFree_64f.  moments[c][m + 4 n] holds the moment of
+   x-order m and y-order n of channel c (m + n <= 3). */
+enum { MomentStateId = 33 };
+typedef struct MomentState {
+    int32_t id;        /* MomentStateId */
+    int32_t hint;      /* accuracy hint given at creation, kept only */
+    int32_t channels;  /* -1 until moments are computed, then 1 */
+    int32_t reserved;
+    double  moments[3][16];
+} MomentState;
 
 /* ---- Exported functions -------------------------------------------- */
 

@@ -4,9 +4,10 @@
 set -euo pipefail
 
 # libpng-dev: the zor tool's PNG files; pkgconf: the package tests;
-# chromium: the test that renders the demo gallery.
+# chromium: the test that renders the demo gallery; valgrind: the
+# conversions run under it.
 native_pkgs=(cmake make g++ ccache libgtest-dev googletest libbenchmark-dev
-             libopencv-dev libfftw3-dev libpng-dev pkgconf chromium)
+             libopencv-dev libfftw3-dev valgrind libpng-dev pkgconf chromium)
 cross_pkgs=(g++-mingw-w64-i686)
 wine_pkgs=(wine wine32:i386)
 
