@@ -10,7 +10,6 @@
 #   zor.h             the header users read: zor.h with every declaration
 #                     written out, grouped by family, each under its line from
 #                     the reference page;
-#   zor_have.h        ZOR_HAS_<name> for every export (for the tool's demo);
 #   zor_exports.inc   ZOR_EXPORT("name", "home", "one line") rows.
 # With CHECK it fails, saying what to add, when an export has no entry in its
 # family's page, an entry's arguments differ from the manifest's parameter
@@ -266,7 +265,6 @@ foreach(h IN LISTS homes)
       endif()
     endwhile()
     string(APPEND group "${line}\n")
-    string(APPEND have "#define ZOR_HAS_${name} 1\n")
     string(APPEND table "ZOR_EXPORT(\"${name}\", \"${h}\", \"${doc_${name}_c}\")\n")
   endforeach()
   if(group STREQUAL "")
@@ -294,5 +292,4 @@ math(EXPR b "${b} + 14")
 string(SUBSTRING "${header}" ${b} -1 tail)
 string(REPLACE "/*\n * zor:" "/*\n * Generated from zor.h and zor_manifest.h when zor is built: edit those.\n *\n * zor:" head "${head}")
 zor_write("${OUT}/public/zor.h" "${head}/* Grouped by family; the rules of a family open its group.  The reference\n   pages (docs/reference/<family>.md) give each export's checks in order. */\n${decls}${tail}")
-zor_write("${OUT}/zor_have.h" "${have}")
 zor_write("${OUT}/zor_exports.inc" "${table}")

@@ -4,7 +4,6 @@
 #include <cstring>
 
 #include "tools/zor/tool.h"
-#include "zor_have.h"
 
 namespace ztool {
 namespace {
@@ -21,10 +20,6 @@ bool wantsHelp(const Options& o, const char* usage, size_t positionals) {
                         std::to_string(o.positional.size()) + " (" + u.substr(0, u.find('\n')) + ")");
     }
     return false;
-}
-
-[[noreturn]] void notBuilt(const char* what, const char* export_) {
-    throw UserError(std::string(what) + " is not available: this zor does not export " + export_ + " yet");
 }
 
 int intOption(const Options& o, const char* name, int fallback, int lo, int hi) {
@@ -96,14 +91,13 @@ int cmdResize(const Args& args) {
                        : mode == "linear"  ? InterLinear
                        : mode == "cubic"   ? InterCubic
                        : mode == "super"   ? InterSuper
-                       : mode == "lanczos" ? 16
+                       : mode == "lanczos" ? InterLanczos
                                            : 0;
     if (!interp) throw UserError("--interp: unknown mode '" + mode + "' (nearest, linear, cubic, super, lanczos)");
     const int w = std::max(1, static_cast<int>(std::lround(in.width * fx)));
     const int h = std::max(1, static_cast<int>(std::lround(in.height * fy)));
     if (static_cast<double>(w) * h > 1e9)
         throw UserError("the result of " + std::to_string(w) + " x " + std::to_string(h) + " pixels is too large");
-#if ZOR_HAS_zoriResize_8u_C3R && ZOR_HAS_zoriResize_8u_C1R
     const Image src = in.channels == 1 ? in : toRgb(in);
     Image out(w, h, src.channels);
     const ImageRect roi{0, 0, src.width, src.height};
@@ -118,9 +112,6 @@ int cmdResize(const Args& args) {
     std::printf("%s: %dx%d -> %s: %dx%d (%s)\n", o.positional[0].c_str(), in.width, in.height, o.positional[1].c_str(),
                 w, h, mode.c_str());
     return 0;
-#else
-    notBuilt("resize", "zoriResize_8u_C3R");
-#endif
 }
 
 int cmdFilter(const Args& args) {
@@ -189,42 +180,21 @@ int cmdColor(const Args& args) {
         writeImage(o.positional[1], toGrey(in));
         return 0;
     }
-    // The conversions this zor exports (those of families still to land are
-    // named but absent).
     using Convert = Status(ZOR_CALL*)(const uint8_t*, int, uint8_t*, int, ImageSize);
     struct Space {
         const char* name;
         const char* call;
         Convert convert;
     };
-#define ZT_SPACE(name, fn) {name, #fn, nullptr},
-#define ZT_SPACE_HAVE(name, fn) {name, #fn, fn},
-    static const Space spaces[] = {
-#if ZOR_HAS_zoriRGBToYCbCr_8u_C3R
-        ZT_SPACE_HAVE("ycbcr", zoriRGBToYCbCr_8u_C3R)
-#else
-        ZT_SPACE("ycbcr", zoriRGBToYCbCr_8u_C3R)
-#endif
-#if ZOR_HAS_zoriRGBToHSV_8u_C3R
-            ZT_SPACE_HAVE("hsv", zoriRGBToHSV_8u_C3R)
-#else
-            ZT_SPACE("hsv", zoriRGBToHSV_8u_C3R)
-#endif
-#if ZOR_HAS_zoriRGBToHLS_8u_C3R
-                ZT_SPACE_HAVE("hls", zoriRGBToHLS_8u_C3R)
-#else
-                ZT_SPACE("hls", zoriRGBToHLS_8u_C3R)
-#endif
-    };
-#undef ZT_SPACE
-#undef ZT_SPACE_HAVE
+    static const Space spaces[] = {{"ycbcr", "zoriRGBToYCbCr_8u_C3R", zoriRGBToYCbCr_8u_C3R},
+                                   {"hsv", "zoriRGBToHSV_8u_C3R", zoriRGBToHSV_8u_C3R},
+                                   {"hls", "zoriRGBToHLS_8u_C3R", zoriRGBToHLS_8u_C3R}};
     const Space* space = nullptr;
     for (const Space& s : spaces)
         if (to == s.name) space = &s;
     if (!space)
         throw UserError(to.empty() ? "--to is required (grey, ycbcr, hsv, hls)"
                                    : "--to: unknown space '" + to + "' (grey, ycbcr, hsv, hls)");
-    if (!space->convert) notBuilt(space->name, space->call);
     const Image rgb = toRgb(in);
     Image out(in.width, in.height, 3);
     check(space->convert(rgb.px.data(), rgb.step(), out.px.data(), out.step(), rgb.size()), space->call);

@@ -9,9 +9,6 @@
 
 #include "tools/zor/demo.h"
 
-#ifndef ZOR_DEMO_SKIPPED
-#define ZOR_DEMO_SKIPPED ""
-#endif
 #ifndef ZOR_DATA_DIR
 #define ZOR_DATA_DIR "data"
 #endif
@@ -394,10 +391,6 @@ int cmdDemo(const Args& args) {
     std::vector<Step> steps = demoSteps();
     std::stable_sort(steps.begin(), steps.end(), [](const Step& a, const Step& b) { return a.order < b.order; });
     std::printf("%s\n", versionLine().c_str());
-    const std::string skipped = ZOR_DEMO_SKIPPED;
-    if (!skipped.empty())
-        std::fprintf(stderr, "zor demo: steps left out because they do not compile against zor.h: %s\n",
-                     skipped.c_str());
     std::string body;
     size_t images = 0;
     for (const Step& s : steps) {

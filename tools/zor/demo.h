@@ -1,7 +1,6 @@
 // The demo gallery: a table of steps, each of which runs one family on the
 // bundled inputs and saves what it made.  A family adds its step with one
-// ZT_DEMO_STEP in demo.cpp, or in a file of its own under tools/zor/steps/
-// that the build compiles once the exports it names are in the manifest.
+// ZT_DEMO_STEP in demo.cpp, or in a file of its own under tools/zor/steps/.
 #pragma once
 
 #include <functional>

@@ -5,7 +5,6 @@
 #include <memory>
 
 #include "tools/zor/tool.h"
-#include "zor_have.h"
 
 namespace ztool {
 namespace {
@@ -25,16 +24,7 @@ Image toGrey(const Image& img) {
     if (img.channels == 1) return img;
     const Image rgb = toRgb(img);
     Image grey(img.width, img.height, 1);
-#if ZOR_HAS_zoriRGBToGray_8u_C3C1R
     ZT_CALL(zoriRGBToGray_8u_C3C1R(rgb.px.data(), rgb.step(), grey.px.data(), grey.step(), img.size()));
-#else
-    // Until the colour family is there: the same weights (0.299, 0.587,
-    // 0.114) in 16-bit fixed point.
-    for (size_t i = 0; i < grey.px.size(); ++i) {
-        const uint8_t* p = &rgb.px[3 * i];
-        grey.px[i] = static_cast<uint8_t>((19595 * p[0] + 38470 * p[1] + 7471 * p[2] + 32768) >> 16);
-    }
-#endif
     return grey;
 }
 

@@ -1,4 +1,3 @@
-// needs: zoriRGBToYCbCr_8u_C3R zoriRGBToHSV_8u_C3R zoriHSVToRGB_8u_C3R
 // Demo step of the colour conversions: YCbCr planes, hue alone, a hue turn.
 #include "tools/zor/demo.h"
 

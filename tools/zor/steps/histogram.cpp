@@ -1,4 +1,3 @@
-// needs: zoriHistogramRange_8u_C3R
 // Demo step of the histograms: the three channels of the photograph plotted.
 #include "tools/zor/demo.h"
 

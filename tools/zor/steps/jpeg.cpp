@@ -1,4 +1,3 @@
-// needs: zoriDCTQuantFwd8x8LS_JPEG_8u16s_C1R zoriDCTQuantInv8x8LS_JPEG_16s8u_C1R zoriQuantFwdTableInit_JPEG_8u16u
 // Demo step of the JPEG primitives: the 8x8 DCT quantisation round trip of
 // the grey image at several qualities, with the PSNR of each.
 #include <algorithm>

@@ -1,4 +1,3 @@
-// needs: zoriResize_8u_C3R
 // Demo step of the resize family: one crop enlarged by each interpolation,
 // and the whole photograph shrunk by area averaging.
 #include "tools/zor/demo.h"

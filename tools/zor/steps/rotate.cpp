@@ -1,4 +1,3 @@
-// needs: zoriRotate_8u_C3R zoriGetRotateShift
 // Demo step of the rotation family: the photograph turned about its centre.
 #include "tools/zor/demo.h"
 

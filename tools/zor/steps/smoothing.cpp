@@ -1,4 +1,3 @@
-// needs: zoriFilterGauss_8u_C3R zoriFilterBox_8u_C3R
 // Demo step of the smoothing filters.
 #include "tools/zor/demo.h"
 

@@ -1,5 +1,3 @@
-// needs: zoriMean_StdDev_8u_C3CR zoriMinMax_8u_C3R
-// needs: zoriMomentInitAlloc_64f zoriMoments64f_32f_C1R zoriGetSpatialMoment_64f zoriMomentFree_64f
 // Demo step of the image statistics and moments: per-channel numbers, and
 // the centroid and main axis of the grey image drawn over it.
 #include <cmath>

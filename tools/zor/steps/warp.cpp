@@ -1,4 +1,3 @@
-// needs: zoriWarpAffine_8u_C3R zoriWarpPerspective_8u_C3R zoriGetPerspectiveTransform
 // Demo step of the warps: an affine shear and a perspective tilt.
 #include "tools/zor/demo.h"
 
