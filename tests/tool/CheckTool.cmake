@@ -22,6 +22,8 @@ set(cases
   "filter,${DATA}/chelsea.png,${OUT}/x.png|1|--op is required"
   "color,${DATA}/chelsea.png,${OUT}/x.ppm,--to,grey|1|x.ppm: PPM holds 3 channels, the image has 1"
   "edges,${DATA}/chelsea.png|1|expected 2 file names, got 1"
+  "resize,${DATA}/chelsea.png,${OUT}/x.png,--scale,0.5,--interp,bicubic|1|--interp: unknown mode 'bicubic'"
+  "color,${DATA}/chelsea.png,${OUT}/x.png,--to,lab|1|--to: unknown space 'lab'"
   "frobnicate|2|unknown command 'frobnicate'")
 foreach(c IN LISTS cases)
   string(REPLACE "|" ";" parts "${c}")
@@ -42,7 +44,9 @@ foreach(c "filter;${DATA}/chelsea.png;${OUT}/sharp.ppm;--op;sharpen"
           "edges;${DATA}/chelsea.png;${OUT}/edges.pgm;--mask;5"
           "color;${DATA}/chelsea.png;${OUT}/grey.png;--to;grey"
           "mfcc;${DATA}/speech.wav;${OUT}/mfcc.csv;--ceps;12"
-          "identify;${OUT}/sharp.ppm;${OUT}/dilated.png;${OUT}/edges.pgm;${OUT}/grey.png"
+          "resize;${DATA}/chelsea.png;${OUT}/small.png;--width;100;--interp;super"
+          "color;${DATA}/chelsea.png;${OUT}/hsv.pgm;--to;hsv"
+          "identify;${OUT}/sharp.ppm;${OUT}/dilated.png;${OUT}/edges.pgm;${OUT}/grey.png;${OUT}/hsv-1.pgm"
           "resize;--help" "info")
   execute_process(COMMAND ${ZOR} ${c} RESULT_VARIABLE rc OUTPUT_VARIABLE out ERROR_VARIABLE err)
   if(NOT rc EQUAL 0)
@@ -51,6 +55,10 @@ foreach(c "filter;${DATA}/chelsea.png;${OUT}/sharp.ppm;--op;sharpen"
 endforeach()
 if(NOT out MATCHES "variant [0-4] \\(")
   message(FATAL_ERROR "zor info does not name the variant:\n${out}")
+endif()
+execute_process(COMMAND ${ZOR} identify ${OUT}/small.png OUTPUT_VARIABLE small)
+if(NOT small MATCHES "small.png: 100x67, 3 channels")
+  message(FATAL_ERROR "resize --width 100 of a 451 x 300 image: ${small}")
 endif()
 file(STRINGS ${OUT}/mfcc.csv rows)
 list(LENGTH rows frames)
