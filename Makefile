@@ -29,8 +29,10 @@ win: setup build-win/CMakeCache.txt
 	$(CMAKE) --build build-win -j $(JOBS)
 
 # The gallery: every family on the bundled photograph and speech clip,
-# written to build/gallery/ (open index.html).
-demo: native
+# written to build/gallery/ (open index.html).  Builds only the library and
+# the tool.
+demo: setup build/CMakeCache.txt
+	$(CMAKE) --build build -j $(JOBS) --target zor_tool
 	./build/tools/zor demo --out build/gallery
 
 test-native: native
