@@ -54,6 +54,10 @@ endif()
 if(NOT log MATCHES "image back within ([0-9.e-]+) " OR CMAKE_MATCH_1 GREATER 0.01)
   message(FATAL_ERROR "the image DFT round trip is off")
 endif()
+# A synthetic male voice: most of its voiced frames near 100 Hz.
+if(NOT log MATCHES "frames voiced, mean pitch ([0-9]+) Hz" OR CMAKE_MATCH_1 LESS 70 OR CMAKE_MATCH_1 GREATER 200)
+  message(FATAL_ERROR "the pitch of the speech clip is off: ${CMAKE_MATCH_1} Hz")
+endif()
 if(log MATCHES "quality")  # the JPEG step: PSNR rises with the quality
   string(REGEX MATCHALL "quality [0-9]+: PSNR [0-9.]+" q "${log}")
   set(last 0)
