@@ -16,7 +16,8 @@
  * No include guard: the file is included once per expansion.
  */
 
-/* ---- frame: aligned allocation and version records ---------------- */
+/* ---- frame/alloc-version ----
+ * Aligned allocation and version records. */
 
 ZOR_FN(ZOR_GENERIC, uint8_t*,    zorsMalloc_8u,   (int len))
 ZOR_FN(ZOR_GENERIC, int8_t*,     zorsMalloc_8s,   (int len))
