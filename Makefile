@@ -6,7 +6,7 @@
 JOBS ?= $(shell nproc 2>/dev/null || echo 2)
 CMAKE ?= cmake
 
-.PHONY: all setup native asan win demo test test-native test-asan test-win bench dist clean
+.PHONY: all setup native asan win demo test test-native test-asan test-win bench bench-win dist clean
 
 all: native
 
@@ -57,6 +57,14 @@ bench: native
 # zip (DLL, import library, .def, header, README) from build-win/.
 dist: native win
 	$(CMAKE) -DNATIVE=build -DWIN=build-win -DSOURCE=. -DOUT=dist -P cmake/Dist.cmake
+
+# zor alone on the same workloads, as the x86-64 library and as the 32-bit
+# DLL under wine, side by side with the ratio DLL / x86-64.
+# BENCH_VARIANTS=4,1,0 adds the DLL's x87 variants; see scripts/bench-win.sh.
+bench-win: setup build/CMakeCache.txt build-win/CMakeCache.txt
+	$(CMAKE) --build build -j $(JOBS) --target zor_variant_bench
+	$(CMAKE) --build build-win -j $(JOBS) --target zor_variant_bench
+	bash scripts/bench-win.sh
 
 clean:
 	rm -rf build build-asan build-win dist

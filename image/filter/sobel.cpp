@@ -155,51 +155,54 @@ using AccOf = std::conditional_t<sizeof(In) == 1, int16_t, float>;
 #if ZOR_SIMD >= 2
 // 3x3 on 8u sources in a single pass over three source rows, 16 pixels (a
 // 16-byte register widened into two) at a time.  The sums are exact in 16
-// bits, so this equals the two passes.
-template <class Out>
-void sobel3Direct(const uint8_t* src, int srcStep, Out* dst, int dstStep, ImageSize roi, Dir dir) {
+// bits, so this equals the two passes.  The low eight pixels are finished
+// before the high eight are begun (the loads are repeated), which keeps the
+// working set within the eight registers of the 32-bit build; the direction
+// is fixed at compile time and the loop gets a register allocation of its own.
+template <Dir D, class Out>
+[[gnu::noinline]] void sobel3Direct(const uint8_t* src, int srcStep, Out* dst, int dstStep, ImageSize roi) {
     using namespace simd;
     using B = Vec<uint8_t, 16>;
     using V = Vec<int16_t, 16>;
-    struct Halves {
-        V lo, hi;
-    };
-    const auto widened = [](const uint8_t* p) {
+    using Lo = std::false_type;
+    using Hi = std::true_type;
+    const auto widened = [](const uint8_t* p, auto half) -> V {
         const B v = load<B>(p);
-        return Halves{bitcast<int16_t>(widenLo(v)), bitcast<int16_t>(widenHi(v))};
+        if constexpr (decltype(half)::value) return bitcast<int16_t>(widenHi(v));
+        else return bitcast<int16_t>(widenLo(v));
     };
     const int w = roi.width;
+    // Rows above and below as offsets from the middle row: one pointer
+    // serves all three (registers are scarce in the 32-bit build).
+    const ptrdiff_t up = -ptrdiff_t(srcStep), down = srcStep;
     for (int y = 0; y < roi.height; ++y) {
-        const uint8_t* p0 = rowAt(src, srcStep, y - 1);
         const uint8_t* p1 = rowAt(src, srcStep, y);
-        const uint8_t* p2 = rowAt(src, srcStep, y + 1);
         Out* d = rowAt(dst, dstStep, y);
-        for (int x0 = 0; x0 < w; x0 += 16) {
-            const int x = x0 + 16 <= w ? x0 : w - 16;  // the last block overlaps
-            Halves out;
-            if (dir == Dir::Vert) {
+        // One half of the 16 results at column x.
+        const auto sobel = [&](int x, auto half) -> V {
+            const uint8_t* c = p1 + x;
+            if constexpr (D == Dir::Vert) {
                 // smooth down the columns x - 1 and x + 1, then left minus right
-                Halves s[2];
-                for (int k = 0; k < 2; ++k) {
-                    const int off = x - 1 + 2 * k;
-                    const Halves a = widened(p0 + off), b = widened(p1 + off), c = widened(p2 + off);
-                    s[k] = {(a.lo + c.lo) + (b.lo + b.lo), (a.hi + c.hi) + (b.hi + b.hi)};
-                }
-                out = {s[0].lo - s[1].lo, s[0].hi - s[1].hi};
+                const auto smooth = [&](int off) {
+                    const V b = widened(c + off, half);
+                    return (widened(c + up + off, half) + widened(c + down + off, half)) + (b + b);
+                };
+                return smooth(-1) - smooth(1);
             } else {
                 // bottom minus top in columns x - 1, x, x + 1, then smoothed along the row
-                Halves dv[3];
-                for (int k = 0; k < 3; ++k) {
-                    const Halves a = widened(p0 + x - 1 + k), c = widened(p2 + x - 1 + k);
-                    dv[k] = {c.lo - a.lo, c.hi - a.hi};
-                }
-                out = {(dv[0].lo + dv[2].lo) + (dv[1].lo + dv[1].lo), (dv[0].hi + dv[2].hi) + (dv[1].hi + dv[1].hi)};
+                const auto dv = [&](int off) { return widened(c + down + off, half) - widened(c + up + off, half); };
+                const V mid = dv(0);
+                return (dv(-1) + dv(1)) + (mid + mid);
             }
+        };
+        for (int x0 = 0; x0 < w; x0 += 16) {
+            const int x = x0 + 16 <= w ? x0 : w - 16;  // the last block overlaps
             if constexpr (sizeof(Out) == 1) {
-                store(d + x, narrowSat<uint8_t>(out.lo, out.hi));
+                const V lo = sobel(x, Lo{});
+                store(d + x, narrowSat<uint8_t>(lo, sobel(x, Hi{})));
             } else {
-                store(d + x, out.lo);
-                store(d + x + 8, out.hi);
+                store(d + x, sobel(x, Lo{}));
+                store(d + x + 8, sobel(x, Hi{}));
             }
         }
     }
@@ -214,7 +217,8 @@ Status sobelPlain(const In* src, int srcStep, Out* dst, int dstStep, ImageSize r
 #if ZOR_SIMD >= 2
     if constexpr (sizeof(In) == 1) {
         if (size == 3 && roi.width >= 16) {
-            sobel3Direct(src, srcStep, dst, dstStep, roi, dir);
+            if (dir == Dir::Vert) sobel3Direct<Dir::Vert>(src, srcStep, dst, dstStep, roi);
+            else sobel3Direct<Dir::Horiz>(src, srcStep, dst, dstStep, roi);
             return StatusOk;
         }
     }

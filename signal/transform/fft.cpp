@@ -161,47 +161,49 @@ inline void cmul(V ar, V ai, V wr, V wi, V& rr, V& ri) {
 // Input quad c .. c+3 of four streams q apart: lane l is element c + l of
 // the subsequences x[b], x[b + q], x[b + 2q], x[b + 3q].
 struct SplitInput {
-    const float* re;
-    const float* im;
-    void get(int i, V& r, V& m) const {
-        r = load<V>(re + i);
-        m = load<V>(im + i);
-    }
+    const float* r;
+    const float* m;
+    V re(int i) const { return load<V>(r + i); }
+    V im(int i) const { return load<V>(m + i); }
 };
 // Complex values packed as re, im pairs (the real transform's input).
 struct PairInput {
     const float* p;
-    void get(int i, V& r, V& m) const {
-        const V a = load<V>(p + 2 * i), b = load<V>(p + 2 * i + 4);
-        r = concatEven(a, b);
-        m = concatOdd(a, b);
-    }
+    V re(int i) const { return concatEven(load<V>(p + 2 * i), load<V>(p + 2 * i + 4)); }
+    V im(int i) const { return concatOdd(load<V>(p + 2 * i), load<V>(p + 2 * i + 4)); }
 };
 
 // Bit-reversed gather fused with the 4-point transforms: the transform of
-// subsequence b lands at 4 * rev[b] of the work arrays.
+// subsequence b lands at 4 * rev[b] of the work arrays.  The real parts are
+// done first, then the imaginary ones: each half needs only one difference
+// from the other, which keeps the working set within eight registers (the
+// 32-bit build has no more).
 template <class In>
 void firstPass(const In& in, float* wr, float* wi, int n, const int32_t* rev) {
     const int q = n >> 2;
     for (int c = 0; c < q; c += 4) {
-        V g0r, g0i, g1r, g1i, g2r, g2i, g3r, g3i;
-        in.get(c, g0r, g0i);
-        in.get(c + q, g1r, g1i);
-        in.get(c + 2 * q, g2r, g2i);
-        in.get(c + 3 * q, g3r, g3i);
-        const V s02r = g0r + g2r, s02i = g0i + g2i, d02r = g0r - g2r, d02i = g0i - g2i;
-        const V s13r = g1r + g3r, s13i = g1i + g3i, d13r = g1r - g3r, d13i = g1i - g3i;
-        V y0r = s02r + s13r, y0i = s02i + s13i;
-        V y1r = d02r + d13i, y1i = d02i - d13r;  // d02 - i d13
-        V y2r = s02r - s13r, y2i = s02i - s13i;
-        V y3r = d02r - d13i, y3i = d02i + d13r;  // d02 + i d13
-        transpose4(y0r, y1r, y2r, y3r);
-        transpose4(y0i, y1i, y2i, y3i);
-        const int j0 = 4 * rev[c], j1 = 4 * rev[c + 1], j2 = 4 * rev[c + 2], j3 = 4 * rev[c + 3];
-        store(wr + j0, y0r); store(wi + j0, y0i);
-        store(wr + j1, y1r); store(wi + j1, y1i);
-        store(wr + j2, y2r); store(wi + j2, y2i);
-        store(wr + j3, y3r); store(wi + j3, y3i);
+        {
+            const V d13i = in.im(c + q) - in.im(c + 3 * q);
+            const V g0 = in.re(c), g1 = in.re(c + q), g2 = in.re(c + 2 * q), g3 = in.re(c + 3 * q);
+            const V s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
+            V y0 = s02 + s13, y1 = d02 + d13i, y2 = s02 - s13, y3 = d02 - d13i;  // y1 = d02 - i d13
+            transpose4(y0, y1, y2, y3);
+            store(wr + 4 * rev[c], y0);
+            store(wr + 4 * rev[c + 1], y1);
+            store(wr + 4 * rev[c + 2], y2);
+            store(wr + 4 * rev[c + 3], y3);
+        }
+        {
+            const V d13r = in.re(c + q) - in.re(c + 3 * q);
+            const V g0 = in.im(c), g1 = in.im(c + q), g2 = in.im(c + 2 * q), g3 = in.im(c + 3 * q);
+            const V s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
+            V y0 = s02 + s13, y1 = d02 - d13r, y2 = s02 - s13, y3 = d02 + d13r;
+            transpose4(y0, y1, y2, y3);
+            store(wi + 4 * rev[c], y0);
+            store(wi + 4 * rev[c + 1], y1);
+            store(wi + 4 * rev[c + 2], y2);
+            store(wi + 4 * rev[c + 3], y3);
+        }
     }
 }
 
@@ -219,21 +221,28 @@ void radix2Pass(const float* ir, const float* ii, float* orr, float* oi, int n, 
 
 // One radix-4 butterfly on lanes p0 .. p0+3 of the four quarters L apart.
 // In bit-reversed order the sub-transform of the odd quarter (residue 1)
-// sits at offset 2L and that of residue 2 at offset L.
+// sits at offset 2L and that of residue 2 at offset L.  The order of the
+// steps keeps at most eight vectors live: t1 and t3 are combined at once,
+// then the real outputs leave before the imaginary inputs come in.
 inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, int p0, int L,
                        V w1r, V w1i, V w2r, V w2i, V w3r, V w3i) {
     const int p1 = p0 + L, p2 = p1 + L, p3 = p2 + L;
-    const V a0r = load<V>(ir + p0), a0i = load<V>(ii + p0);
-    V t1r, t1i, t2r, t2i, t3r, t3i;
+    V t1r, t1i, t3r, t3i, t2r, t2i;
     cmul(load<V>(ir + p2), load<V>(ii + p2), w1r, w1i, t1r, t1i);
-    cmul(load<V>(ir + p1), load<V>(ii + p1), w2r, w2i, t2r, t2i);
     cmul(load<V>(ir + p3), load<V>(ii + p3), w3r, w3i, t3r, t3i);
-    const V s02r = a0r + t2r, s02i = a0i + t2i, d02r = a0r - t2r, d02i = a0i - t2i;
     const V s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
-    store(orr + p0, s02r + s13r); store(oi + p0, s02i + s13i);
-    store(orr + p2, s02r - s13r); store(oi + p2, s02i - s13i);
-    store(orr + p1, d02r + d13i); store(oi + p1, d02i - d13r);
-    store(orr + p3, d02r - d13i); store(oi + p3, d02i + d13r);
+    cmul(load<V>(ir + p1), load<V>(ii + p1), w2r, w2i, t2r, t2i);
+    const V a0r = load<V>(ir + p0), a0i = load<V>(ii + p0);
+    const V s02r = a0r + t2r, d02r = a0r - t2r;
+    store(orr + p0, s02r + s13r);
+    store(orr + p2, s02r - s13r);
+    store(orr + p1, d02r + d13i);
+    store(orr + p3, d02r - d13i);
+    const V s02i = a0i + t2i, d02i = a0i - t2i;
+    store(oi + p0, s02i + s13i);
+    store(oi + p2, s02i - s13i);
+    store(oi + p1, d02i - d13r);
+    store(oi + p3, d02i + d13r);
 }
 
 // Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds, per
