@@ -8,10 +8,13 @@
  * no other list of exports is kept anywhere.
  *
  * map names the code variant whose entry fills each of the five dispatch
- * columns (generic, SSE, SSE2, SSE3, SSSE3):
+ * columns (generic, SSE, SSE2, SSE3, SSSE3), and on x86-64 the two wide
+ * columns (AVX2, AVX-512; frame/columns.h):
  *   ZOR_ALL      each variant has its own entry
  *   ZOR_GENERIC  the generic entry serves every processor
  *   ZOR_SSE2UP   generic entry for the generic and SSE columns
+ *   ZOR_WIDE, ZOR_SSE2UP_WIDE  the same, with entries of their own in the
+ *                wide columns (the family is compiled for them)
  *
  * No include guard: the file is included once per expansion.
  */
@@ -317,11 +320,11 @@ ZOR_FN(ZOR_SSE2UP,  Status, zorsLn_32f_I,         (float* pSrcDst, int len))
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_32f_I,  (float* pSrcDst, int len, float level, int relOp))
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_LTVal_32f,   (const float* pSrc, float* pDst, int len, float level, float value))
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_LTVal_32f_I, (float* pSrcDst, int len, float level, float value))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsNormalize_32f,    (const float* pSrc, float* pDst, int len, float vSub, float vDiv))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsMagnitude_32f,    (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNormalize_32f,    (const float* pSrc, float* pDst, int len, float vSub, float vDiv))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsMagnitude_32f,    (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsMagnitude_32fc,   (const Complex32f* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsPhase_32f,        (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsPowerSpectr_32f,  (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsPowerSpectr_32f,  (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsAtan2_32f_A21,    (const float* pSrc1, const float* pSrc2, float* pDst, int len))
 ZOR_FN(ZOR_GENERIC, Status, zorsSortDescend_32f_I, (float* pSrcDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsDeinterleave_16s, (const int16_t* pSrc, int channels, int len, int16_t** pDst))
