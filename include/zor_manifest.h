@@ -322,7 +322,7 @@ ZOR_FN(ZOR_ALL,     Status, zorsThreshold_LTVal_32f,   (const float* pSrc, float
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_LTVal_32f_I, (float* pSrcDst, int len, float level, float value))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNormalize_32f,    (const float* pSrc, float* pDst, int len, float vSub, float vDiv))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsMagnitude_32f,    (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsMagnitude_32fc,   (const Complex32f* pSrc, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsMagnitude_32fc,  (const Complex32f* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsPhase_32f,        (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsPowerSpectr_32f,  (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsAtan2_32f_A21,    (const float* pSrc1, const float* pSrc2, float* pDst, int len))
