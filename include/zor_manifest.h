@@ -97,7 +97,7 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_AC4C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_AC4C3R,
        (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3P3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriCopy_8u_C3P3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C3P3R,
        (const int16_t* pSrc, int srcStep, int16_t* const pDst[3], int dstStep, ImageSize roiSize))
@@ -105,7 +105,7 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C4P4R,
        (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[4], int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C4P4R,
        (const int16_t* pSrc, int srcStep, int16_t* const pDst[4], int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_P3C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriCopy_8u_P3C3R,
        (const uint8_t* const pSrc[3], int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_P3C3R,
        (const int16_t* const pSrc[3], int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
