@@ -3,6 +3,7 @@
 #include <stdio.h>
 
 #include "zor.h"
+#include "zor_ext.h"
 
 int zorDemoProcessorType(void);
 int zorDemoSelectedVariant(void);
@@ -22,6 +23,9 @@ int main(void) {
     printVersion("image", i);
     printf("processor-type code %d, selected variant %d (%s)\n", zorDemoProcessorType(), variant,
            variant >= 0 && variant <= 4 ? names[variant] : "?");
+#if defined(__x86_64__)
+    printf("register width bound: %d bits (ZOR_MAX_WIDTH caps it)\n", zorGetBoundWidth());
+#endif
 
     /* A round trip through the allocator: 32-byte aligned rows. */
     {
