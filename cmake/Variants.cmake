@@ -1,5 +1,9 @@
 # Code variants: every family source is compiled once per variant, with that
 # variant's instruction-set flags and -DZOR_VARIANT=k, into namespace zor::vK.
+# The x86-64 build has two wide columns more, 5 (AVX2 with FMA, 32-byte
+# registers) and 6 (AVX-512 F/BW/DQ/VL, 64-byte registers), compiled only
+# for the families listed as wide (zor_add_family(<source> WIDE)); the
+# exports they serve have a wide map in the manifest (frame/columns.h).
 
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "^(i.86|x86)$" OR CMAKE_SIZEOF_VOID_P EQUAL 4)
   set(ZOR_32BIT ON)
@@ -34,15 +38,30 @@ else()
   set(ZOR_VARIANT_FLAGS_2 -mno-sse3 -mno-ssse3)
   set(ZOR_VARIANT_FLAGS_3 -msse3 -mno-ssse3)
   set(ZOR_VARIANT_FLAGS_4 -mssse3)
+  set(ZOR_VARIANT_FLAGS_5 -mavx2 -mfma)
+  set(ZOR_VARIANT_FLAGS_6 -mavx2 -mfma -mavx512f -mavx512bw -mavx512dq -mavx512vl)
+endif()
+# The highest column this build has.
+if(ZOR_32BIT)
+  set(ZOR_LAST_VARIANT 4)
+else()
+  set(ZOR_LAST_VARIANT 6)
 endif()
 
-add_compile_options(${ZOR_BASE_FLAGS})
+# A fused multiply-add rounds once where the source rounds twice: never let
+# the compiler contract (the wide columns have the instruction).
+add_compile_options(${ZOR_BASE_FLAGS} -ffp-contract=off)
 
 
-# zor_add_family(<source>): compile <source> once per variant.
+# zor_add_family(<source> [WIDE]): compile <source> once per variant, and
+# for the wide columns too where WIDE is given and the build has them.
 function(zor_add_family src)
   string(REGEX REPLACE "[/.-]" "_" base "${src}")
-  foreach(k RANGE 0 4)
+  set(last 4)
+  if("WIDE" IN_LIST ARGN)
+    set(last ${ZOR_LAST_VARIANT})
+  endif()
+  foreach(k RANGE 0 ${last})
     set(t zf_${base}_v${k})
     add_library(${t} OBJECT ${src})
     target_include_directories(${t} PRIVATE ${CMAKE_SOURCE_DIR}/include ${CMAKE_SOURCE_DIR})
@@ -56,7 +75,7 @@ endfunction()
 # Writes generated/variant<k>.objects: the object files of variant k, one a
 # line, for the isolation check.
 function(zor_write_variant_object_lists dir)
-  foreach(k RANGE 0 4)
+  foreach(k RANGE 0 ${ZOR_LAST_VARIANT})
     get_property(objs GLOBAL PROPERTY ZOR_VARIANT_OBJECTS_${k})
     list(JOIN objs "\n" content)
     file(GENERATE OUTPUT ${dir}/variant${k}.objects CONTENT "${content}\n")

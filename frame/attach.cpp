@@ -17,6 +17,7 @@ namespace zor { namespace frame {
 uint16_t productTable[256 * 256];
 int32_t altSuperSampling = 0;
 int boundVariant = -1;
+int boundWidth = 0;
 
 namespace {
 char messageBuffer[256];
@@ -71,6 +72,10 @@ int processAttach(const char* modulePath, dispatch::FailureReport report) {
                                 messageBuffer, &bound))
         return 0;
     boundVariant = bound;
+    // The wide columns assume everything of the SSSE3 one.
+    const int width = bound == 4 ? cpu::usableWidth() : 128;
+    const int cap = dispatch::widthCap(std::getenv("ZOR_MAX_WIDTH"));
+    boundWidth = dispatch::overlayWide(dispatch::libraryTable(), width < cap ? width : cap);
     if (!buildProductTable()) return 0;
     (void)probeMarkerFile(modulePath);
     return 1;

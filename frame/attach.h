@@ -15,6 +15,9 @@ extern uint16_t productTable[256 * 256];
 extern int32_t altSuperSampling;
 // The variant whose entries the slots hold (-1 before binding).
 extern int boundVariant;
+// The register width in bits of the entries bound: 128, or on x86-64 256 or
+// 512 where wide entries were overlaid (0 before binding).
+extern int boundWidth;
 
 bool buildProductTable();
 

@@ -144,4 +144,29 @@ CpuidRecords readCpuid() {
 
 int processorType() { return processorType(readCpuid()); }
 
+int usableWidth(const Regs& leaf1, const Regs& leaf7, uint64_t xcr0) {
+    const bool osxsave = bit(leaf1.ecx, 27), avx = bit(leaf1.ecx, 28), fma = bit(leaf1.ecx, 12);
+    const bool avxState = (xcr0 & 0x6) == 0x6;        // XMM and YMM state
+    const bool zmmState = (xcr0 & 0xE6) == 0xE6;      // and opmask, ZMM0-15 upper, ZMM16-31
+    if (!osxsave || !avx || !fma || !avxState || !bit(leaf7.ebx, 5)) return 128;  // AVX2
+    const bool avx512 = bit(leaf7.ebx, 16) && bit(leaf7.ebx, 17) && bit(leaf7.ebx, 30) && bit(leaf7.ebx, 31);
+    return avx512 && zmmState ? 512 : 256;
+}
+
+int usableWidth() {
+#if defined(__GNUC__) && (defined(__x86_64__) || defined(__i386__))
+    if (!cpuidAvailable() || cpuid(0).eax < 7) return 128;
+    const Regs l1 = cpuid(1), l7 = cpuid(7, 0);
+    uint64_t xcr0 = 0;
+    if (bit(l1.ecx, 27)) {
+        uint32_t lo, hi;
+        __asm__ volatile("xgetbv" : "=a"(lo), "=d"(hi) : "c"(0));
+        xcr0 = (uint64_t(hi) << 32) | lo;
+    }
+    return usableWidth(l1, l7, xcr0);
+#else
+    return 128;
+#endif
+}
+
 }}  // namespace zor::cpu

@@ -65,4 +65,14 @@ Regs cpuid(uint32_t leaf, uint32_t subleaf = 0);
 CpuidRecords readCpuid();
 int processorType();   // processorType(readCpuid())
 
+// ---- register widths beyond the five variants (x86-64) ------------------------
+// The widest registers the processor has and the operating system saves,
+// in bits: 512 for AVX-512 F, BW, DQ and VL with the opmask and upper
+// register state enabled in XCR0, 256 for AVX2 with FMA and the AVX state
+// enabled, else 128.  From cpuid leaf 1, leaf 7 (sub-leaf 0) and XCR0 (0
+// when leaf 1 reports no OSXSAVE).
+int usableWidth(const Regs& leaf1, const Regs& leaf7, uint64_t xcr0);
+// The live processor.
+int usableWidth();
+
 }}  // namespace zor::cpu

@@ -82,4 +82,26 @@ int initDispatch(const Table& t, const Selector& s, FailureReport report,
     return 0;
 }
 
+int widthCap(const char* env) {
+    if (env && std::strcmp(env, "128") == 0) return 128;
+    if (env && std::strcmp(env, "256") == 0) return 256;
+    return 512;
+}
+
+int wideColumn(int widthBits) {
+    if (widthBits >= 512 && kColumns > 6) return 6;
+    if (widthBits >= 256 && kColumns > 5) return 5;
+    return -1;
+}
+
+int overlayWide(const Table& t, int widthBits) {
+    const int k = wideColumn(widthBits);
+    if (k < 0) return 128;
+    for (int32_t i = 0; i < t.count; ++i) {
+        const Row& r = t.rows[i];
+        if (r.entry[k] && r.entry[k] != r.entry[4]) *r.slot = r.entry[k];
+    }
+    return k == 6 ? 512 : 256;
+}
+
 }}  // namespace zor::dispatch

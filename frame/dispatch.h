@@ -2,8 +2,11 @@
 //
 // Every export is a stub that jumps through its slot.  The dispatch table has
 // one row per export: the slot's address and the entries of the five code
-// variants.  At load the frame selects a variant for the processor and copies
-// that column into the slots, trying lower variants when a column has a gap.
+// variants (seven on x86-64, with the two wide columns).  At load the frame
+// selects a variant for the processor and copies that column into the slots,
+// trying lower variants when a column has a gap; on x86-64 it then overlays
+// the slots of the exports that have a wide entry, as far as the processor,
+// the operating system and ZOR_MAX_WIDTH allow.
 #pragma once
 
 #include <cstdint>
@@ -15,9 +18,15 @@ namespace zor { namespace dispatch {
 
 using Entry = void (*)();
 
+#if defined(__x86_64__)
+constexpr int kColumns = 7;
+#else
+constexpr int kColumns = 5;
+#endif
+
 struct Row {
     Entry* slot;
-    Entry entry[5];
+    Entry entry[kColumns];
 };
 
 struct Table {
@@ -67,5 +76,21 @@ extern const char kFailureText[];
 // report and returns 0.
 int initDispatch(const Table& t, const Selector& s, FailureReport report,
                  char (&msg)[256], int* bound);
+
+// ---- the wide columns (x86-64) --------------------------------------------------
+
+// The register width in bits that ZOR_MAX_WIDTH ("128", "256" or "512")
+// allows; 512 when it is unset, and for anything else.
+int widthCap(const char* env);
+
+// The column of the entries for a register width (5 for 256, 6 for 512),
+// -1 for 128.
+int wideColumn(int widthBits);
+
+// Copies the wide entries of the column for widthBits (each row whose entry
+// there differs from its SSSE3 entry) over the bound slots; the other slots
+// keep the five-variant binding.  Returns the width bound: 128 when there
+// is no such column.
+int overlayWide(const Table& t, int widthBits);
 
 }}  // namespace zor::dispatch

@@ -15,6 +15,12 @@
 #include "frame/entries.h"
 #define ZOR_ENTRY_NS v4
 #include "frame/entries.h"
+#if defined(__x86_64__)
+#  define ZOR_ENTRY_NS v5
+#  include "frame/entries.h"
+#  define ZOR_ENTRY_NS v6
+#  include "frame/entries.h"
+#endif
 
 using zor::dispatch::Entry;
 
@@ -34,14 +40,19 @@ extern "C" {
 #include "frame/columns.h"
 
 #define ZOR_COL_(k, name) reinterpret_cast<Entry>(&zor::v##k::name)
-#define ZOR_ROW_(m0, m1, m2, m3, m4, name)                                       \
+#if defined(__x86_64__)
+#  define ZOR_WIDE_COLS_(m5, m6, name) , ZOR_COL_(m5, name), ZOR_COL_(m6, name)
+#else
+#  define ZOR_WIDE_COLS_(m5, m6, name)  // five columns
+#endif
+#define ZOR_ROW_(m0, m1, m2, m3, m4, m5, m6, name)                               \
     {&zor_slot_##name,                                                           \
      {ZOR_COL_(m0, name), ZOR_COL_(m1, name), ZOR_COL_(m2, name), ZOR_COL_(m3, name), \
-      ZOR_COL_(m4, name)}},
+      ZOR_COL_(m4, name) ZOR_WIDE_COLS_(m5, m6, name)}},
 
 namespace {
 const zor::dispatch::Row kRows[] = {
-// (map is already expanded to five column digits when ZOR_ROW_ is rescanned)
+// (map is already expanded to seven column digits when ZOR_ROW_ is rescanned)
 #define ZOR_FN(map, ret, name, params) ZOR_ROW_(map, name)
 #include "zor_manifest.h"
 #undef ZOR_FN

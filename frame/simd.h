@@ -5,8 +5,10 @@
 // operations are free functions (and the arithmetic and bitwise operators)
 // over Vec<T, Bytes>; each forwards to Isa<Bytes>, the one place that spells
 // instructions.  A kernel written against the vocabulary names no width, so
-// it compiles for every width that has an Isa: today the 16-byte (SSE)
-// registers, later wider ones, with no second copy of the kernel.
+// it compiles for every width that has an Isa: the 16-byte (SSE) registers
+// of the five variants, and in the wide columns of the x86-64 build the
+// 32-byte (AVX2) and 64-byte (AVX-512) ones (ZOR_WIDTH), with no second copy
+// of the kernel.
 //
 //     using V = simd::Vec<int16_t>;
 //     for (; i + V::kLanes <= n; i += V::kLanes)
@@ -170,7 +172,7 @@ struct RawOf {  // no register of this lane type at this width
 };
 
 #if ZOR_SIMD >= 1
-constexpr int kNativeBytes = 16;
+constexpr int kNativeBytes = ZOR_WIDTH;
 template <>
 struct RawOf<float, 16> {
     using type = __m128;
@@ -188,6 +190,41 @@ struct RawOf<double, 16> {
 template <class T>
 struct RawOf<T, 16, std::enable_if_t<std::is_integral_v<T> && !std::is_same_v<T, bool>>> {
     using type = __m128i;
+    static constexpr bool kExists = true;
+};
+#endif
+
+#if ZOR_WIDTH >= 32
+template <>
+struct RawOf<float, 32> {
+    using type = __m256;
+    static constexpr bool kExists = true;
+};
+template <>
+struct RawOf<double, 32> {
+    using type = __m256d;
+    static constexpr bool kExists = true;
+};
+template <class T>
+struct RawOf<T, 32, std::enable_if_t<std::is_integral_v<T> && !std::is_same_v<T, bool>>> {
+    using type = __m256i;
+    static constexpr bool kExists = true;
+};
+#endif
+#if ZOR_WIDTH >= 64
+template <>
+struct RawOf<float, 64> {
+    using type = __m512;
+    static constexpr bool kExists = true;
+};
+template <>
+struct RawOf<double, 64> {
+    using type = __m512d;
+    static constexpr bool kExists = true;
+};
+template <class T>
+struct RawOf<T, 64, std::enable_if_t<std::is_integral_v<T> && !std::is_same_v<T, bool>>> {
+    using type = __m512i;
     static constexpr bool kExists = true;
 };
 #endif
@@ -211,6 +248,14 @@ constexpr int lanesOf() {
     if constexpr (std::is_arithmetic_v<V>) return 1;
     else return V::kLanes;
 }
+
+// The lane type twice as wide, keeping signedness.
+template <class T>
+using Wider = std::conditional_t<
+    std::is_same_v<T, float>, double,
+    std::conditional_t<std::is_signed_v<T>,
+                       std::conditional_t<sizeof(T) == 1, int16_t, std::conditional_t<sizeof(T) == 2, int32_t, int64_t>>,
+                       std::conditional_t<sizeof(T) == 1, uint16_t, std::conditional_t<sizeof(T) == 2, uint32_t, uint64_t>>>>;
 
 template <int Bytes>
 struct Isa;  // the instructions of one register width
@@ -1009,6 +1054,669 @@ struct Isa<16> {
 };
 #endif  // ZOR_SIMD >= 1
 
+#if ZOR_WIDTH >= 32
+// ---- wide registers: 32 bytes (AVX2) and 64 bytes (AVX-512) -------------------
+// Isa<B> for B = 32 and 64 is built on Isa<B / 2>: every operation applied
+// to the two halves (Halves<B>), which gives the per-16-byte-block
+// semantics of the lane-order notes above by construction, and the whole-
+// register operations (loads of half a register, reductions, lane masks,
+// interleaving) composed from the halves' results in lane order.  The
+// operations that carry the loops (memory, arithmetic, comparisons,
+// conversions) are overridden with single instructions below; the rest run
+// as two half-width instructions.
+
+template <class V, class N>
+V loadWidened(const N* p);
+
+template <int Bytes>
+struct Parts;  // the halves of a register: lo, hi, join
+
+template <>
+struct Parts<32> {
+    template <class T>
+    static auto lo(typename RawOf<T, 32>::type a) {
+        if constexpr (std::is_same_v<T, float>) return _mm256_castps256_ps128(a);
+        else if constexpr (std::is_same_v<T, double>) return _mm256_castpd256_pd128(a);
+        else return _mm256_castsi256_si128(a);
+    }
+    template <class T>
+    static auto hi(typename RawOf<T, 32>::type a) {
+        if constexpr (std::is_same_v<T, float>) return _mm256_extractf128_ps(a, 1);
+        else if constexpr (std::is_same_v<T, double>) return _mm256_extractf128_pd(a, 1);
+        else return _mm256_extracti128_si256(a, 1);
+    }
+    template <class T>
+    static typename RawOf<T, 32>::type join(typename RawOf<T, 16>::type l, typename RawOf<T, 16>::type h) {
+        if constexpr (std::is_same_v<T, float>) return _mm256_insertf128_ps(_mm256_castps128_ps256(l), h, 1);
+        else if constexpr (std::is_same_v<T, double>) return _mm256_insertf128_pd(_mm256_castpd128_pd256(l), h, 1);
+        else return _mm256_inserti128_si256(_mm256_castsi128_si256(l), h, 1);
+    }
+};
+
+#  if ZOR_WIDTH >= 64
+template <>
+struct Parts<64> {
+    template <class T>
+    static auto lo(typename RawOf<T, 64>::type a) {
+        if constexpr (std::is_same_v<T, float>) return _mm512_castps512_ps256(a);
+        else if constexpr (std::is_same_v<T, double>) return _mm512_castpd512_pd256(a);
+        else return _mm512_castsi512_si256(a);
+    }
+    template <class T>
+    static auto hi(typename RawOf<T, 64>::type a) {
+        if constexpr (std::is_same_v<T, float>) return _mm512_extractf32x8_ps(a, 1);
+        else if constexpr (std::is_same_v<T, double>) return _mm512_extractf64x4_pd(a, 1);
+        else return _mm512_extracti64x4_epi64(a, 1);
+    }
+    template <class T>
+    static typename RawOf<T, 64>::type join(typename RawOf<T, 32>::type l, typename RawOf<T, 32>::type h) {
+        if constexpr (std::is_same_v<T, float>) return _mm512_insertf32x8(_mm512_castps256_ps512(l), h, 1);
+        else if constexpr (std::is_same_v<T, double>) return _mm512_insertf64x4(_mm512_castpd256_pd512(l), h, 1);
+        else return _mm512_inserti64x4(_mm512_castsi256_si512(l), h, 1);
+    }
+};
+#  endif
+
+template <int Bytes>
+struct Halves {
+    static constexpr int kHalf = Bytes / 2;
+    using H = Isa<kHalf>;
+    using P = Parts<Bytes>;
+    template <class T>
+    using R = typename RawOf<T, Bytes>::type;
+    template <class T>
+    static constexpr int kHalfLanes = kHalf / int(sizeof(T));
+
+    template <class T>
+    static auto lo(R<T> a) { return P::template lo<T>(a); }
+    template <class T>
+    static auto hi(R<T> a) { return P::template hi<T>(a); }
+    template <class T, class L>
+    static R<T> join(L l, L h) { return P::template join<T>(l, h); }
+    // f on both halves: Out lanes from In lanes.
+    template <class Out, class In, class F>
+    static R<Out> each(R<In> a, F f) { return join<Out>(f(lo<In>(a)), f(hi<In>(a))); }
+    template <class Out, class In, class F>
+    static R<Out> each(R<In> a, R<In> b, F f) {
+        return join<Out>(f(lo<In>(a), lo<In>(b)), f(hi<In>(a), hi<In>(b)));
+    }
+
+    // -- memory
+    template <class T>
+    static R<T> zero() { return join<T>(H::template zero<T>(), H::template zero<T>()); }
+    template <class T>
+    static R<T> set1(T x) { return join<T>(H::template set1<T>(x), H::template set1<T>(x)); }
+    template <class T>
+    static R<T> load(const T* p) { return join<T>(H::template load<T>(p), H::template load<T>(p + kHalfLanes<T>)); }
+    template <class T>
+    static R<T> loadAligned(const T* p) { return load<T>(p); }  // no fault on data aligned for half a register
+    template <class T>
+    static R<T> loadHalf(const T* p) { return join<T>(H::template load<T>(p), H::template zero<T>()); }
+    template <class T>
+    static void store(T* p, R<T> v) {
+        H::template store<T>(p, lo<T>(v));
+        H::template store<T>(p + kHalfLanes<T>, hi<T>(v));
+    }
+    template <class T>
+    static void storeAligned(T* p, R<T> v) { store<T>(p, v); }
+    template <class T>
+    static void storeHalf(T* p, R<T> v) { H::template store<T>(p, lo<T>(v)); }
+    // Non-temporal, 16-byte alignment is enough.
+    template <class T>
+    static void stream(T* p, R<T> v) {
+        H::template stream<T>(p, lo<T>(v));
+        H::template stream<T>(p + kHalfLanes<T>, hi<T>(v));
+    }
+    static void prefetch(const void* p) { H::prefetch(p); }
+    template <class W, class N>
+    static R<W> loadWidened(const N* p) {
+        using HV = Vec<W, kHalf>;
+        return join<W>(simd::loadWidened<HV>(p).raw, simd::loadWidened<HV>(p + HV::kLanes).raw);
+    }
+
+    // -- lane by lane, and per 16-byte block
+#  define ZOR_HALVES_1_(name)                                                                       \
+    template <class T>                                                                               \
+    static R<T> name(R<T> a) { return each<T, T>(a, [](auto x) { return H::template name<T>(x); }); }
+#  define ZOR_HALVES_2_(name)                                                                      \
+    template <class T>                                                                              \
+    static R<T> name(R<T> a, R<T> b) {                                                              \
+        return each<T, T>(a, b, [](auto x, auto y) { return H::template name<T>(x, y); });          \
+    }
+    template <class T>
+    static R<T> allOnes() { return join<T>(H::template allOnes<T>(), H::template allOnes<T>()); }
+    ZOR_HALVES_2_(bitAnd)
+    ZOR_HALVES_2_(bitOr)
+    ZOR_HALVES_2_(bitXor)
+    ZOR_HALVES_2_(andNot)
+    ZOR_HALVES_2_(add)
+    ZOR_HALVES_2_(sub)
+    ZOR_HALVES_2_(mul)
+    ZOR_HALVES_2_(div)
+    ZOR_HALVES_1_(sqrt)
+    ZOR_HALVES_2_(eq)
+    ZOR_HALVES_2_(gt)
+    ZOR_HALVES_2_(ge)
+    ZOR_HALVES_2_(min)
+    ZOR_HALVES_2_(max)
+    ZOR_HALVES_2_(addSat)
+    ZOR_HALVES_2_(subSat)
+    ZOR_HALVES_2_(avg)
+    ZOR_HALVES_2_(mulHi)
+    ZOR_HALVES_1_(abs)
+    ZOR_HALVES_2_(zipLo)
+    ZOR_HALVES_2_(zipHi)
+    ZOR_HALVES_2_(concatEven)
+    ZOR_HALVES_2_(concatOdd)
+    ZOR_HALVES_2_(addPairs)
+#  undef ZOR_HALVES_1_
+#  undef ZOR_HALVES_2_
+    template <class T>
+    static R<T> select(R<T> mask, R<T> a, R<T> b) {
+        return join<T>(H::template select<T>(lo<T>(mask), lo<T>(a), lo<T>(b)),
+                       H::template select<T>(hi<T>(mask), hi<T>(a), hi<T>(b)));
+    }
+    template <class T, int N>
+    static R<T> shl(R<T> a) { return each<T, T>(a, [](auto x) { return H::template shl<T, N>(x); }); }
+    template <class T, int N>
+    static R<T> shr(R<T> a) { return each<T, T>(a, [](auto x) { return H::template shr<T, N>(x); }); }
+    template <class T>
+    static R<T> shl(R<T> a, int n) { return each<T, T>(a, [n](auto x) { return H::template shl<T>(x, n); }); }
+    template <class T>
+    static R<T> shr(R<T> a, int n) { return each<T, T>(a, [n](auto x) { return H::template shr<T>(x, n); }); }
+    template <class T>
+    static R<Wider<T>> widenLo(R<T> a) {
+        return each<Wider<T>, T>(a, [](auto x) { return H::template widenLo<T>(x); });
+    }
+    template <class T>
+    static R<Wider<T>> widenHi(R<T> a) {
+        return each<Wider<T>, T>(a, [](auto x) { return H::template widenHi<T>(x); });
+    }
+    template <class To, class From>
+    static R<To> narrowSat(R<From> l, R<From> h) {
+        return each<To, From>(l, h, [](auto x, auto y) { return H::template narrowSat<To, From>(x, y); });
+    }
+    template <class To, class From>
+    static R<To> narrowTrunc(R<From> l, R<From> h) {
+        return each<To, From>(l, h, [](auto x, auto y) { return H::template narrowTrunc<To, From>(x, y); });
+    }
+    static R<int32_t> mulAddPairs16(R<int16_t> a, R<int16_t> b) {
+        return each<int32_t, int16_t>(a, b, [](auto x, auto y) { return H::mulAddPairs16(x, y); });
+    }
+    static R<uint64_t> sumAbsDiff8(R<uint8_t> a, R<uint8_t> b) {
+        return each<uint64_t, uint8_t>(a, b, [](auto x, auto y) { return H::sumAbsDiff8(x, y); });
+    }
+    static R<int16_t> mulAddPairs8(R<uint8_t> u, R<int8_t> s) {
+        return join<int16_t>(H::mulAddPairs8(lo<uint8_t>(u), lo<int8_t>(s)), H::mulAddPairs8(hi<uint8_t>(u), hi<int8_t>(s)));
+    }
+    static R<int16_t> mulHiRound(R<int16_t> a, R<int16_t> b) {
+        return each<int16_t, int16_t>(a, b, [](auto x, auto y) { return H::mulHiRound(x, y); });
+    }
+    static R<uint8_t> shuffleBytes(R<uint8_t> t, R<uint8_t> idx) {
+        return each<uint8_t, uint8_t>(t, idx, [](auto x, auto y) { return H::shuffleBytes(x, y); });
+    }
+    template <int N>
+    static R<uint8_t> shiftBytesUp(R<uint8_t> a) {
+        return each<uint8_t, uint8_t>(a, [](auto x) { return H::template shiftBytesUp<N>(x); });
+    }
+    template <int N>
+    static R<uint8_t> shiftBytesDown(R<uint8_t> a) {
+        return each<uint8_t, uint8_t>(a, [](auto x) { return H::template shiftBytesDown<N>(x); });
+    }
+    template <int N, class T>
+    static R<T> alignBytes(R<T> h, R<T> l) {
+        return each<T, T>(h, l, [](auto x, auto y) { return H::template alignBytes<N, T>(x, y); });
+    }
+    template <class T>
+    static void transpose4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        auto a0 = lo<T>(a), b0 = lo<T>(b), c0 = lo<T>(c), d0 = lo<T>(d);
+        auto a1 = hi<T>(a), b1 = hi<T>(b), c1 = hi<T>(c), d1 = hi<T>(d);
+        H::template transpose4<T>(a0, b0, c0, d0);
+        H::template transpose4<T>(a1, b1, c1, d1);
+        a = join<T>(a0, a1), b = join<T>(b0, b1), c = join<T>(c0, c1), d = join<T>(d0, d1);
+    }
+    static R<float> recipApprox(R<float> a) { return each<float, float>(a, [](auto x) { return H::recipApprox(x); }); }
+    template <class To, class From>
+    static R<To> bitcast(R<From> a) {
+        return each<To, From>(a, [](auto x) { return H::template bitcast<To, From>(x); });
+    }
+
+    // -- conversions (per 16-byte block where the lane count changes)
+    static R<float> int32ToFloat(R<int32_t> a) { return each<float, int32_t>(a, [](auto x) { return H::int32ToFloat(x); }); }
+    static R<int32_t> floatToInt32(R<float> a) { return each<int32_t, float>(a, [](auto x) { return H::floatToInt32(x); }); }
+    static R<int32_t> floatToInt32Trunc(R<float> a) {
+        return each<int32_t, float>(a, [](auto x) { return H::floatToInt32Trunc(x); });
+    }
+    static R<double> floatToDoubleLo(R<float> a) { return each<double, float>(a, [](auto x) { return H::floatToDoubleLo(x); }); }
+    static R<double> floatToDoubleHi(R<float> a) { return each<double, float>(a, [](auto x) { return H::floatToDoubleHi(x); }); }
+    static R<float> doubleToFloat(R<double> l, R<double> h) {
+        return each<float, double>(l, h, [](auto x, auto y) { return H::doubleToFloat(x, y); });
+    }
+    static R<double> int32ToDoubleLo(R<int32_t> a) { return each<double, int32_t>(a, [](auto x) { return H::int32ToDoubleLo(x); }); }
+    static R<double> int32ToDoubleHi(R<int32_t> a) { return each<double, int32_t>(a, [](auto x) { return H::int32ToDoubleHi(x); }); }
+    static R<int32_t> doubleToInt32(R<double> l, R<double> h) {
+        return each<int32_t, double>(l, h, [](auto x, auto y) { return H::doubleToInt32(x, y); });
+    }
+    static R<int32_t> doubleToInt32Trunc(R<double> l, R<double> h) {
+        return each<int32_t, double>(l, h, [](auto x, auto y) { return H::doubleToInt32Trunc(x, y); });
+    }
+    static R<double> addPairs(R<double> a, R<double> b) {
+        return each<double, double>(a, b, [](auto x, auto y) { return H::addPairs(x, y); });
+    }
+
+    // -- whole-register lane order
+    static void loadInterleaved3(const uint8_t* p, R<uint8_t>& a, R<uint8_t>& b, R<uint8_t>& c) {
+        typename RawOf<uint8_t, kHalf>::type a0, b0, c0, a1, b1, c1;
+        H::loadInterleaved3(p, a0, b0, c0);
+        H::loadInterleaved3(p + 3 * kHalf, a1, b1, c1);
+        a = join<uint8_t>(a0, a1), b = join<uint8_t>(b0, b1), c = join<uint8_t>(c0, c1);
+    }
+    static void storeInterleaved3(uint8_t* p, R<uint8_t> a, R<uint8_t> b, R<uint8_t> c) {
+        H::storeInterleaved3(p, lo<uint8_t>(a), lo<uint8_t>(b), lo<uint8_t>(c));
+        H::storeInterleaved3(p + 3 * kHalf, hi<uint8_t>(a), hi<uint8_t>(b), hi<uint8_t>(c));
+    }
+    static void deinterleave(R<float> a, R<float> b, R<float>& even, R<float>& odd) {
+        typename RawOf<float, kHalf>::type e0, o0, e1, o1;
+        H::deinterleave(lo<float>(a), hi<float>(a), e0, o0);
+        H::deinterleave(lo<float>(b), hi<float>(b), e1, o1);
+        even = join<float>(e0, e1), odd = join<float>(o0, o1);
+    }
+    static void interleave(R<float> even, R<float> odd, R<float>& l, R<float>& h) {
+        typename RawOf<float, kHalf>::type l0, h0, l1, h1;
+        H::interleave(lo<float>(even), lo<float>(odd), l0, h0);
+        H::interleave(hi<float>(even), hi<float>(odd), l1, h1);
+        l = join<float>(l0, h0), h = join<float>(l1, h1);
+    }
+    static void transpose(R<float> (&r)[Bytes / 4]) {
+        constexpr int n = Bytes / 4;
+        alignas(64) float m[n][n];
+        for (int i = 0; i < n; ++i) store<float>(m[i], r[i]);
+        for (int i = 0; i < n; ++i)
+            for (int j = i + 1; j < n; ++j) std::swap(m[i][j], m[j][i]);
+        for (int i = 0; i < n; ++i) r[i] = load<float>(m[i]);
+    }
+    template <class T>
+    static R<T> reverseLanes(R<T> a) {
+        return join<T>(H::template reverseLanes<T>(hi<T>(a)), H::template reverseLanes<T>(lo<T>(a)));
+    }
+    template <class T>
+    static int laneMask(R<T> a) {
+        static_assert(Bytes / sizeof(T) <= 32, "a lane mask of at most 32 lanes");
+        return int(unsigned(H::template laneMask<T>(lo<T>(a))) |
+                   (unsigned(H::template laneMask<T>(hi<T>(a))) << kHalfLanes<T>));
+    }
+    static int byteMask(R<uint8_t> a) {
+        static_assert(Bytes <= 32, "a byte mask of at most 32 bytes");
+        return int(unsigned(H::byteMask(lo<uint8_t>(a))) | (unsigned(H::byteMask(hi<uint8_t>(a))) << kHalf));
+    }
+    template <class T>
+    static bool anyTrue(R<T> m) { return H::template anyTrue<T>(lo<T>(m)) || H::template anyTrue<T>(hi<T>(m)); }
+    template <class T>
+    static bool allTrue(R<T> m) { return H::template allTrue<T>(lo<T>(m)) && H::template allTrue<T>(hi<T>(m)); }
+    template <class T>
+    static int firstTrue(R<T> m) {
+        const int f = H::template firstTrue<T>(lo<T>(m));
+        return f < kHalfLanes<T> ? f : kHalfLanes<T> + H::template firstTrue<T>(hi<T>(m));
+    }
+    template <int I, class T>
+    static T getLane(R<T> a) {
+        if constexpr (I < kHalfLanes<T>) return H::template getLane<I, T>(lo<T>(a));
+        else return H::template getLane<I - kHalfLanes<T>, T>(hi<T>(a));
+    }
+    // Lane i + n/2 added to lane i (the left operand), then the same on the
+    // half: the order of the 16-byte reduction, continued.
+    template <class T>
+    static T reduceAdd(R<T> a) { return H::template reduceAdd<T>(H::template add<T>(lo<T>(a), hi<T>(a))); }
+};
+
+// The 32-byte registers.  Float and double lanes keep the order of their
+// 16-byte halves: the conversions between them work per 16-byte block, so a
+// permutation of 8-byte chunks ((0, 2, 1, 3): lanes 0, 1 of each block
+// together) goes before a widening and after a narrowing.
+template <>
+struct Isa<32> : Halves<32> {
+    using Base = Halves<32>;
+    template <class T>
+    static constexpr bool isF = std::is_same_v<T, float>;
+    template <class T>
+    static constexpr bool isD = std::is_same_v<T, double>;
+
+    template <class T>
+    static R<T> zero() {
+        if constexpr (isF<T>) return _mm256_setzero_ps();
+        else if constexpr (isD<T>) return _mm256_setzero_pd();
+        else return _mm256_setzero_si256();
+    }
+    template <class T>
+    static R<T> set1(T x) {
+        if constexpr (isF<T>) return _mm256_set1_ps(x);
+        else if constexpr (isD<T>) return _mm256_set1_pd(x);
+        else if constexpr (sizeof(T) == 1) return _mm256_set1_epi8(static_cast<char>(x));
+        else if constexpr (sizeof(T) == 2) return _mm256_set1_epi16(static_cast<short>(x));
+        else if constexpr (sizeof(T) == 4) return _mm256_set1_epi32(static_cast<int>(x));
+        else return _mm256_set1_epi64x(static_cast<long long>(x));
+    }
+    template <class T>
+    static R<T> load(const T* p) {
+        if constexpr (isF<T>) return _mm256_loadu_ps(p);
+        else if constexpr (isD<T>) return _mm256_loadu_pd(p);
+        else return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p));
+    }
+    template <class T>
+    static R<T> loadAligned(const T* p) { return load<T>(p); }
+    template <class T>
+    static void store(T* p, R<T> v) {
+        if constexpr (isF<T>) _mm256_storeu_ps(p, v);
+        else if constexpr (isD<T>) _mm256_storeu_pd(p, v);
+        else _mm256_storeu_si256(reinterpret_cast<__m256i*>(p), v);
+    }
+    template <class T>
+    static void storeAligned(T* p, R<T> v) { store<T>(p, v); }
+
+    template <class T>
+    static R<T> bitAnd(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_and_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_and_pd(a, b);
+        else return _mm256_and_si256(a, b);
+    }
+    template <class T>
+    static R<T> bitOr(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_or_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_or_pd(a, b);
+        else return _mm256_or_si256(a, b);
+    }
+    template <class T>
+    static R<T> bitXor(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_xor_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_xor_pd(a, b);
+        else return _mm256_xor_si256(a, b);
+    }
+    template <class T>
+    static R<T> andNot(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_andnot_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_andnot_pd(a, b);
+        else return _mm256_andnot_si256(a, b);
+    }
+    template <class T>
+    static R<T> select(R<T> mask, R<T> a, R<T> b) { return bitOr<T>(bitAnd<T>(mask, a), andNot<T>(mask, b)); }
+
+    template <class T>
+    static R<T> add(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_add_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_add_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm256_add_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm256_add_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm256_add_epi32(a, b);
+        else return _mm256_add_epi64(a, b);
+    }
+    template <class T>
+    static R<T> sub(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_sub_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_sub_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm256_sub_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm256_sub_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm256_sub_epi32(a, b);
+        else return _mm256_sub_epi64(a, b);
+    }
+    template <class T>
+    static R<T> mul(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_mul_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_mul_pd(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm256_mullo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm256_mullo_epi32(a, b);
+        else return Base::mul<T>(a, b);
+    }
+    template <class T>
+    static R<T> div(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_div_ps(a, b);
+        else return _mm256_div_pd(a, b);
+    }
+    template <class T>
+    static R<T> sqrt(R<T> a) {
+        if constexpr (isF<T>) return _mm256_sqrt_ps(a);
+        else return _mm256_sqrt_pd(a);
+    }
+    // The predicates of cmpeqps, cmpltps and cmpleps (operands swapped for
+    // gt, ge): the same results and flags as the 16-byte compares.
+    template <class T>
+    static R<T> eq(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_cmp_ps(a, b, _CMP_EQ_OQ);
+        else if constexpr (isD<T>) return _mm256_cmp_pd(a, b, _CMP_EQ_OQ);
+        else return Base::eq<T>(a, b);
+    }
+    template <class T>
+    static R<T> gt(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_cmp_ps(b, a, _CMP_LT_OS);
+        else if constexpr (isD<T>) return _mm256_cmp_pd(b, a, _CMP_LT_OS);
+        else return Base::gt<T>(a, b);
+    }
+    template <class T>
+    static R<T> ge(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_cmp_ps(b, a, _CMP_LE_OS);
+        else if constexpr (isD<T>) return _mm256_cmp_pd(b, a, _CMP_LE_OS);
+        else return Base::ge<T>(a, b);
+    }
+    template <class T>
+    static R<T> min(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_min_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_min_pd(a, b);
+        else return Base::min<T>(a, b);
+    }
+    template <class T>
+    static R<T> max(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm256_max_ps(a, b);
+        else if constexpr (isD<T>) return _mm256_max_pd(a, b);
+        else return Base::max<T>(a, b);
+    }
+
+    // Three interleaved byte channels, 96 bytes: each 16-byte lane does the
+    // work of the 16-byte registers on its own 48 bytes (the first 16
+    // pixels in the lower lane, the next 16 in the upper one).
+    static __m256i loadLanes(const uint8_t* lo, const uint8_t* hi) {
+        return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(lo))),
+                                       _mm_loadu_si128(reinterpret_cast<const __m128i*>(hi)), 1);
+    }
+    static __m256i perLane(const uint8_t* m) {
+        return _mm256_broadcastsi128_si256(_mm_load_si128(reinterpret_cast<const __m128i*>(m)));
+    }
+    static void loadInterleaved3(const uint8_t* p, __m256i& a, __m256i& b, __m256i& c) {
+        alignas(16) static constexpr auto masks = interleaveMasks(false);
+        const __m256i v[3] = {loadLanes(p, p + 48), loadLanes(p + 16, p + 64), loadLanes(p + 32, p + 80)};
+        __m256i out[3];
+        for (int k = 0; k < 3; ++k)
+            out[k] = _mm256_or_si256(_mm256_or_si256(_mm256_shuffle_epi8(v[0], perLane(masks.m[3 * k])),
+                                                     _mm256_shuffle_epi8(v[1], perLane(masks.m[3 * k + 1]))),
+                                     _mm256_shuffle_epi8(v[2], perLane(masks.m[3 * k + 2])));
+        a = out[0], b = out[1], c = out[2];
+    }
+    static void storeInterleaved3(uint8_t* p, __m256i a, __m256i b, __m256i c) {
+        alignas(16) static constexpr auto masks = interleaveMasks(true);
+        const __m256i in[3] = {a, b, c};
+        for (int r = 0; r < 3; ++r) {
+            const __m256i o = _mm256_or_si256(_mm256_or_si256(_mm256_shuffle_epi8(in[0], perLane(masks.m[3 * r])),
+                                                              _mm256_shuffle_epi8(in[1], perLane(masks.m[3 * r + 1]))),
+                                              _mm256_shuffle_epi8(in[2], perLane(masks.m[3 * r + 2])));
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(p + 16 * r), _mm256_castsi256_si128(o));
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(p + 48 + 16 * r), _mm256_extracti128_si256(o, 1));
+        }
+    }
+
+    static __m256d blockPairsTogether(__m256d a) { return _mm256_permute4x64_pd(a, _MM_SHUFFLE(3, 1, 2, 0)); }
+    static __m256 int32ToFloat(__m256i a) { return _mm256_cvtepi32_ps(a); }
+    static __m256i floatToInt32(__m256 a) { return _mm256_cvtps_epi32(a); }
+    static __m256i floatToInt32Trunc(__m256 a) { return _mm256_cvttps_epi32(a); }
+    static __m256d floatToDoubleLo(__m256 a) {
+        return _mm256_cvtps_pd(_mm256_castps256_ps128(_mm256_castpd_ps(blockPairsTogether(_mm256_castps_pd(a)))));
+    }
+    static __m256d floatToDoubleHi(__m256 a) {
+        return _mm256_cvtps_pd(_mm256_extractf128_ps(_mm256_castpd_ps(blockPairsTogether(_mm256_castps_pd(a))), 1));
+    }
+    static __m256 doubleToFloat(__m256d lo, __m256d hi) {
+        const __m256 both = _mm256_insertf128_ps(_mm256_castps128_ps256(_mm256_cvtpd_ps(lo)), _mm256_cvtpd_ps(hi), 1);
+        return _mm256_castpd_ps(blockPairsTogether(_mm256_castps_pd(both)));
+    }
+};
+
+#  if ZOR_WIDTH >= 64
+// The 64-byte registers: comparisons give opmasks, spread back into lanes.
+template <>
+struct Isa<64> : Halves<64> {
+    using Base = Halves<64>;
+    template <class T>
+    static constexpr bool isF = std::is_same_v<T, float>;
+    template <class T>
+    static constexpr bool isD = std::is_same_v<T, double>;
+
+    template <class T>
+    static R<T> zero() {
+        if constexpr (isF<T>) return _mm512_setzero_ps();
+        else if constexpr (isD<T>) return _mm512_setzero_pd();
+        else return _mm512_setzero_si512();
+    }
+    template <class T>
+    static R<T> set1(T x) {
+        if constexpr (isF<T>) return _mm512_set1_ps(x);
+        else if constexpr (isD<T>) return _mm512_set1_pd(x);
+        else if constexpr (sizeof(T) == 1) return _mm512_set1_epi8(static_cast<char>(x));
+        else if constexpr (sizeof(T) == 2) return _mm512_set1_epi16(static_cast<short>(x));
+        else if constexpr (sizeof(T) == 4) return _mm512_set1_epi32(static_cast<int>(x));
+        else return _mm512_set1_epi64(static_cast<long long>(x));
+    }
+    template <class T>
+    static R<T> load(const T* p) {
+        if constexpr (isF<T>) return _mm512_loadu_ps(p);
+        else if constexpr (isD<T>) return _mm512_loadu_pd(p);
+        else return _mm512_loadu_si512(p);
+    }
+    template <class T>
+    static R<T> loadAligned(const T* p) { return load<T>(p); }
+    template <class T>
+    static void store(T* p, R<T> v) {
+        if constexpr (isF<T>) _mm512_storeu_ps(p, v);
+        else if constexpr (isD<T>) _mm512_storeu_pd(p, v);
+        else _mm512_storeu_si512(p, v);
+    }
+    template <class T>
+    static void storeAligned(T* p, R<T> v) { store<T>(p, v); }
+
+    template <class T>
+    static R<T> bitAnd(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_and_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_and_pd(a, b);
+        else return _mm512_and_si512(a, b);
+    }
+    template <class T>
+    static R<T> bitOr(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_or_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_or_pd(a, b);
+        else return _mm512_or_si512(a, b);
+    }
+    template <class T>
+    static R<T> bitXor(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_xor_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_xor_pd(a, b);
+        else return _mm512_xor_si512(a, b);
+    }
+    template <class T>
+    static R<T> andNot(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_andnot_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_andnot_pd(a, b);
+        else return _mm512_andnot_si512(a, b);
+    }
+    template <class T>
+    static R<T> select(R<T> mask, R<T> a, R<T> b) { return bitOr<T>(bitAnd<T>(mask, a), andNot<T>(mask, b)); }
+
+    template <class T>
+    static R<T> add(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_add_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_add_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm512_add_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm512_add_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm512_add_epi32(a, b);
+        else return _mm512_add_epi64(a, b);
+    }
+    template <class T>
+    static R<T> sub(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_sub_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_sub_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm512_sub_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm512_sub_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm512_sub_epi32(a, b);
+        else return _mm512_sub_epi64(a, b);
+    }
+    template <class T>
+    static R<T> mul(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_mul_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_mul_pd(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm512_mullo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm512_mullo_epi32(a, b);
+        else return Base::mul<T>(a, b);
+    }
+    template <class T>
+    static R<T> div(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_div_ps(a, b);
+        else return _mm512_div_pd(a, b);
+    }
+    template <class T>
+    static R<T> sqrt(R<T> a) {
+        if constexpr (isF<T>) return _mm512_sqrt_ps(a);
+        else return _mm512_sqrt_pd(a);
+    }
+    template <class T>
+    static R<T> eq(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_castsi512_ps(_mm512_movm_epi32(_mm512_cmp_ps_mask(a, b, _CMP_EQ_OQ)));
+        else if constexpr (isD<T>) return _mm512_castsi512_pd(_mm512_movm_epi64(_mm512_cmp_pd_mask(a, b, _CMP_EQ_OQ)));
+        else return Base::eq<T>(a, b);
+    }
+    template <class T>
+    static R<T> gt(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_castsi512_ps(_mm512_movm_epi32(_mm512_cmp_ps_mask(b, a, _CMP_LT_OS)));
+        else if constexpr (isD<T>) return _mm512_castsi512_pd(_mm512_movm_epi64(_mm512_cmp_pd_mask(b, a, _CMP_LT_OS)));
+        else return Base::gt<T>(a, b);
+    }
+    template <class T>
+    static R<T> ge(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_castsi512_ps(_mm512_movm_epi32(_mm512_cmp_ps_mask(b, a, _CMP_LE_OS)));
+        else if constexpr (isD<T>) return _mm512_castsi512_pd(_mm512_movm_epi64(_mm512_cmp_pd_mask(b, a, _CMP_LE_OS)));
+        else return Base::ge<T>(a, b);
+    }
+    template <class T>
+    static R<T> min(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_min_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_min_pd(a, b);
+        else return Base::min<T>(a, b);
+    }
+    template <class T>
+    static R<T> max(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm512_max_ps(a, b);
+        else if constexpr (isD<T>) return _mm512_max_pd(a, b);
+        else return Base::max<T>(a, b);
+    }
+
+    // 8-byte chunks 0, 2, 4, 6 (lanes 0, 1 of each block) first, then 1, 3, 5, 7.
+    static __m512d blockPairsTogether(__m512d a) {
+        return _mm512_permutexvar_pd(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), a);
+    }
+    static __m512d blockPairsApart(__m512d a) {
+        return _mm512_permutexvar_pd(_mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7), a);
+    }
+    static __m512 int32ToFloat(__m512i a) { return _mm512_cvtepi32_ps(a); }
+    static __m512i floatToInt32(__m512 a) { return _mm512_cvtps_epi32(a); }
+    static __m512i floatToInt32Trunc(__m512 a) { return _mm512_cvttps_epi32(a); }
+    static __m512d floatToDoubleLo(__m512 a) {
+        return _mm512_cvtps_pd(_mm512_castps512_ps256(_mm512_castpd_ps(blockPairsTogether(_mm512_castps_pd(a)))));
+    }
+    static __m512d floatToDoubleHi(__m512 a) {
+        return _mm512_cvtps_pd(_mm512_extractf32x8_ps(_mm512_castpd_ps(blockPairsTogether(_mm512_castps_pd(a))), 1));
+    }
+    static __m512 doubleToFloat(__m512d lo, __m512d hi) {
+        const __m512 both = _mm512_insertf32x8(_mm512_castps256_ps512(_mm512_cvtpd_ps(lo)), _mm512_cvtpd_ps(hi), 1);
+        return _mm512_castpd_ps(blockPairsApart(_mm512_castps_pd(both)));
+    }
+};
+#  endif  // ZOR_WIDTH >= 64
+#endif  // ZOR_WIDTH >= 32
+
 // ---- the vocabulary -----------------------------------------------------------
 // Free functions over Vec<T, B>; each forwards to Isa<B>.
 
@@ -1181,13 +1889,6 @@ inline Vec<T, B> shr(Vec<T, B> a, int n) { return {Isa<B>::template shr<T>(a.raw
 template <class To, class From, int B>
 inline Vec<To, B> bitcast(Vec<From, B> a) { return {Isa<B>::template bitcast<To, From>(a.raw)}; }
 
-// The lane type twice as wide, keeping signedness.
-template <class T>
-using Wider = std::conditional_t<
-    std::is_same_v<T, float>, double,
-    std::conditional_t<std::is_signed_v<T>,
-                       std::conditional_t<sizeof(T) == 1, int16_t, std::conditional_t<sizeof(T) == 2, int32_t, int64_t>>,
-                       std::conditional_t<sizeof(T) == 1, uint16_t, std::conditional_t<sizeof(T) == 2, uint32_t, uint64_t>>>>;
 
 // Per 16-byte block: the lower (upper) half of the lanes, widened (zero- or
 // sign-extended by T's signedness; floats to double).  Use bitcast for the
@@ -1215,8 +1916,8 @@ inline Vec<To, B> narrowSat(Vec<From, B> lo, Vec<From, B> hi) {
 template <class V, class N>
 inline V loadWidened(const N* p) {
     static_assert(sizeof(N) * 2 == sizeof(typename V::Lane), "loadWidened doubles the lane size");
-    static_assert(V::kBytes == 16, "wider registers widen across blocks: give their Isa a loadWidened");
-    return bitcast<typename V::Lane>(widenLo(loadHalf<Vec<N, V::kBytes>>(p)));
+    if constexpr (V::kBytes == 16) return bitcast<typename V::Lane>(widenLo(loadHalf<Vec<N, 16>>(p)));
+    else return {Isa<V::kBytes>::template loadWidened<typename V::Lane, N>(p)};
 }
 // Per 16-byte block: keeps the low bits of every lane.
 template <class To, class From, int B>

@@ -8,10 +8,13 @@
  * no other list of exports is kept anywhere.
  *
  * map names the code variant whose entry fills each of the five dispatch
- * columns (generic, SSE, SSE2, SSE3, SSSE3):
+ * columns (generic, SSE, SSE2, SSE3, SSSE3), and on x86-64 the two wide
+ * columns (AVX2, AVX-512; frame/columns.h):
  *   ZOR_ALL      each variant has its own entry
  *   ZOR_GENERIC  the generic entry serves every processor
  *   ZOR_SSE2UP   generic entry for the generic and SSE columns
+ *   ZOR_WIDE, ZOR_SSE2UP_WIDE  the same, with entries of their own in the
+ *                wide columns (the family is compiled for them)
  *
  * No include guard: the file is included once per expansion.
  */
@@ -95,7 +98,7 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_AC4C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_AC4C3R,
        (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C3P3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriCopy_8u_C3P3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C3P3R,
        (const int16_t* pSrc, int srcStep, int16_t* const pDst[3], int dstStep, ImageSize roiSize))
@@ -103,7 +106,7 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_C4P4R,
        (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[4], int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_C4P4R,
        (const int16_t* pSrc, int srcStep, int16_t* const pDst[4], int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_8u_P3C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriCopy_8u_P3C3R,
        (const uint8_t* const pSrc[3], int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopy_16s_P3C3R,
        (const int16_t* const pSrc[3], int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
@@ -318,11 +321,11 @@ ZOR_FN(ZOR_SSE2UP,  Status, zorsLn_32f_I,         (float* pSrcDst, int len))
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_32f_I,  (float* pSrcDst, int len, float level, int relOp))
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_LTVal_32f,   (const float* pSrc, float* pDst, int len, float level, float value))
 ZOR_FN(ZOR_ALL,     Status, zorsThreshold_LTVal_32f_I, (float* pSrcDst, int len, float level, float value))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsNormalize_32f,    (const float* pSrc, float* pDst, int len, float vSub, float vDiv))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsMagnitude_32f,    (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsMagnitude_32fc,   (const Complex32f* pSrc, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNormalize_32f,    (const float* pSrc, float* pDst, int len, float vSub, float vDiv))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsMagnitude_32f,    (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsMagnitude_32fc,  (const Complex32f* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsPhase_32f,        (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsPowerSpectr_32f,  (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsPowerSpectr_32f,  (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsAtan2_32f_A21,    (const float* pSrc1, const float* pSrc2, float* pDst, int len))
 ZOR_FN(ZOR_GENERIC, Status, zorsSortDescend_32f_I, (float* pSrcDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsDeinterleave_16s, (const int16_t* pSrc, int channels, int len, int16_t** pDst))

@@ -112,11 +112,26 @@ struct SplitMap {  // output register k = plane k
     }
 };
 
+// Bytes in registers wider than 16 bytes: the vocabulary's three-channel
+// loads and stores (one 48-byte block per 16-byte lane).
+template <class E>
+constexpr bool kWideBytes = sizeof(E) == 1 && simd::kNativeBytes > 16;
+
 template <class E>
 ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
     E* p0 = planes[0];
     E* p1 = planes[1];
     E* p2 = planes[2];
+    if constexpr (kWideBytes<E>) {
+        using V = simd::Vec<uint8_t>;
+        return eachBlock<V::kLanes>(n, [&](ptrdiff_t x) {
+            V a, b, c;
+            simd::loadInterleaved3(s + 3 * x, a, b, c);
+            simd::store(p0 + x, a);
+            simd::store(p1 + x, b);
+            simd::store(p2 + x, c);
+        });
+    }
     return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) {
         using namespace simd;
         Bytes16 in[3], out[3];
@@ -159,6 +174,12 @@ ptrdiff_t merge3Simd(const E* const* planes, E* d, ptrdiff_t n) {
     const E* p0 = planes[0];
     const E* p1 = planes[1];
     const E* p2 = planes[2];
+    if constexpr (kWideBytes<E>) {
+        using W = Vec<uint8_t>;
+        return eachBlock<W::kLanes>(n, [&](ptrdiff_t x) {
+            storeInterleaved3(d + 3 * x, load<W>(p0 + x), load<W>(p1 + x), load<W>(p2 + x));
+        });
+    }
     return eachBlock<V::kLanes>(n, [&](ptrdiff_t x) {
         const V a = load<V>(p0 + x), b = load<V>(p1 + x);
         const Bytes16 c = loadFrom<Bytes16>(p2 + x);

@@ -406,21 +406,29 @@ inline D2 phasePair(F4 snum, F4 den, F4 sc, int row0, int row1) {
 // ---- double-precision elementwise results --------------------------------------
 
 // dst = sqrt(re^2 + im^2) or re^2 + im^2, each in double, rounded once.
+#if ZOR_SIMD >= 2
+// One register of results from registers of re and im (any width: widened
+// halves narrowed back keep the lane order).
+template <bool Root, class F>
+inline F squaresSumLanes(F re, F im) {
+    using namespace simd;
+    const auto sum = [](auto a, auto b) {
+        const auto s = a * a + b * b;
+        if constexpr (Root) return sqrt(s);
+        else return s;
+    };
+    return narrowSat<float>(sum(widenLo(re), widenLo(im)), sum(widenHi(re), widenHi(im)));
+}
+#endif
+
 template <bool Root>
 void squaresSum(const float* re, const float* im, float* d, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
     using namespace simd;
     using F = Vec<float>;
-    const auto sum = [](auto a, auto b) {
-        const auto s = a * a + b * b;
-        if constexpr (Root) return sqrt(s);
-        else return s;
-    };
-    for (; i + F::kLanes <= n; i += F::kLanes) {
-        const F r = load<F>(re + i), m = load<F>(im + i);
-        store(d + i, narrowSat<float>(sum(widenLo(r), widenLo(m)), sum(widenHi(r), widenHi(m))));
-    }
+    for (; i + F::kLanes <= n; i += F::kLanes)
+        store(d + i, squaresSumLanes<Root>(load<F>(re + i), load<F>(im + i)));
 #else
     DoublePrecisionScope precision;
 #endif
@@ -434,16 +442,15 @@ void squaresSum(const float* re, const float* im, float* d, int n) {
 [[maybe_unused]] void magnitudeComplex(const Complex32f* src, float* d, int n) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    // re, im pairs summed across the two lanes of a register of doubles
+    // the (re, im) pairs taken apart into a register of each, in lane order
     using namespace simd;
+    using F = Vec<float>;
     const float* p = reinterpret_cast<const float*>(src);
-    const auto squares = [](D2 v) { return v * v; };
-    for (; i + 4 <= n; i += 4) {
+    for (; i + F::kLanes <= n; i += F::kLanes) {
         const float* q = p + 2 * static_cast<ptrdiff_t>(i);
-        const F4 a = load<F4>(q), b = load<F4>(q + 4);
-        const D2 s0 = addPairs(squares(widenLo(a)), squares(widenHi(a)));
-        const D2 s1 = addPairs(squares(widenLo(b)), squares(widenHi(b)));
-        store(d + i, narrowSat<float>(sqrt(s0), sqrt(s1)));
+        F re, im;
+        deinterleave(load<F>(q), load<F>(q + F::kLanes), re, im);
+        store(d + i, squaresSumLanes<true>(re, im));
     }
 #else
     DoublePrecisionScope precision;

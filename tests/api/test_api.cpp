@@ -4,10 +4,12 @@
 #include <cpuid.h>
 
 #include <cstdint>
+#include <cstdlib>
 #include <cstring>
 #include <string>
 
 #include "zor.h"
+#include "zor_ext.h"
 
 extern "C" int ztHeaderFromC(void);
 
@@ -64,3 +66,28 @@ TEST(Api, AllocateWriteFree) {
 }
 
 TEST(Api, HeaderIsValidC) { EXPECT_EQ(ztHeaderFromC(), 1); }
+
+#if defined(__x86_64__)
+// The width the load bound: what the processor and the operating system
+// allow (AVX2 with FMA for 256, AVX-512 F/BW/DQ/VL for 512, each with its
+// register state enabled in XCR0), capped by ZOR_MAX_WIDTH.
+TEST(Api, BoundWidth) {
+    unsigned a = 0, b = 0, c = 0, d = 0, b7 = 0;
+    __get_cpuid(1, &a, &b, &c, &d);
+    const bool xsave = c & (1u << 27);
+    unsigned xlo = 0, xhi = 0;
+    if (xsave) __asm__("xgetbv" : "=a"(xlo), "=d"(xhi) : "c"(0));
+    __get_cpuid_count(7, 0, &a, &b7, &c, &d);
+    unsigned c1 = 0;
+    __get_cpuid(1, &a, &b, &c1, &d);
+    int usable = 128;
+    if (xsave && (c1 & (1u << 28)) && (c1 & (1u << 12)) && (xlo & 6) == 6 && (b7 & (1u << 5))) {
+        usable = 256;
+        const unsigned avx512 = (1u << 16) | (1u << 17) | (1u << 30) | (1u << 31);
+        if ((b7 & avx512) == avx512 && (xlo & 0xE6) == 0xE6) usable = 512;
+    }
+    const char* env = std::getenv("ZOR_MAX_WIDTH");
+    const int cap = !env ? 512 : std::string(env) == "128" ? 128 : std::string(env) == "256" ? 256 : 512;
+    EXPECT_EQ(zorGetBoundWidth(), usable < cap ? usable : cap);
+}
+#endif

@@ -2,6 +2,7 @@
 // and processors, and the library's own table as bound at load.
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <cstring>
 #include <string>
 #include <vector>
@@ -42,7 +43,7 @@ void dummy() {}
 struct FakeTable {
     static constexpr int kRowsN = 3;
     Entry slots[kRowsN] = {};
-    Row rows[kRowsN];
+    Row rows[kRowsN] = {};
     FakeTable() {
         const Entry e[kRowsN][5] = {
             {dummy<0, 0>, dummy<0, 1>, dummy<0, 2>, dummy<0, 3>, dummy<0, 4>},
@@ -167,7 +168,13 @@ TEST(LibraryTable, BoundToTheSelectedVariant) {
     const int v = selectVariant(liveSelector());
     EXPECT_EQ(zor::frame::boundVariant, v);
     const Table t = libraryTable();
-    for (int i = 0; i < t.count; ++i) EXPECT_EQ(*t.rows[i].slot, t.rows[i].entry[v]) << "row " << i;
+    // Wide entries, where the load overlaid them, replace the variant's.
+    const int w = wideColumn(zor::frame::boundWidth);
+    for (int i = 0; i < t.count; ++i) {
+        const Row& r = t.rows[i];
+        const bool wide = w >= 0 && r.entry[w] != r.entry[4];
+        EXPECT_EQ(*r.slot, wide ? r.entry[w] : r.entry[v]) << "row " << i;
+    }
     // The export answers with the bound variant's record.
     static const char* const tags[5] = {"g0", "s1", "s2", "s3", "s4"};
     EXPECT_STREQ(zorsGetLibVersion()->cpuTag, tags[v]);
@@ -191,3 +198,69 @@ TEST(LoadFailureDeathTest, ReportsAndAborts) {
                  "Set zor library error: No zor matching to CPU was found during the Waterfall");
 }
 #endif
+
+// ---- the wide columns -----------------------------------------------------------
+
+TEST(WideColumns, WidthFromCpuidAndXcr0) {
+    using zor::cpu::usableWidth;
+    Regs l1, l7;
+    l1.ecx = (1u << 27) | (1u << 28) | (1u << 12);  // OSXSAVE, AVX, FMA
+    l7.ebx = 1u << 5;                                 // AVX2
+    EXPECT_EQ(usableWidth(l1, l7, 0x7), 256);
+    EXPECT_EQ(usableWidth(l1, l7, 0x3), 128);  // the system does not save the upper halves
+    Regs noFma = l1;
+    noFma.ecx &= ~(1u << 12);
+    EXPECT_EQ(usableWidth(noFma, l7, 0x7), 128);
+    Regs noOsxsave = l1;
+    noOsxsave.ecx &= ~(1u << 27);
+    EXPECT_EQ(usableWidth(noOsxsave, l7, 0xE7), 128);
+    Regs l7x = l7;
+    l7x.ebx |= (1u << 16) | (1u << 17) | (1u << 30) | (1u << 31);  // F, DQ, BW, VL
+    EXPECT_EQ(usableWidth(l1, l7x, 0xE7), 512);
+    EXPECT_EQ(usableWidth(l1, l7x, 0x27), 256);  // no ZMM state saved
+    for (int missing : {16, 17, 30, 31}) {
+        Regs partial = l7x;
+        partial.ebx &= ~(1u << missing);
+        EXPECT_EQ(usableWidth(l1, partial, 0xE7), 256) << missing;
+    }
+    EXPECT_EQ(usableWidth(Regs{}, Regs{}, 0), 128);
+}
+
+TEST(WideColumns, CapFromTheEnvironment) {
+    EXPECT_EQ(widthCap(nullptr), 512);
+    EXPECT_EQ(widthCap("128"), 128);
+    EXPECT_EQ(widthCap("256"), 256);
+    EXPECT_EQ(widthCap("512"), 512);
+    EXPECT_EQ(widthCap("1024"), 512);
+    EXPECT_EQ(widthCap(" 128"), 512);
+    EXPECT_EQ(widthCap(""), 512);
+}
+
+// The overlay replaces only the slots whose wide entry differs from the
+// SSSE3 one, and leaves the rest as the five-variant binding left them.
+TEST(WideColumns, OverlayTouchesOnlyRowsWithWideEntries) {
+    FakeTable t;
+    ASSERT_TRUE(fillSlots(t.table(), 3));
+    for (int i = 0; i < FakeTable::kRowsN; ++i)
+        for (int k = 5; k < kColumns; ++k) t.rows[i].entry[k] = t.rows[i].entry[4];
+    EXPECT_EQ(overlayWide(t.table(), 128), 128);
+    EXPECT_EQ(t.boundColumn(), 3);
+#if !defined(__x86_64__)
+    EXPECT_EQ(overlayWide(t.table(), 512), 128);  // the 32-bit build has no wide column
+#else
+    t.rows[1].entry[5] = dummy<1, 5>;
+    t.rows[1].entry[6] = dummy<1, 6>;
+    t.rows[2].entry[6] = dummy<2, 6>;
+    EXPECT_EQ(overlayWide(t.table(), 256), 256);
+    EXPECT_TRUE((t.slots[0] == t.rows[0].entry[3] && t.slots[1] == dummy<1, 5> && t.slots[2] == t.rows[2].entry[3]));
+    EXPECT_EQ(overlayWide(t.table(), 512), 512);
+    EXPECT_TRUE((t.slots[0] == t.rows[0].entry[3] && t.slots[1] == dummy<1, 6> && t.slots[2] == dummy<2, 6>));
+#endif
+}
+
+TEST(WideColumns, BoundWidthFollowsProcessorAndCap) {
+    const char* env = std::getenv("ZOR_MAX_WIDTH");
+    const int cap = widthCap(env);
+    const int usable = kColumns > 5 && zor::frame::boundVariant == 4 ? zor::cpu::usableWidth() : 128;
+    EXPECT_EQ(zor::frame::boundWidth, usable < cap ? usable : cap);
+}

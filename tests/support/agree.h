@@ -170,8 +170,11 @@ Case makeCase(int index);
 // run(const Api&, Case&) -> Status (or any integer) for every case: the
 // variant's outputs and status must equal the generic entries' bit for bit
 // (or another reference variant's, where the generic one cannot serve).
+// A wide column (5, 6) is compared with the SSSE3 entries, whose bits its
+// entries reproduce.
 template <class Run>
 void agreesWithGeneric(int variant, Run run, int reference = 0) {
+    if (variant >= 5) reference = 4;
     if (variant == reference) return;
     for (int k = 0; k < caseCount(); ++k) {
         Case g = makeCase(k), v = makeCase(k);

@@ -3,6 +3,8 @@
 #include "frame/cpu.h"
 #include "frame/dispatch.h"
 
+#include <cstdio>
+
 namespace zt {
 
 namespace {
@@ -18,7 +20,8 @@ Api buildApi(int k) {
 }  // namespace
 
 const Api& api(int variant) {
-    static const Api apis[5] = {buildApi(0), buildApi(1), buildApi(2), buildApi(3), buildApi(4)};
+    static const Api apis[7] = {buildApi(0), buildApi(1), buildApi(2), buildApi(3), buildApi(4),
+                                buildApi(kColumns > 5 ? 5 : 4), buildApi(kColumns > 6 ? 6 : 4)};
     return apis[variant];
 }
 
@@ -30,6 +33,8 @@ bool variantSupported(int variant) {
     case 2: return (l1.edx >> 26) & 1;
     case 3: return l1.ecx & 1;
     case 4: return (l1.ecx >> 9) & 1;
+    case 5: return kColumns > 5 && zor::cpu::usableWidth() >= 256;
+    case 6: return kColumns > 6 && zor::cpu::usableWidth() >= 512;
     default: return false;
     }
 }
@@ -37,15 +42,18 @@ bool variantSupported(int variant) {
 const std::vector<int>& supportedVariants() {
     static const std::vector<int> v = [] {
         std::vector<int> r;
-        for (int k = 0; k < 5; ++k)
+        for (int k = 0; k < kColumns; ++k) {
             if (variantSupported(k)) r.push_back(k);
+            else if (k >= 5) std::printf("[ SKIPPED  ] column %d (%d-bit registers): not usable on this processor\n",
+                                         k, k == 5 ? 256 : 512);
+        }
         return r;
     }();
     return v;
 }
 
 std::string variantName(const ::testing::TestParamInfo<int>& info) {
-    static const char* const names[5] = {"g0", "s1", "s2", "s3", "s4"};
+    static const char* const names[7] = {"g0", "s1", "s2", "s3", "s4", "w256", "w512"};
     return names[info.param];
 }
 

@@ -13,6 +13,9 @@
 #include <cstring>
 
 #include "tools/zor/tool.h"
+#if defined(__x86_64__)
+#  include "zor_ext.h"
+#endif
 
 extern "C" int zorToolProcessorType(void);
 
@@ -124,6 +127,9 @@ int cmdInfo(const Args& args) {
     const int variant = s->cpuTag[1] >= '0' && s->cpuTag[1] <= '4' ? s->cpuTag[1] - '0' : -1;
     std::printf("variant %d (%s), bound at load\n", variant, variant >= 0 ? variants[variant] : "?");
     std::printf("processor-type code %d\n", zorToolProcessorType());
+#if defined(__x86_64__)
+    std::printf("register width bound: %d bits (ZOR_MAX_WIDTH=128|256|512 caps it)\n", zorGetBoundWidth());
+#endif
     unsigned a = 0, b = 0, c = 0, d = 0;
     std::string features;
     if (__get_cpuid(1, &a, &b, &c, &d)) {
