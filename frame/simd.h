@@ -959,9 +959,12 @@ template <int B>
 inline void interleave(Vec<float, B> even, Vec<float, B> odd, Vec<float, B>& lo, Vec<float, B>& hi) {
     Isa<B>::interleave(even.raw, odd.raw, lo.raw, hi.raw);
 }
-template <int B>
-inline void transpose(Vec<float, B> (&rows)[Vec<float, B>::kLanes]) {
-    typename Vec<float, B>::Raw r[Vec<float, B>::kLanes];
+// (The row count is a template parameter of its own: clang cannot parse a
+// dependent array bound in this declarator.)
+template <int B, int N>
+inline void transpose(Vec<float, B> (&rows)[N]) {
+    static_assert(N == Vec<float, B>::kLanes, "a square of kLanes rows");
+    typename Vec<float, B>::Raw r[N];
     for (int i = 0; i < Vec<float, B>::kLanes; ++i) r[i] = rows[i].raw;
     Isa<B>::transpose(r);
     for (int i = 0; i < Vec<float, B>::kLanes; ++i) rows[i].raw = r[i];
