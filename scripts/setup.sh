@@ -4,7 +4,8 @@
 set -euo pipefail
 
 native_pkgs=(cmake make g++ ccache libgtest-dev googletest libbenchmark-dev
-             libopencv-dev libfftw3-dev)
+             libopencv-dev libfftw3-dev
+             clang libclang-rt-dev)  # libFuzzer (make fuzz)
 cross_pkgs=(g++-mingw-w64-i686)
 wine_pkgs=(wine wine32:i386)
 

@@ -303,7 +303,7 @@ int ruleFor(const std::string& exportName, const std::string& param) {
         std::stringstream in(rules[r].params);
         std::string p;
         while (std::getline(in, p, ','))
-            if (trim(p) == param) return int(r);
+            if (matchesPattern(param, trim(p).c_str())) return int(r);
     }
     return -1;
 }
@@ -320,6 +320,12 @@ int kindForCreator(const std::string& exportName) {
     for (size_t k = 0; k < kinds.size(); ++k)
         if (exportName == kinds[k].creator) return int(k);
     return -1;
+}
+
+const FamilyRule* familyOf(const Export& ex) {
+    for (const FamilyRule& f : familyRules())
+        if (ex.family == f.home) return &f;
+    return nullptr;
 }
 
 // The parameter that gives an image's step: "pSrc" -> "srcStep", "pDstEdges" -> "dstEdgeStep".
@@ -684,6 +690,9 @@ uint64_t hashBytes(uint64_t h, const uint8_t* p, size_t n) {
 bool extentOf(const Shape& s, size_t limit, int64_t& lo, int64_t& hi) {
     lo = hi = 0;
     if (s.row1 <= s.row0 || s.col1 <= s.col0 || s.elemBytes <= 0) return true;
+    // The bytes a call touches bound its time: rows that overlap (a step of
+    // 0) would otherwise let a small buffer stand for a day's work.
+    if (double(s.row1 - s.row0) * double(s.col1 - s.col0) * double(s.elemBytes) > double(limit)) return false;
     const double rows[2] = {double(s.row0), double(s.row1 - 1)};
     const double cols[2] = {double(s.col0), double(s.col1 - 1)};
     double dlo = 1e300, dhi = -1e300;
@@ -975,8 +984,14 @@ void CallState::decode(Source& src) {
     for (size_t k = 0; k < ex.params.size(); ++k) {
         const Param& p = ex.params[k];
         if (p.rule < 0) continue;
-        const int64_t least = paramRules()[p.rule].atLeast;
-        if (least != INT64_MIN && args[k].v < least) args[k].v = least + (-(args[k].v - least) % 64);
+        const int64_t least = paramRules()[p.rule].atLeast, most = paramRules()[p.rule].atMost;
+        auto fold = [&](int64_t& v) {
+            if (v < least) v = least + (least - v) % 64;
+            if (v > most) v = most - (v - most) % 64;
+        };
+        fold(args[k].v);
+        if (p.role == Role::Values)
+            for (int64_t& v : args[k].values) fold(v);
     }
 }
 
@@ -992,7 +1007,7 @@ void CallState::decodeObject(Source& src, size_t k) {
         return;
     }
     const auto sharedKind = opt.shared.find(want.name);
-    if (sharedKind != opt.shared.end() && !sharedKind->second.empty()) {
+    if (sharedKind != opt.shared.end() && !sharedKind->second.empty() && ex.name != want.freer) {
         auto it = sharedKind->second.begin();
         std::advance(it, (b >> 3) % sharedKind->second.size());
         a.object = it->second;
@@ -1081,6 +1096,13 @@ void CallState::resolveSteps() {
         case 6: v = int8_t(a.lit); break;
         default: v = r; break;
         }
+        // A C caller's typed rows start on element boundaries; a step that is
+        // no multiple of the element survives only where the family reports
+        // odd steps of 16-bit images, and only in one call of eight.
+        const bool oddChecked = elem == 2 && (a.lit >> 29) == 7 && familyOf(ex) &&
+                                std::count(familyOf(ex)->statuses.begin(), familyOf(ex)->statuses.end(),
+                                           StatusNotEvenStep);
+        if (!oddChecked && elem > 1) v -= ((v % elem) + elem) % elem;
         a.v = int32_t(v);
     };
     for (int pass = 0; pass < 2; ++pass)
@@ -1358,7 +1380,9 @@ std::string CallState::describe() const {
 
 uint64_t CallState::outputHash() const {
     uint64_t h = 0xCBF29CE484222325ULL;
-    h = hashBytes(h, reinterpret_cast<const uint8_t*>(&result), sizeof result);
+    // a returned pointer differs from run to run: only whether there is one counts
+    const int64_t shown = ex.result == Result::Pointer ? int64_t(result != 0) : result;
+    h = hashBytes(h, reinterpret_cast<const uint8_t*>(&shown), sizeof shown);
     for (size_t k = 0; k < ex.params.size(); ++k) {
         const Param& p = ex.params[k];
         const Arg& a = args[k];
@@ -1402,9 +1426,7 @@ void CallState::oracle(int64_t liveBefore, const std::vector<uint8_t>&) {
     auto fail = [&](const std::string& why) {
         if (failure.empty()) failure = why;
     };
-    const FamilyRule* family = nullptr;
-    for (const FamilyRule& f : familyRules())
-        if (ex.family == f.home) family = &f;
+    const FamilyRule* family = familyOf(ex);
     const bool error = ex.result == Result::Status && int32_t(result) < 0;
     if (ex.result == Result::Status) {
         const int32_t st = int32_t(result);
@@ -1441,7 +1463,8 @@ void CallState::oracle(int64_t liveBefore, const std::vector<uint8_t>&) {
         if (p.role == Role::Block && a.object) a.consumed = true, a.object = nullptr;
     }
     // pointers the allocators return
-    if (ex.result == Result::Pointer && result != 0 && family && family->resultFreer) {
+    if (ex.result == Result::Pointer && result != 0 && family && family->resultFreer &&
+        matchesPattern(ex.name, family->freedResults)) {
         const Export* f = findExport(family->resultFreer);
         if (f) {
             Slot s;
@@ -1473,11 +1496,16 @@ Outcome Caller::call(Source& src, int exportIndex, int variant) {
     CallState st(ex, variant, variants_, options_);
     st.rng.s = (uint64_t(src.u32()) << 1) | 1;
     st.failAllocation = options_.failAllocation;
-    st.decode(src);
-    if (st.failure.empty()) {
-        st.layOut();
-        st.fillSlots();
-        st.execute();
+    try {
+        st.decode(src);
+        if (st.failure.empty()) {
+            st.layOut();
+            st.fillSlots();
+            st.execute();
+        }
+    } catch (const std::bad_alloc&) {
+        // the process ran short of memory for the call's own buffers: not a call
+        return out;
     }
     out.made = st.made;
     out.result = st.result;

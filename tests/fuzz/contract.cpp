@@ -139,8 +139,9 @@ Border around(int64_t r) { return {r, r, r, r}; }
 // A kernel of size k with anchor a reads k - 1 - a before and a after (the
 // linear filters flip the kernel: their anchor counts from the other end).
 Border neighbourhood(ImageSize k, ImagePoint a, bool flipped) {
-    if (flipped) return {k.width - 1 - a.x, a.x, k.height - 1 - a.y, a.y};
-    return {a.x, k.width - 1 - a.x, a.y, k.height - 1 - a.y};
+    const int64_t w = k.width, h = k.height, x = a.x, y = a.y;
+    if (flipped) return {w - 1 - x, x, h - 1 - y, y};
+    return {x, w - 1 - x, y, h - 1 - y};
 }
 
 Shape strided(int64_t n, int64_t stride, int64_t elem) {
@@ -176,6 +177,10 @@ const std::vector<ParamRule>& paramRules() {
             r.emplace_back(exports, params);
             return r.back();
         };
+
+        // ---- the allocators: byte counts that wrap 32 bits are left to the caller
+        add("zorsMalloc_*", "len").atMost = 1 << 26;
+        add("zoriMalloc_*", "width,height").atMost = 1 << 13;
 
         // ---- image/filter/linear: the flipped kernel reads around the ROI
         add("zoriFilter_*|zoriFilter32f_*", "pKernel").count = [](const CallView& v, int) {
@@ -253,6 +258,9 @@ const std::vector<ParamRule>& paramRules() {
         add("zoriHistogramRange_8u_C1R|zoriHistogramRange_32f_C1R", "pLevels").count = [](const CallView& v, int) {
             return clampCount(v.i("nLevels"));
         };
+        // Levels out of order are counted by a scan of every bin per pixel:
+        // bounded, so that a call's time stays within the smoke's budget.
+        add("zoriHistogramRange_*", "nLevels").atMost = 1024;
         add("zoriHistogramRange_8u_C3R", "pHist").count = [](const CallView& v, int c) {
             return clampCount(v.value("nLevels", c) - 1);
         };

@@ -75,7 +75,8 @@ struct ParamRule {
     CountFn planes;                 // how many pointers a plane array holds
     bool nonNull = false;           // the contract does not check it: never passed null
     bool spansStep = false;         // the export touches whole rows up to the step
-    int64_t atLeast = INT64_MIN;    // values below are outside the contract
+    int64_t atLeast = INT64_MIN;    // values outside [atLeast, atMost] are outside the contract
+    int64_t atMost = INT64_MAX;
 };
 
 struct FamilyRule {

@@ -2,6 +2,7 @@
 // zor.dll under wine): the fuzz target's decoder fed by a seeded generator.
 //
 //   zor_calls [--seed S] [--calls N] [--tame T] [--slow]   random calls
+//             [--memory MB] [--limit BYTES]                address space, buffer bound
 //   zor_calls --replay FILE...                             fuzzer inputs
 //   zor_calls --encode RECORDED OUTDIR                     seed corpus from
 //                                                          recorded test calls
@@ -17,6 +18,10 @@
 #include <vector>
 
 #include "tests/fuzz/calls.h"
+
+#if !defined(_WIN32)
+#include <sys/resource.h>
+#endif
 
 namespace {
 
@@ -66,7 +71,7 @@ void report(const zf::Outcome& o) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    uint64_t seed = 1, calls = 100000;
+    uint64_t seed = 1, calls = 100000, memoryMB = 4096;
     int tame = 0;
     zf::Options options;
     std::vector<const char*> replay;
@@ -79,6 +84,8 @@ int main(int argc, char** argv) {
         else if (a == "--calls") calls = std::strtoull(value(), nullptr, 0);
         else if (a == "--tame") tame = std::atoi(value());
         else if (a == "--slow") options.reportSlow = true;
+        else if (a == "--memory") memoryMB = std::strtoull(value(), nullptr, 0);
+        else if (a == "--limit") options.bufferLimit = std::strtoull(value(), nullptr, 0);
         else if (a == "--trace") options.trace = true;
         else if (a == "--replay") {
             while (k + 1 < argc) replay.push_back(argv[++k]);
@@ -88,6 +95,16 @@ int main(int argc, char** argv) {
         }
     }
 
+    // Objects the contract accepts can be too large for the machine (an FFT
+    // of order 30): with the address space bounded they must fail with
+    // StatusNoMemory rather than take it all.  (The sanitizers reserve their
+    // shadow memory up front; their allocator bound comes from their options.)
+#if !defined(_WIN32) && !defined(__SANITIZE_ADDRESS__) && !defined(__SANITIZE_THREAD__)
+    if (memoryMB) {
+        const rlimit bound = {rlim_t(memoryMB) << 20, rlim_t(memoryMB) << 20};
+        setrlimit(RLIMIT_AS, &bound);
+    }
+#endif
     zf::Caller caller({zf::exportedEntries()}, options);
     int failures = 0;
     if (!replay.empty()) {

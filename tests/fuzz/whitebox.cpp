@@ -48,7 +48,7 @@ CountingAllocator::~CountingAllocator() {
 }
 
 void CountingAllocator::failAt(int64_t k) {
-    failed_ = false;
+    if (k > 0) failed_ = false;  // (disarming keeps what happened readable)
     failAt_ = k > 0 ? taken_.load() + k : 0;
 }
 
