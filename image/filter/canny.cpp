@@ -41,6 +41,7 @@ inline bool wideCoordinates(ImageSize roi) {
     if (!size) return StatusNullPointer;
     if (Status s = badRoi(roi)) return s;
     const int64_t padded = (static_cast<int64_t>(roi.width) + 2) * (static_cast<int64_t>(roi.height) + 2);
+    if (padded > INT_MAX) return StatusBadSize;  // (tested first: 9 x padded could pass 64 bits)
     const int64_t bytes = (wideCoordinates(roi) ? 9 : 5) * padded + 16 * static_cast<int64_t>(roi.width) + 160;
     if (bytes > INT_MAX) return StatusBadSize;  // not expressible as an int
     *size = static_cast<int>(bytes);

@@ -141,6 +141,8 @@ Status ZOR_CALL zorsDCTLifterInitAlloc_32f(void** ppDCTLifter, int lenDCT, int l
     if (!ppDCTLifter) return StatusNullPointer;
     if (!(lenDCT > 0 && lenCeps > 0 && nLifter >= 1 && lenDCT >= lenCeps)) return StatusBadSize;
     const int64_t rows = int64_t(lenCeps) + 1;
+    // (the byte counts below would pass 64 bits first; the pair table refuses these anyway)
+    if (rows * lenDCT > (int64_t(1) << 31)) return StatusNoMemory;
     const int64_t tableBytes = rows * lenDCT * 4;
     const int64_t pairBytes = pairCount(lenCeps) * 2 * lenDCT * 8;
     if (pairBytes > 0x7FFFFFFF) return StatusNoMemory;
