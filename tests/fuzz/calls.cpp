@@ -794,6 +794,7 @@ struct CallState final : CallView {
     void* madeObject = nullptr;
     int madeKind = -1;
     int64_t allocationsTaken = 0;
+    int64_t blocksLeft = 0;  // blocks live after the call that were not before (a made object's)
     int64_t failAllocation = 0;
 
     // ---- CallView ----
@@ -1416,6 +1417,7 @@ void CallState::execute() {
     if (opt.allocations) {
         if (failAllocation > 0) opt.allocations->failAt(0);
         allocationsTaken = opt.allocations->taken() - takenBefore;
+        blocksLeft = opt.allocations->live() - liveBefore;
     }
     if (opt.reportSlow && seconds > 1.0)
         std::fprintf(stderr, "slow call (%.1f s): %s -> %s\n", seconds, describe().c_str(), statusName(result).c_str());
@@ -1462,6 +1464,10 @@ void CallState::oracle(int64_t liveBefore, const std::vector<uint8_t>&) {
         }
         if (p.role == Role::Block && a.object) a.consumed = true, a.object = nullptr;
     }
+    // Blocks of objects made before the call and consumed by it (a free).
+    int64_t consumedBlocks = 0;
+    for (const Arg& a : args)
+        if (a.consumed) consumedBlocks += a.maker ? a.maker->blocksLeft : 1;
     // pointers the allocators return
     if (ex.result == Result::Pointer && result != 0 && family && family->resultFreer &&
         matchesPattern(ex.name, family->freedResults)) {
@@ -1472,11 +1478,18 @@ void CallState::oracle(int64_t liveBefore, const std::vector<uint8_t>&) {
             f->invoke(entries[f->index], &s);
         }
     }
-    releaseObjects();
+    // The call's own object goes first: with it freed, every block the call
+    // took must be back, and those of the objects it consumed gone.
+    if (madeObject && !keepObject) {
+        std::string why;
+        if (!freeObject(madeKind, madeObject, why)) fail(why);
+        madeObject = nullptr;
+    }
     if (opt.allocations && !keepObject) {
-        const int64_t left = opt.allocations->live() - liveBefore;
+        const int64_t left = opt.allocations->live() - liveBefore + consumedBlocks;
         if (left != 0) fail("left " + std::to_string(left) + " block(s) allocated");
     }
+    releaseObjects();
 }
 
 }  // namespace

@@ -2,31 +2,17 @@
 
 #include <cstdlib>
 
-#include "frame/cpu.h"
 #include "frame/dispatch.h"
 #include "frame/memory.h"
+#include "tests/support/variants.h"
 
 namespace zf {
-
-namespace {
-bool variantRuns(int k) {
-    const zor::cpu::Regs l1 = zor::cpu::cpuid(1, 0);
-    switch (k) {
-    case 0: return true;
-    case 1: return (l1.edx >> 25) & 1;
-    case 2: return (l1.edx >> 26) & 1;
-    case 3: return l1.ecx & 1;
-    case 4: return (l1.ecx >> 9) & 1;
-    default: return false;
-    }
-}
-}  // namespace
 
 std::vector<Entries> variantEntries() {
     const zor::dispatch::Table t = zor::dispatch::libraryTable();
     std::vector<Entries> all(5);
     for (int k = 0; k < 5; ++k) {
-        if (!variantRuns(k)) continue;
+        if (!zt::variantSupported(k)) continue;
         for (int r = 0; r < t.count; ++r) all[k].push_back(reinterpret_cast<Entry>(t.rows[r].entry[k]));
     }
     return all;
