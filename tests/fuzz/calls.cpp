@@ -961,6 +961,7 @@ void CallState::decode(Source& src) {
             pointerChoice();
             int64_t n = p.extent;
             if (rule && rule->planes) n = rule->planes(*this, -1);
+            if (n > 4096) a.null = a.overLimit = true;  // an array of that many planes: over the limit
             n = std::max<int64_t>(0, std::min<int64_t>(n, 4096));
             for (int64_t e = 0; e < n; ++e) {
                 const uint8_t b = e < 16 ? src.select() : 0;
