@@ -58,7 +58,7 @@ constexpr int64_t scaleRound(int64_t r, int scaleFactor) {
         const int64_t half = (int64_t(1) << (scaleFactor - 1)) - 1;
         return (r + half + ((r >> scaleFactor) & 1)) >> scaleFactor;
     }
-    const int s = -scaleFactor;
+    const int s = scaleFactor < -62 ? 62 : -scaleFactor;  // (INT_MIN has no negation)
     if (r == 0) return 0;
     if (s >= 62) return r > 0 ? std::numeric_limits<int64_t>::max()
                               : std::numeric_limits<int64_t>::min();
