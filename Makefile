@@ -7,7 +7,7 @@
 JOBS ?= $(shell nproc 2>/dev/null || echo 2)
 CMAKE ?= cmake
 
-.PHONY: all setup native asan win demo test test-native test-asan test-win test-tsan bench fuzz fuzz-seeds clean
+.PHONY: all setup native asan win demo test test-native test-asan test-win test-tsan bench dist fuzz fuzz-seeds clean
 
 all: native
 
@@ -34,8 +34,12 @@ asan: setup build-asan/CMakeCache.txt
 win: setup build-win/CMakeCache.txt
 	$(CMAKE) --build build-win -j $(JOBS)
 
-demo: native
-	./build/zor_demo
+# The gallery: every family on the bundled photograph and speech clip,
+# written to build/gallery/ (open index.html).  Builds only the library and
+# the tool.
+demo: setup build/CMakeCache.txt
+	$(CMAKE) --build build -j $(JOBS) --target zor_tool
+	./build/tools/zor demo --out build/gallery
 
 test-native: native
 	cd build && ctest --output-on-failure
@@ -60,6 +64,12 @@ BENCH_REPEAT ?= --benchmark_repetitions=3 --benchmark_enable_random_interleaving
 bench: native
 	./build/bench/zor_bench $(BENCH_REPEAT) $(BENCH_ARGS)
 
+# The release archives in dist/: a Linux tarball from build/ and a Windows
+# zip (DLL, import library, .def, header, README) from build-win/.
+dist: native win
+	$(CMAKE) -DNATIVE=build -DWIN=build-win -DSOURCE=. -DOUT=dist -P cmake/Dist.cmake
+
+
 # The libFuzzer target for FUZZ_SECONDS, growing build-fuzz/corpus from the
 # seeds (`make fuzz-seeds`: the argument sets of the unit tests).  Calls made
 # and anything found are printed at the end; a finding leaves crash-* files.
@@ -75,4 +85,4 @@ fuzz-seeds: native build-fuzz/CMakeCache.txt
 	./build/tests/fuzz/zor_calls --encode build/recorded-calls.txt build-fuzz/seeds
 
 clean:
-	rm -rf build build-asan build-win build-tsan build-fuzz
+	rm -rf build build-asan build-win build-tsan build-fuzz dist

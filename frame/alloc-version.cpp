@@ -9,7 +9,7 @@
 
 namespace zor { namespace ZOR_NS {
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 namespace {
 
 // Signal blocks: length elements of Bytes bytes (the byte count wraps in
@@ -63,7 +63,7 @@ int16_t* ZOR_CALL zoriMalloc_16s_C3(int w, int h, int* s) { return imageAlloc<in
 uint8_t* ZOR_CALL zoriMalloc_8u_C3(int w, int h, int* s) { return imageAlloc<uint8_t, 3>(w, h, s); }
 float* ZOR_CALL zoriMalloc_32f_C3(int w, int h, int* s) { return imageAlloc<float, 3>(w, h, s); }
 void ZOR_CALL zoriFree(void* ptr) { mem::alignedFree(ptr); }
-#endif  // ZOR_VARIANT == 0
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 
 namespace {
 #if ZOR_VARIANT == 0

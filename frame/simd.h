@@ -15,16 +15,22 @@
 // What exists in which column:
 //   ZOR_SIMD >= 1  float lanes
 //   ZOR_SIMD >= 2  every lane type
-//   ZOR_SIMD >= 4  shuffleBytes, alignBytes, mulAddPairs on bytes, mulHiRound
-//                  (and abs/sign without emulation)
+//   ZOR_SIMD >= 4  shuffleBytes, mulAddPairs on bytes, mulHiRound (and abs,
+//                  alignBytes without emulation)
 // simd::kHas<T> tells a template whether Vec<T> exists in this column.
 //
 // Lane order.  Operations act lane by lane and keep lane order, except those
 // marked "per 16-byte block": widenLo/widenHi, narrow*, zipLo/zipHi,
-// shuffleBytes, alignBytes and shiftBytes* work within each 16-byte block
-// of a wider register, as the hardware does.  widenLo/widenHi followed by
-// narrow* restores the original order at every width, so kernels that widen,
-// compute and narrow back need not care.
+// concatEven/concatOdd, transpose4, addPairs, shuffleBytes, alignBytes and
+// shiftBytes* work within each 16-byte block of a wider register, as the
+// hardware does.  widenLo/widenHi followed by narrow* restores the original
+// order at every width, so kernels that widen, compute and narrow back need
+// not care; loadWidened and reverseLanes keep (reverse) the order of the
+// whole register.
+//
+// A kernel whose result depends on the width (a fixed accumulation order,
+// lanes counted out per 16-byte block, a byte-shuffle table) names it:
+// Vec<T, 16>.  It then runs at 16 bytes in every column, wider ones too.
 //
 // Every operation is exact and defined for every input; float operations
 // follow IEEE rules lane by lane (min/max: the second operand when either is
@@ -74,18 +80,31 @@ constexpr T avg(T a, T b) {
     static_assert(std::is_unsigned_v<T> && sizeof(T) <= 2, "rounding average of unsigned lanes");
     return T((unsigned(a) + unsigned(b) + 1) >> 1);
 }
+// (a b + 2^14) >> 15 of 16-bit lanes (the low 16 bits of it).
+constexpr int16_t mulHiRound(int16_t a, int16_t b) { return int16_t((int(a) * b + 0x4000) >> 15); }
 // |a - b| of unsigned lanes.
 template <class T>
 constexpr T absDiff(T a, T b) {
     static_assert(std::is_unsigned_v<T>, "absolute difference of unsigned lanes");
     return a > b ? T(a - b) : T(b - a);
 }
-// |a| of signed lanes; the lowest value stays as it is.
+// |a| of signed lanes; the lowest value stays as it is.  Floats: the sign
+// bit cleared.
 template <class T>
-constexpr T abs(T a) {
+inline T abs(T a) {
     static_assert(std::is_signed_v<T>, "absolute value of signed lanes");
-    if constexpr (std::is_integral_v<T>) return a < 0 ? T(0u - static_cast<std::make_unsigned_t<T>>(a)) : a;
-    else return a < 0 ? -a : a;
+    if constexpr (std::is_integral_v<T>) {
+        return a < 0 ? T(0u - static_cast<std::make_unsigned_t<T>>(a)) : a;
+    } else {
+        // the sign bit cleared, -0 and NaNs included, in integer registers
+        // (an x87 load would quiet a signalling NaN)
+        using U = std::conditional_t<sizeof(T) == 4, uint32_t, uint64_t>;
+        U u;
+        std::memcpy(&u, &a, sizeof u);
+        u &= ~(U(1) << (8 * sizeof(T) - 1));
+        std::memcpy(&a, &u, sizeof u);
+        return a;
+    }
 }
 // Comparisons give bool on lanes, masks on registers; select takes either.
 template <class T>
@@ -196,6 +215,27 @@ constexpr int lanesOf() {
 template <int Bytes>
 struct Isa;  // the instructions of one register width
 
+#if ZOR_SIMD >= 4
+// Shuffle masks between a 48-byte interleaved block of three byte channels
+// and three channel registers: m[3 k + r] takes register r's share of
+// output k (loadInterleaved3 / storeInterleaved3).
+struct InterleaveMasks {
+    uint8_t m[9][16];
+};
+constexpr InterleaveMasks interleaveMasks(bool toInterleaved) {
+    InterleaveMasks t{};
+    for (int k = 0; k < 3; ++k)
+        for (int r = 0; r < 3; ++r)
+            for (int j = 0; j < 16; ++j) {
+                // loading: output k = channel k, byte j from block byte 3j + k;
+                // storing: output k = block register k, byte j = channel (16k+j) % 3
+                const int from = toInterleaved ? ((16 * k + j) / 3) + 16 * ((16 * k + j) % 3) : 3 * j + k;
+                t.m[3 * k + r][j] = from / 16 == r ? static_cast<uint8_t>(from % 16) : uint8_t(0x80);
+            }
+    return t;
+}
+#endif
+
 #if ZOR_SIMD >= 1
 // ---- 16-byte registers: SSE ... SSSE3 ---------------------------------------
 template <>
@@ -249,8 +289,14 @@ struct Isa<16> {
     // The lower half of a register from memory, the upper half zero.
     template <class T>
     static R<T> loadHalf(const T* p) {
-        if constexpr (isF<T>)
+        if constexpr (isF<T>) {
+            // movq from SSE2 on: no dependency on an older register value
+#  if ZOR_SIMD >= 2
+            return _mm_castsi128_ps(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+#  else
             return _mm_loadl_pi(_mm_setzero_ps(), reinterpret_cast<const __m64*>(p));
+#  endif
+        }
 #  if ZOR_SIMD >= 2
         else if constexpr (isD<T>) return _mm_load_sd(p);
         else return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(p));
@@ -584,8 +630,8 @@ struct Isa<16> {
         else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, uint16_t>) {
             // clamp to 0..65535, move into the signed range, pack, move back
             const __m128i bias = _mm_set1_epi32(32768), zero = _mm_setzero_si128();
-            const __m128i l = _mm_sub_epi32(select<int32_t>(_mm_cmpgt_epi32(lo, zero), lo, zero), bias);
-            const __m128i h = _mm_sub_epi32(select<int32_t>(_mm_cmpgt_epi32(hi, zero), hi, zero), bias);
+            const __m128i l = _mm_sub_epi32(_mm_and_si128(lo, _mm_cmpgt_epi32(lo, zero)), bias);
+            const __m128i h = _mm_sub_epi32(_mm_and_si128(hi, _mm_cmpgt_epi32(hi, zero)), bias);
             return _mm_xor_si128(_mm_packs_epi32(l, h), _mm_set1_epi16(short(0x8000)));
         } else static_assert(sizeof(To) == 0, "no such saturating narrowing");
     }
@@ -601,25 +647,6 @@ struct Isa<16> {
             return _mm_packs_epi32(l, h);
         } else static_assert(sizeof(To) == 0, "no such truncating narrowing");
     }
-    // Interleaves the lower (upper) halves of a and b: a0 b0 a1 b1 ...
-    template <class T>
-    static R<T> zipLo(R<T> a, R<T> b) {
-        if constexpr (isF<T>) return _mm_unpacklo_ps(a, b);
-        else if constexpr (isD<T>) return _mm_unpacklo_pd(a, b);
-        else if constexpr (sizeof(T) == 1) return _mm_unpacklo_epi8(a, b);
-        else if constexpr (sizeof(T) == 2) return _mm_unpacklo_epi16(a, b);
-        else if constexpr (sizeof(T) == 4) return _mm_unpacklo_epi32(a, b);
-        else return _mm_unpacklo_epi64(a, b);
-    }
-    template <class T>
-    static R<T> zipHi(R<T> a, R<T> b) {
-        if constexpr (isF<T>) return _mm_unpackhi_ps(a, b);
-        else if constexpr (isD<T>) return _mm_unpackhi_pd(a, b);
-        else if constexpr (sizeof(T) == 1) return _mm_unpackhi_epi8(a, b);
-        else if constexpr (sizeof(T) == 2) return _mm_unpackhi_epi16(a, b);
-        else if constexpr (sizeof(T) == 4) return _mm_unpackhi_epi32(a, b);
-        else return _mm_unpackhi_epi64(a, b);
-    }
     // pmaddwd: a0 b0 + a1 b1 of neighbouring 16-bit lanes, as 32-bit lanes.
     static __m128i mulAddPairs16(__m128i a, __m128i b) { return _mm_madd_epi16(a, b); }
     // psadbw: per 8 bytes the sum of |a - b|, in the low 16 bits of a 64-bit lane.
@@ -631,6 +658,108 @@ struct Isa<16> {
     static __m128i shiftBytesDown(__m128i a) { return _mm_srli_si128(a, N); }
     // One bit per byte, lane order.
     static int byteMask(__m128i a) { return _mm_movemask_epi8(a); }
+    // Bytes N .. N+15 of the 32-byte value hi:lo (per 16-byte block):
+    // palignr from SSSE3; before it a shuffle of halves (N = 8) or two byte
+    // shifts.
+    template <int N, class T>
+    static R<T> alignBytes(R<T> hi, R<T> lo) {
+        static_assert(N >= 0 && N <= 16, "alignBytes takes 0 .. 16 bytes");
+        if constexpr (N == 0) {
+            return lo;
+        } else if constexpr (N == 16) {
+            return hi;
+        } else if constexpr (N == 8 && !isInt<T>) {  // float lanes stay in the float unit
+            const __m128d h = bitcast<double, T>(hi), l = bitcast<double, T>(lo);
+            return bitcast<T, double>(_mm_shuffle_pd(l, h, 1));
+        } else {
+            const __m128i h = bitcast<int32_t, T>(hi), l = bitcast<int32_t, T>(lo);
+#    if ZOR_SIMD >= 4
+            return bitcast<T, int32_t>(_mm_alignr_epi8(h, l, N));
+#    else
+            if constexpr (N == 8)
+                return bitcast<T, int32_t>(_mm_castpd_si128(_mm_shuffle_pd(_mm_castsi128_pd(l), _mm_castsi128_pd(h), 1)));
+            else
+                return bitcast<T, int32_t>(_mm_or_si128(_mm_srli_si128(l, N), _mm_slli_si128(h, 16 - N)));
+#    endif
+        }
+    }
+
+    // Sums of neighbouring 32-bit lanes: a0+a1, a2+a3, b0+b1, b2+b3.
+    template <class T>
+    static R<T> addPairs(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "pair sums of 32-bit lanes");
+        if constexpr (isF<T>) {
+#    if ZOR_SIMD >= 3
+            return _mm_hadd_ps(a, b);
+#    else
+            return _mm_add_ps(_mm_shuffle_ps(a, b, 0x88), _mm_shuffle_ps(a, b, 0xDD));
+#    endif
+        } else {
+#    if ZOR_SIMD >= 4
+            return _mm_hadd_epi32(a, b);
+#    else
+            const __m128 x = _mm_castsi128_ps(a), y = _mm_castsi128_ps(b);
+            return _mm_add_epi32(_mm_castps_si128(_mm_shuffle_ps(x, y, 0x88)),
+                                 _mm_castps_si128(_mm_shuffle_ps(x, y, 0xDD)));
+#    endif
+        }
+    }
+
+    // Three interleaved byte channels, 48 bytes a0 b0 c0 a1 b1 c1 ..., as
+    // three registers of 16 lanes each, and back.
+    static void loadInterleaved3(const uint8_t* p, __m128i& a, __m128i& b, __m128i& c) {
+        const __m128i v0 = load<uint8_t>(p), v1 = load<uint8_t>(p + 16), v2 = load<uint8_t>(p + 32);
+#    if ZOR_SIMD >= 4
+        // byte j of channel k is byte 3j + k of the block: three shuffles each
+        alignas(16) static constexpr auto masks = interleaveMasks(false);
+        const __m128i* m = reinterpret_cast<const __m128i*>(masks.m);
+        __m128i out[3];
+        for (int k = 0; k < 3; ++k)
+            out[k] = _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(v0, m[3 * k]), _mm_shuffle_epi8(v1, m[3 * k + 1])),
+                                  _mm_shuffle_epi8(v2, m[3 * k + 2]));
+        a = out[0], b = out[1], c = out[2];
+#    else
+        // Four rounds of one fixed byte interleaving of the 48 bytes leave
+        // every third byte together (the permutation's fourth power).
+        __m128i x[3] = {v0, v1, v2};
+        for (int round = 0; round < 4; ++round) {
+            const __m128i y0 = _mm_unpacklo_epi8(x[0], _mm_unpackhi_epi64(x[1], x[1]));
+            const __m128i y1 = _mm_unpacklo_epi8(_mm_unpackhi_epi64(x[0], x[0]), x[2]);
+            const __m128i y2 = _mm_unpacklo_epi8(x[1], _mm_unpackhi_epi64(x[2], x[2]));
+            x[0] = y0, x[1] = y1, x[2] = y2;
+        }
+        a = x[0], b = x[1], c = x[2];
+#    endif
+    }
+    static void storeInterleaved3(uint8_t* p, __m128i a, __m128i b, __m128i c) {
+#    if ZOR_SIMD >= 4
+        alignas(16) static constexpr auto masks = interleaveMasks(true);
+        const __m128i* m = reinterpret_cast<const __m128i*>(masks.m);
+        const __m128i in[3] = {a, b, c};
+        for (int r = 0; r < 3; ++r)
+            store<uint8_t>(p + 16 * r, _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(in[0], m[3 * r]),
+                                                                 _mm_shuffle_epi8(in[1], m[3 * r + 1])),
+                                                    _mm_shuffle_epi8(in[2], m[3 * r + 2])));
+#    else
+        // The rounds of loadInterleaved3 undone: each takes the even and the
+        // odd bytes of the registers apart again.
+        const __m128i low = _mm_set1_epi16(0x00FF);
+        const auto even = [&](__m128i u, __m128i v) {
+            return _mm_packus_epi16(_mm_and_si128(u, low), _mm_and_si128(v, low));
+        };
+        __m128i x[3] = {a, b, c};
+        for (int round = 0; round < 4; ++round) {
+            const __m128i o0 = _mm_srli_epi16(x[0], 8), o1 = _mm_srli_epi16(x[1], 8), o2 = _mm_srli_epi16(x[2], 8);
+            const __m128i y0 = even(x[0], x[1]);
+            const __m128i y1 = _mm_packus_epi16(_mm_and_si128(x[2], low), o0);
+            const __m128i y2 = _mm_packus_epi16(o1, o2);
+            x[0] = y0, x[1] = y1, x[2] = y2;
+        }
+        store<uint8_t>(p, x[0]);
+        store<uint8_t>(p + 16, x[1]);
+        store<uint8_t>(p + 32, x[2]);
+#    endif
+    }
 
     // -- conversions
     static __m128 int32ToFloat(__m128i a) { return _mm_cvtepi32_ps(a); }
@@ -648,6 +777,17 @@ struct Isa<16> {
     static __m128i doubleToInt32(__m128d lo, __m128d hi) {
         return _mm_unpacklo_epi64(_mm_cvtpd_epi32(lo), _mm_cvtpd_epi32(hi));
     }
+    static __m128i doubleToInt32Trunc(__m128d lo, __m128d hi) {
+        return _mm_unpacklo_epi64(_mm_cvttpd_epi32(lo), _mm_cvttpd_epi32(hi));
+    }
+    // a0 + a1, b0 + b1
+    static __m128d addPairs(__m128d a, __m128d b) {
+#    if ZOR_SIMD >= 3
+        return _mm_hadd_pd(a, b);
+#    else
+        return _mm_add_pd(_mm_unpacklo_pd(a, b), _mm_unpackhi_pd(a, b));
+#    endif
+    }
 #  endif  // ZOR_SIMD >= 2
 
     // Even and odd lanes of the run a0 .. a3 b0 .. b3 (float lanes).
@@ -662,6 +802,30 @@ struct Isa<16> {
     // Four registers of four float lanes as the rows of a square, transposed.
     static void transpose(__m128 (&r)[4]) { _MM_TRANSPOSE4_PS(r[0], r[1], r[2], r[3]); }
 
+    // Interleaves the lower (upper) halves of a and b: a0 b0 a1 b1 ...
+    template <class T>
+    static R<T> zipLo(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_unpacklo_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_unpacklo_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_unpacklo_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_unpacklo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_unpacklo_epi32(a, b);
+        else return _mm_unpacklo_epi64(a, b);
+#  endif
+    }
+    template <class T>
+    static R<T> zipHi(R<T> a, R<T> b) {
+        if constexpr (isF<T>) return _mm_unpackhi_ps(a, b);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_unpackhi_pd(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm_unpackhi_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm_unpackhi_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm_unpackhi_epi32(a, b);
+        else return _mm_unpackhi_epi64(a, b);
+#  endif
+    }
+
     // One bit per lane of 32 or 64-bit lanes (their sign bits).
     template <class T>
     static int laneMask(R<T> a) {
@@ -675,9 +839,128 @@ struct Isa<16> {
 #  endif
     }
 
+    // The lanes of a mask as bits (one per byte for integer lanes, one per
+    // lane for float and double), and the value with every lane set.
+    template <class T>
+    static int maskBits(R<T> m) {
+        if constexpr (isF<T>) return _mm_movemask_ps(m);
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_movemask_pd(m);
+        else return _mm_movemask_epi8(m);
+#  endif
+    }
+    template <class T>
+    static constexpr int kMaskBitsPerLane = isInt<T> ? int(sizeof(T)) : 1;
+    template <class T>
+    static constexpr int kMaskFull = (1 << (16 / sizeof(T) * kMaskBitsPerLane<T>)) - 1;
+    template <class T>
+    static bool anyTrue(R<T> m) { return maskBits<T>(m) != 0; }
+    template <class T>
+    static bool allTrue(R<T> m) { return maskBits<T>(m) == kMaskFull<T>; }
+    // The first set lane of a mask, the lane count when none is.
+    template <class T>
+    static int firstTrue(R<T> m) {
+        return __builtin_ctz(unsigned(maskBits<T>(m)) | (unsigned(kMaskFull<T>) + 1u)) / kMaskBitsPerLane<T>;
+    }
+
+    // Lane I as a scalar.
+    template <int I, class T>
+    static T getLane(R<T> a) {
+        static_assert(I >= 0 && I < 16 / int(sizeof(T)), "lane index out of range");
+        if constexpr (isF<T>) return _mm_cvtss_f32(I == 0 ? a : _mm_shuffle_ps(a, a, I));
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_cvtsd_f64(I == 0 ? a : _mm_unpackhi_pd(a, a));
+        else if constexpr (sizeof(T) == 1) return T(_mm_extract_epi16(a, I / 2) >> (8 * (I % 2)));
+        else if constexpr (sizeof(T) == 2) return T(_mm_extract_epi16(a, I));
+        else if constexpr (sizeof(T) == 4) return T(_mm_cvtsi128_si32(I == 0 ? a : _mm_shuffle_epi32(a, I)));
+#  endif
+        else static_assert(sizeof(T) == 0, "no lane access for 64-bit integers");
+    }
+
+    // Lane order reversed over the whole register.
+    template <class T>
+    static R<T> reverseLanes(R<T> a) {
+        if constexpr (isF<T>) return _mm_shuffle_ps(a, a, _MM_SHUFFLE(0, 1, 2, 3));
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) return _mm_shuffle_pd(a, a, 1);
+        else if constexpr (sizeof(T) == 8) return _mm_shuffle_epi32(a, _MM_SHUFFLE(1, 0, 3, 2));
+        else if constexpr (sizeof(T) == 4) return _mm_shuffle_epi32(a, _MM_SHUFFLE(0, 1, 2, 3));
+#    if ZOR_SIMD >= 4
+        else if constexpr (sizeof(T) == 1)
+            return _mm_shuffle_epi8(a, _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
+#    endif
+        else {
+            const __m128i w = _mm_shufflehi_epi16(
+                _mm_shufflelo_epi16(_mm_shuffle_epi32(a, _MM_SHUFFLE(0, 1, 2, 3)), _MM_SHUFFLE(2, 3, 0, 1)),
+                _MM_SHUFFLE(2, 3, 0, 1));
+            if constexpr (sizeof(T) == 2) return w;
+            else return _mm_or_si128(_mm_slli_epi16(w, 8), _mm_srli_epi16(w, 8));  // bytes of each word swapped
+        }
+#  endif
+    }
+    // Per 16-byte block: lanes 0 and 2 (1 and 3) of a, then those of b, of
+    // 32-bit lanes.
+    template <class T>
+    static R<T> concatEven(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatEven of 32-bit lanes");
+        if constexpr (isF<T>) return _mm_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+#  if ZOR_SIMD >= 2
+        else return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), _MM_SHUFFLE(2, 0, 2, 0)));
+#  endif
+    }
+    template <class T>
+    static R<T> concatOdd(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatOdd of 32-bit lanes");
+        if constexpr (isF<T>) return _mm_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+#  if ZOR_SIMD >= 2
+        else return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), _MM_SHUFFLE(3, 1, 3, 1)));
+#  endif
+    }
+    // Per 16-byte block: the 4 x 4 matrix of 32-bit lanes in a, b, c, d
+    // (rows) transposed.
+    template <class T>
+    static void transpose4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        static_assert(sizeof(T) == 4, "transpose4 of 32-bit lanes");
+        if constexpr (isF<T>) {
+            _MM_TRANSPOSE4_PS(a, b, c, d);
+        }
+#  if ZOR_SIMD >= 2
+        else {
+            const __m128i t0 = _mm_unpacklo_epi32(a, b), t1 = _mm_unpackhi_epi32(a, b);
+            const __m128i t2 = _mm_unpacklo_epi32(c, d), t3 = _mm_unpackhi_epi32(c, d);
+            a = _mm_unpacklo_epi64(t0, t2);
+            b = _mm_unpackhi_epi64(t0, t2);
+            c = _mm_unpacklo_epi64(t1, t3);
+            d = _mm_unpackhi_epi64(t1, t3);
+        }
+#  endif
+    }
+    // About 12 bits of 1/a (rcpps).
+    static __m128 recipApprox(__m128 a) { return _mm_rcp_ps(a); }
+
+    // The float sums of reduceAdd through addss/addsd, which keep the
+    // left operand first (the compiler may swap the operands of a plain +).
+    template <class T>
+    static T reduceAdd(R<T> a) {
+        if constexpr (isF<T>) {
+            const __m128 hi = _mm_movehl_ps(a, a);                                     // l2 l3
+            const __m128 s02 = _mm_add_ss(a, hi);                                      // l0 + l2
+            const __m128 s13 = _mm_add_ss(_mm_shuffle_ps(a, a, 1), _mm_shuffle_ps(hi, hi, 1));  // l1 + l3
+            return _mm_cvtss_f32(_mm_add_ss(s02, s13));
+        }
+#  if ZOR_SIMD >= 2
+        else if constexpr (isD<T>) {
+            return _mm_cvtsd_f64(_mm_add_sd(a, _mm_unpackhi_pd(a, a)));
+        }
+#  endif
+        else static_assert(sizeof(T) == 0, "reduceAdd of float lanes here");
+    }
+
     // Reinterprets the bits.
     template <class To, class From>
     static R<To> bitcast(R<From> a) {
+        // (compared by lane kind: naming __m128i as a template argument drops
+        // its attributes, which the compiler warns about)
         if constexpr (std::is_same_v<To, From> || (isInt<To> && isInt<From>)) return a;
 #  if ZOR_SIMD >= 2
         else if constexpr (isF<To> && isD<From>) return _mm_castpd_ps(a);
@@ -694,16 +977,22 @@ struct Isa<16> {
     // pshufb: byte i of the result is table[idx[i] & 15], or 0 where idx[i]
     // has its top bit set (per 16-byte block).
     static __m128i shuffleBytes(__m128i table, __m128i idx) { return _mm_shuffle_epi8(table, idx); }
-    // palignr: bytes N .. N+15 of the 32-byte value hi:lo (per 16-byte block).
-    template <int N>
-    static __m128i alignBytes(__m128i hi, __m128i lo) { return _mm_alignr_epi8(hi, lo, N); }
     // pmaddubsw: u0 s0 + u1 s1 of neighbouring bytes (unsigned times signed),
     // saturated to 16 bits.
     static __m128i mulAddPairs8(__m128i u, __m128i s) { return _mm_maddubs_epi16(u, s); }
-    // pmulhrsw: (a b + 2^14) >> 15 of 16-bit lanes.
-    static __m128i mulHiRound(__m128i a, __m128i b) { return _mm_mulhrs_epi16(a, b); }
 #  endif
 #  if ZOR_SIMD >= 2
+    // pmulhrsw: (a b + 2^14) >> 15 of 16-bit lanes.  Before SSSE3 from the
+    // product's halves: 2 hi + ((lo >> 14) + 1) >> 1, lo taken unsigned.
+    static __m128i mulHiRound(__m128i a, __m128i b) {
+#    if ZOR_SIMD >= 4
+        return _mm_mulhrs_epi16(a, b);
+#    else
+        const __m128i hi = _mm_mulhi_epi16(a, b);
+        const __m128i q = _mm_srli_epi16(_mm_mullo_epi16(a, b), 14);
+        return _mm_add_epi16(_mm_add_epi16(hi, hi), _mm_srli_epi16(_mm_add_epi16(q, _mm_set1_epi16(1)), 1));
+#    endif
+    }
     template <class T>
     static __m128i abs(__m128i a) {
 #    if ZOR_SIMD >= 4
@@ -759,6 +1048,17 @@ template <class V, class U>
 inline V loadFrom(const U* p) { return load<V>(reinterpret_cast<const typename V::Lane*>(p)); }
 template <class T, int B, class U>
 inline void storeTo(U* p, Vec<T, B> v) { store(reinterpret_cast<T*>(p), v); }
+
+// N consecutive registers from memory of any lane type, and back: blocks
+// that span several registers (48 bytes of three-channel pixels).
+template <class V, int N, class U>
+inline void loadBlock(const U* p, V (&v)[N]) {
+    for (int i = 0; i < N; ++i) v[i] = loadFrom<V>(reinterpret_cast<const uint8_t*>(p) + i * V::kBytes);
+}
+template <class T, int B, int N, class U>
+inline void storeBlock(U* p, const Vec<T, B> (&v)[N]) {
+    for (int i = 0; i < N; ++i) storeTo(reinterpret_cast<uint8_t*>(p) + i * B, v[i]);
+}
 
 template <class T, int B>
 inline Vec<T, B> operator+(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template add<T>(a.raw, b.raw)}; }
@@ -832,8 +1132,39 @@ inline Vec<T, B> select(Vec<T, B> mask, Vec<T, B> a, Vec<T, B> b) {
 // lane's sign; bytes: one bit per byte).
 template <class T, int B>
 inline int laneMask(Vec<T, B> a) { return Isa<B>::template laneMask<T>(a.raw); }
+// Tests of masks (lanes all ones or all zeros).
 template <class T, int B>
-inline bool anyTrue(Vec<T, B> mask) { return laneMask(mask) != 0; }
+inline bool anyTrue(Vec<T, B> mask) { return Isa<B>::template anyTrue<T>(mask.raw); }
+template <class T, int B>
+inline bool allTrue(Vec<T, B> mask) { return Isa<B>::template allTrue<T>(mask.raw); }
+// The index of the first set lane of a mask, kLanes when none is set.
+template <class T, int B>
+inline int firstTrue(Vec<T, B> mask) { return Isa<B>::template firstTrue<T>(mask.raw); }
+
+// Lane I as a scalar (8, 16 and 32-bit integers, float, double).
+template <int I, class T, int B>
+inline T getLane(Vec<T, B> a) { return Isa<B>::template getLane<I, T>(a.raw); }
+// The lanes in reverse order (over the whole register).
+template <class T, int B>
+inline Vec<T, B> reverseLanes(Vec<T, B> a) { return {Isa<B>::template reverseLanes<T>(a.raw)}; }
+// Per 16-byte block, 32-bit lanes: a0 a2 b0 b2 (concatEven), a1 a3 b1 b3
+// (concatOdd): interleaved pairs split apart.
+template <class T, int B>
+inline Vec<T, B> concatEven(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template concatEven<T>(a.raw, b.raw)}; }
+template <class T, int B>
+inline Vec<T, B> concatOdd(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template concatOdd<T>(a.raw, b.raw)}; }
+// Per 16-byte block, 32-bit lanes: the 4 x 4 matrix whose rows are a, b, c,
+// d, transposed in place.
+template <class T, int B>
+inline void transpose4(Vec<T, B>& a, Vec<T, B>& b, Vec<T, B>& c, Vec<T, B>& d) {
+    Isa<B>::template transpose4<T>(a.raw, b.raw, c.raw, d.raw);
+}
+// An estimate of 1/a with a relative error below 1.5 * 2^-12.
+template <int B>
+inline Vec<float, B> recipApprox(Vec<float, B> a) { return {Isa<B>::recipApprox(a.raw)}; }
+// Per 16-byte block: a0 + a1, b0 + b1 of double lanes.
+template <int B>
+inline Vec<double, B> addPairs(Vec<double, B> a, Vec<double, B> b) { return {Isa<B>::addPairs(a.raw, b.raw)}; }
 template <class V, std::enable_if_t<!std::is_arithmetic_v<V>, int> = 0>
 inline V asLanes(V mask) { return mask; }
 
@@ -879,6 +1210,14 @@ inline Vec<To, B> narrowSat(Vec<From, B> lo, Vec<From, B> hi) {
     if constexpr (std::is_same_v<From, double>) return {Isa<B>::doubleToFloat(lo.raw, hi.raw)};
     else return {Isa<B>::template narrowSat<To, From>(lo.raw, hi.raw)};
 }
+// V::kLanes values of the lane type half as wide from p, widened in order
+// (zero- or sign-extended by N's signedness; floats to double).
+template <class V, class N>
+inline V loadWidened(const N* p) {
+    static_assert(sizeof(N) * 2 == sizeof(typename V::Lane), "loadWidened doubles the lane size");
+    static_assert(V::kBytes == 16, "wider registers widen across blocks: give their Isa a loadWidened");
+    return bitcast<typename V::Lane>(widenLo(loadHalf<Vec<N, V::kBytes>>(p)));
+}
 // Per 16-byte block: keeps the low bits of every lane.
 template <class To, class From, int B>
 inline Vec<To, B> narrowTrunc(Vec<From, B> lo, Vec<From, B> hi) {
@@ -903,10 +1242,16 @@ template <int B>
 inline Vec<double, B> toDoubleLo(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleLo(a.raw)}; }
 template <int B>
 inline Vec<double, B> toDoubleHi(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleHi(a.raw)}; }
-// Two registers of doubles into one of 32-bit integers (rounded by MXCSR).
+// Two registers of doubles into one of 32-bit integers (rounded by MXCSR,
+// or truncated); INT_MIN for NaN and out-of-range lanes.
 template <int B>
 inline Vec<int32_t, B> toInt32(Vec<double, B> lo, Vec<double, B> hi) {
     return {Isa<B>::doubleToInt32(lo.raw, hi.raw)};
+}
+// The same, rounded toward zero whatever MXCSR says.
+template <int B>
+inline Vec<int32_t, B> toInt32Trunc(Vec<double, B> lo, Vec<double, B> hi) {
+    return {Isa<B>::doubleToInt32Trunc(lo.raw, hi.raw)};
 }
 
 // Neighbouring 16-bit lanes multiplied and summed into 32-bit lanes.
@@ -929,6 +1274,19 @@ template <int B>
 inline Vec<uint64_t, B> sumAbsDiff(Vec<uint8_t, B> a, Vec<uint8_t, B> b) {
     return {Isa<B>::sumAbsDiff8(a.raw, b.raw)};
 }
+// Per 16-byte block: sums of neighbouring 32-bit lanes, a's pairs then b's.
+template <class T, int B>
+inline Vec<T, B> addPairs(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template addPairs<T>(a.raw, b.raw)}; }
+// Three interleaved byte channels (a0 b0 c0 a1 ...: 3 * kLanes bytes) to
+// three registers and back.
+template <int B>
+inline void loadInterleaved3(const uint8_t* p, Vec<uint8_t, B>& a, Vec<uint8_t, B>& b, Vec<uint8_t, B>& c) {
+    Isa<B>::loadInterleaved3(p, a.raw, b.raw, c.raw);
+}
+template <int B>
+inline void storeInterleaved3(uint8_t* p, Vec<uint8_t, B> a, Vec<uint8_t, B> b, Vec<uint8_t, B> c) {
+    Isa<B>::storeInterleaved3(p, a.raw, b.raw, c.raw);
+}
 // Per 16-byte block: byte i is table[idx[i] & 15], zero where idx[i] >= 128.
 template <int B>
 inline Vec<uint8_t, B> shuffleBytes(Vec<uint8_t, B> table, Vec<uint8_t, B> idx) {
@@ -937,7 +1295,7 @@ inline Vec<uint8_t, B> shuffleBytes(Vec<uint8_t, B> table, Vec<uint8_t, B> idx) 
 // Per 16-byte block: bytes N .. N+15 of hi:lo.
 template <int N, class T, int B>
 inline Vec<T, B> alignBytes(Vec<T, B> hi, Vec<T, B> lo) {
-    return {Isa<B>::template alignBytes<N>(hi.raw, lo.raw)};
+    return {Isa<B>::template alignBytes<N, T>(hi.raw, lo.raw)};
 }
 // Per 16-byte block: moves the bytes N places up (towards the last lane),
 // shifting in zeros; shiftBytesDown the other way.
@@ -977,10 +1335,13 @@ inline V fromLanes(const typename V::Lane (&lanes)[V::kLanes]) { return load<V>(
 // ---- horizontal reductions ----------------------------------------------------
 // Integer sums wrap around in the lane type.  Float sums add in a fixed
 // order: lane i and lane i + n/2, halving until one is left, so four lanes
-// give (l0 + l2) + (l1 + l3).  Widen first where a sum needs more range.
+// give (l0 + l2) + (l1 + l3), each addition with its left operand first (the
+// NaN a sum of two NaNs keeps is the left one's, as the scalar a + b of the
+// generic code gives it).  Widen first where a sum needs more range.
 
 template <class T, int B>
 inline T reduceAdd(Vec<T, B> v) {
+    if constexpr (std::is_floating_point_v<T>) return Isa<B>::template reduceAdd<T>(v.raw);
     alignas(64) T l[Vec<T, B>::kLanes];
     storeAligned(l, v);
     for (int half = Vec<T, B>::kLanes / 2; half >= 1; half /= 2)
@@ -1008,18 +1369,27 @@ inline T reduceMax(Vec<T, B> v) {
 // d[i] = op(s[i]) for i < n: a cache line of registers at a time while they
 // fit, then single registers, then one element at a time.  op is called with
 // Vec<S> and with S (a generic lambda over the names above serves both) and
-// gives Vec<D> / D; D and S must have the same size.  Reads every source
-// element before the store of its register, so d == s works.
+// gives Vec<D> / D; D and S must have the same size.  An op that takes lanes
+// only runs lane by lane.  Reads every source element before the store of
+// its register, so d == s works.
 //
 // The sources are requested kPrefetchBytes ahead: with two or three streams
 // at once the processor's own prefetching falls behind (an 8-bit sum of two
 // 1920 x 1080 images from L3 runs about a fifth faster).
 constexpr ptrdiff_t kPrefetchBytes = 1024;
 
+// Whether op takes Arity registers of S (false where the column has none).
+template <class Op, class S, int Arity>
+constexpr bool takesRegisters() {
+    if constexpr (!kHas<S>) return false;
+    else if constexpr (Arity == 1) return std::is_invocable_v<Op&, Vec<S>>;
+    else return std::is_invocable_v<Op&, Vec<S>, Vec<S>>;
+}
+
 template <class D, class S, class Op>
 inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
-    if constexpr (kHas<S> && kHas<D>) {
+    if constexpr (kHas<D> && takesRegisters<Op, S, 1>()) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
         using V = Vec<S>;
         constexpr int L = V::kLanes, R = V::kBytes >= 64 ? 1 : 64 / V::kBytes;  // registers a line
@@ -1037,7 +1407,7 @@ inline void mapLanes(const S* s, D* d, ptrdiff_t n, Op op) {
 template <class D, class S, class Op>
 inline void mapLanes(const S* a, const S* b, D* d, ptrdiff_t n, Op op) {
     ptrdiff_t i = 0;
-    if constexpr (kHas<S> && kHas<D>) {
+    if constexpr (kHas<D> && takesRegisters<Op, S, 2>()) {
         static_assert(sizeof(S) == sizeof(D), "mapLanes keeps the lane count");
         using V = Vec<S>;
         constexpr int L = V::kLanes, R = V::kBytes >= 64 ? 1 : 64 / V::kBytes;

@@ -126,7 +126,8 @@ enum {
     InterNearest = 1,
     InterLinear  = 2,
     InterCubic   = 4,
-    InterSuper   = 8
+    InterSuper   = 8,
+    InterLanczos = 16   /* resize only: 3 lobes, 6 x 6 taps */
 };
 
 /* Mask codes: tens digit is the width, units digit the height. */

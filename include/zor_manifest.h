@@ -16,7 +16,8 @@
  * No include guard: the file is included once per expansion.
  */
 
-/* ---- frame: aligned allocation and version records ---------------- */
+/* ---- frame/alloc-version ----
+ * Aligned allocation and version records. */
 
 ZOR_FN(ZOR_GENERIC, uint8_t*,    zorsMalloc_8u,   (int len))
 ZOR_FN(ZOR_GENERIC, int8_t*,     zorsMalloc_8s,   (int len))
@@ -542,13 +543,313 @@ ZOR_FN(ZOR_GENERIC, Status, zoriMomentFree_64f, (MomentState* pState))
 ZOR_FN(ZOR_SSE2UP,  Status, zoriMoments64f_32f_C1R, (const float* pSrc, int srcStep, ImageSize roiSize, MomentState* pState))
 ZOR_FN(ZOR_GENERIC, Status, zoriGetSpatialMoment_64f, (const MomentState* pState, int mOrd, int nOrd, int nChannel, ImagePoint roiOffset, double* pValue))
 
-/* ---- image/geometry/resize ---- */
+/* ---- image/geometry/resize ----
+ * Arguments: the source pointer is the image origin, srcSize the whole
+ * image, srcRoi a rectangle in it; the destination pointer is the first
+ * pixel of the destination ROI, dstRoiSize its size; factors are
+ * destination / source sizes.
+ *
+ * Checks, in order: a null pointer -8; a dimension of srcSize, srcRoi or
+ * dstRoiSize below 1: -6; a step below 1: -14; the ROI origin outside the
+ * image (x or y negative or at least the image's width / height): warning
+ * 29, nothing written; a factor not above 0 (NaN included): -23;
+ * interpolation other than 1, 2, 4, 8, 16: -22.  The ROI is clipped to the
+ * image.  Work memory that cannot be had: -9, nothing written.
+ *
+ * Mapping: destination pixel i samples x = roi.x + (i + 0.5) / xFactor - 0.5
+ * (pixel centres aligned), likewise y.  Neighbours come from the whole
+ * image and are clamped to its edge pixels.  Nearest (1): the pixel at
+ * floor(x + 0.5).  Linear (2): bilinear.  Cubic (4): Catmull-Rom (a = -0.5),
+ * 4 x 4.  Lanczos (16): 3 lobes, 6 x 6, the weights of each direction
+ * normalised to sum 1.  Super-sampling (8): the area-weighted mean over
+ * [roi.x + i / f, roi.x + (i + 1) / f) x (likewise y), where area beyond
+ * the image counts for the edge pixel; in a direction whose factor is above
+ * 1, linear instead.  Every destination pixel is written.
+ *
+ * Results: 8u and 16u round half up and saturate, within +-1 of the exact
+ * (double) value of the definition; 32f within 1e-5 of the sum of the
+ * magnitudes of the weighted source values (relative to the value where
+ * nothing cancels).  A non-finite 32f source value reaches every output
+ * whose taps include it, even at weight 0.  Every variant gives the same
+ * bits.  How: 8u with at most 8 taps a direction: weights in 1/16384,
+ * rows combined to 1/64 of a level, columns to 1/32, the sum rounded half
+ * up (the fixed-point value stays within 0.32 of the exact one); float
+ * weights and sums formed in tap order in float for 16u with at most 8
+ * taps, 32f with at most 32 and 8u with at most 1024; double beyond.  8u
+ * super-sampling by exactly 0.5 x 0.5 inside the image: (sum of the 2 x 2
+ * pixels + 2) / 4.
+ *
+ * The 8u exports first apply a read guard: with interpolation 8 and an odd
+ * ROI height, when the srcStep bytes after the image (srcSize.height rows
+ * of srcStep bytes) cannot be read, they resize from a copy of the image
+ * with its last row repeated once below it (same arguments otherwise; the
+ * copy's allocation is not checked; no copy is made where srcStep is below
+ * the row's bytes or the copy would pass 2 GiB).  On Linux the probe reads
+ * the own process through process_vm_readv, which reports instead of
+ * faulting.
+ *
+ * zoriResize_8u_C3R in the SSE2, SSE3 and SSSE3 variants, with
+ * interpolation 8 while the marker file (the module's path with its last
+ * extension replaced by "xml") existed at load, takes the alternate
+ * super-sampling instead: no argument is checked and it returns 0, doing
+ * nothing for null pointers, empty sizes or clipped ROIs, factors whose
+ * reciprocal is not a positive finite number, or missing work memory.  rx = (float)(1 / xFactor), likewise ry;
+ * K = trunc(65536 xFactor yFactor); column i covers [s, min(s + rx, w)) with
+ * s = min(max(s0 + i rx, 0), w), s0 = trunc(roi.x xFactor + 0.5) / xFactor
+ * - roi.x, w the clipped ROI width, in ROI coordinates (rows likewise); a
+ * partial first pixel weighs trunc((1 - frac) 256), whole pixels 256, a
+ * partial last pixel trunc(frac 256); row sums are weighted by the row's
+ * weight, shifted right by 8, summed in 32 bits; the output is
+ * (sum K + 2^23) >> 24 stored without a clamp.  Spans keep 16-bit indices
+ * (ROIs up to 65534 pixels a side).
+ *
+ * zoriGetResizeFract: checks sizes (-6), the ROI origin (29), factors not
+ * above 0 (-23; NaN passes), output pointers (-8), interpolation 1, 2, 4,
+ * 16 (-22); fraction = 1 / factor (nearest) or (w - 1) / (factor w - 1)
+ * when factor w > 1, else 0, w the clipped ROI width (height for y).
+ *
+ * zoriResizeShift_8u_C3R: destination pixel i samples
+ * roi.x + (i - xShift) xFr (likewise y), with the engine's checks except
+ * that a fraction of 0 is accepted (every pixel then samples one position;
+ * zoriGetResizeFract gives 0 for a one-pixel ROI).  Super-sampling averages
+ * [x + 0.5 - xFr / 2, x + 0.5 + xFr / 2), linear where xFr is below 1.
+ *
+ * zoriResizeCenter_8u_C1R / _C3R: destination pixel i (relative to pDst)
+ * samples xCenter + (i - xCenter) (1 / xFactor), likewise y, so the point
+ * (xCenter, yCenter) keeps its coordinates; only destination pixels whose
+ * sample lies in the clipped ROI's pixel area [roi.x - 0.5, roi.x + w - 0.5)
+ * in both directions are written; super-sampling averages a footprint of
+ * 1 / factor around the sample, as the shifted resize does.  Checks: pDst
+ * null first, then the engine's; nothing to write: 0. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C1R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C3R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C4R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C1R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C3R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C4R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C1R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C3R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C4R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetResizeFract, (ImageSize srcSize, ImageRect srcRoi, double xFactor, double yFactor, double* pXFr, double* pYFr, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResizeShift_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFr, double yFr, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C1R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
 
-/* ---- image/geometry/rotate ---- */
+/* ---- image/geometry/rotate ----
+ * Rotation by an angle in degrees: the source point (x, y) (image
+ * coordinates, y downwards) goes to
+ *   x' = x c + y s + xShift,   y' = -x s + y c + yShift,
+ * with a = angle - 360 trunc(angle / 360), plus 360 when negative, and
+ * c = cos(a pi / 180), s = sin(a pi / 180); a = 0, 90, 180, 270 take the
+ * exact values (1, 0), (0, 1), (-1, 0), (0, -1), so those rotations carry
+ * no rounding error.  Rotate and RotateCenter are the affine warp of that
+ * matrix (see image/geometry/warp: pointers are image origins, the same
+ * ROIs, checks, interpolation and accuracy rules, a non-finite angle or
+ * shift is a bad coefficient: StatusBadArgument).  RotateCenter takes the
+ * point (xCenter, yCenter) that stays fixed instead of the shifts.
+ * GetRotateShift: the shifts that keep (xCenter, yCenter) fixed:
+ *   a = 0: 0, 0;  90: xc - yc, xc + yc;  180: 2 xc, 2 yc;  270: xc + yc, yc - xc;
+ *   else xShift = (xc - xc c) - yc s,  yShift = (yc - c yc) + s xc,
+ * in double; a null output: StatusNullPointer, nothing else fails.
+ * AddRotateShift adds those shifts to the values in its outputs.
+ * GetRotateBound: bound[0] = {xmin, ymin}, bound[1] = {xmax, ymax} of the
+ * mapped corners (x, y), (x + w - 1, y), (x + w - 1, y + h - 1),
+ * (x, y + h - 1) of srcRoi (not clipped to any image).  Checks: null bound
+ * -8, ROI width or height below 1 -6, a non-finite angle or shift -5;
+ * nothing is written on failure. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_16u_C1R,
+       (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_16u_C3R,
+       (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotate_32f_C3R,
+       (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRotateCenter_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, double angle, double xCenter, double yCenter, int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetRotateShift,
+       (double xCenter, double yCenter, double angle, double* pxShift, double* pyShift))
+ZOR_FN(ZOR_GENERIC, Status, zoriAddRotateShift,
+       (double xCenter, double yCenter, double angle, double* pxShift, double* pyShift))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetRotateBound,
+       (ImageRect srcRoi, double bound[2][2], double angle, double xShift, double yShift))
 
-/* ---- image/geometry/warp ---- */
+/* ---- image/geometry/warp ----
+ * Warps map source image coordinates to destination image coordinates
+ * (x, y: pixel centres at whole numbers, y downwards):
+ *   Affine       x' = c00 x + c01 y + c02,          y' = c10 x + c11 y + c12
+ *   Bilinear     x' = c00 x y + c01 x + c02 y + c03, y' likewise with c1*
+ *   Perspective  x' = (c00 x + c01 y + c02) / (c20 x + c21 y + c22),
+ *                y' = (c10 x + c11 y + c12) / (c20 x + c21 y + c22)
+ * and are inverted internally.  pSrc and pDst point at pixel (0, 0) of
+ * their images; srcRoi and dstRoi are rectangles in them.  srcRoi is
+ * clipped to the srcSize image, dstRoi to x >= 0, y >= 0.  Every
+ * destination pixel of the clipped dstRoi whose source point (the inverse
+ * map in double precision) lies in the closed rectangle of the clipped
+ * srcRoi's pixel centres, [x, x + w - 1] x [y, y + h - 1], is interpolated
+ * there; every other destination pixel is left untouched.  Only pixels of
+ * the clipped srcRoi are read: neighbours outside it are replaced by the
+ * nearest edge pixel of the ROI.
+ * The source point is carried with 32 fraction bits (within 2^-31 of the
+ * double value).  Interpolation:
+ *   InterNearest  the pixel at floor(x + 0.5), floor(y + 0.5);
+ *   InterLinear   bilinear over the 2 x 2 pixels from floor(x), floor(y);
+ *   InterCubic    Catmull-Rom (a = -0.5), separable over 4 x 4 pixels.
+ * Results: 8u and 16u round half up and saturate, within 1 of the exact
+ * double-precision value of the definition (8u linear weighs the pixels with
+ * 14-bit fractions, the point first kept 2^-14 inside the ROI's last pixel
+ * interval: within 0.07 before rounding); 32f within 1e-5 of it relative
+ * to the largest neighbour's magnitude.  Every code variant gives the same
+ * bits.
+ * Checks, first failure wins, nothing written on failure: null pSrc, pDst
+ * or coefficients -8; srcSize, srcRoi or dstRoi with a dimension below 1
+ * -6; a step below 1 -14; interpolation other than 1, 2, 4 -22; bad
+ * coefficients -5: not finite, or singular (affine, perspective: zero
+ * determinant; bilinear: the Jacobian determinant, affine in x and y, not of
+ * one strict sign at the four corners of srcRoi as given, which keeps the
+ * map one-to-one on it); then srcRoi outside srcSize or dstRoi outside
+ * x >= 0, y >= 0: warning StatusWarnNoOperation (29), nothing written.
+ * Work memory that cannot be had: StatusNoMemory.
+ * GetAffineBound: bound[0] = {xmin, ymin}, bound[1] = {xmax, ymax} of the
+ * corners (x, y), (x + w - 1, y), (x + w - 1, y + h - 1), (x, y + h - 1) of
+ * srcRoi mapped by coeffs.  Checks: null -8, ROI dimension below 1 -6, bad
+ * coefficients -5 (as the warp's).
+ * GetAffineTransform, GetBilinearTransform, GetPerspectiveTransform: the
+ * coefficients that map those four corners of srcRoi (clockwise from the
+ * top left) to quad[0] .. quad[3].  The quad must be convex with no three
+ * points on a line (the cross products of consecutive edges of one strict
+ * sign; either orientation, so mirror images are fine).  Affine takes its
+ * coefficients from the first three corners; the fourth must land within
+ * 1e-9 of the quad's extent (its larger side of the bounding box) of
+ * quad[3] in each coordinate.  Perspective coefficients are scaled so that the denominator
+ * is 1 at the top-left corner.  Checks: null quad or coeffs -8, ROI
+ * dimension below 1 -6, a ROI dimension of 1, a non-finite quad, a quad
+ * that breaks the rules above: -5; nothing is written on failure. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_8u_C4R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_32f_C1R,
+       (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpAffine_32f_C3R,
+       (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][3], int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetAffineBound, (ImageRect srcRoi, double bound[2][2], const double coeffs[2][3]))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetAffineTransform,
+       (ImageRect srcRoi, const double quad[4][2], double coeffs[2][3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpBilinear_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][4], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpBilinear_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[2][4], int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetBilinearTransform,
+       (ImageRect srcRoi, const double quad[4][2], double coeffs[2][4]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpPerspective_8u_C1R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[3][3], int interpolation))
+ZOR_FN(ZOR_SSE2UP, Status, zoriWarpPerspective_8u_C3R,
+       (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep,
+        ImageRect dstRoi, const double coeffs[3][3], int interpolation))
+ZOR_FN(ZOR_GENERIC, Status, zoriGetPerspectiveTransform,
+       (ImageRect srcRoi, const double quad[4][2], double coeffs[3][3]))
 
-/* ---- image/filter/smoothing ---- */
+/* ---- image/filter/smoothing ----
+ * Fixed smoothing filters, the Wiener filter and full convolution.  The
+ * neighbourhood filters do no border handling: the caller passes the ROI
+ * inside a larger image and every source pixel a neighbourhood touches must
+ * exist.  C3 forms filter each channel on its own.
+ * Checks, in this order, first failure wins, nothing written on failure:
+ * null pointers (StatusNullPointer), ROI or image width or height below 1
+ * (StatusBadSize), a step below 1 (StatusBadStep; steps are not compared
+ * with the widths), then the function's own arguments as listed below.
+ * Every variant gives the same bytes (the same bits for floats).
+ *
+ * FilterBox_8u_C1R, _C3R: with anchor (ax, ay) the neighbourhood of ROI pixel
+ *   (x, y) is source columns x - ax .. x - ax + mW - 1 and rows y - ay ..
+ *   y - ay + mH - 1 (no flipping); dst = (sum + N / 2) / N in integers,
+ *   N = mW mH: the mean rounded half up.  mW or mH below 1:
+ *   StatusBadMaskSize; ax outside 0 .. mW - 1 or ay outside 0 .. mH - 1:
+ *   StatusBadAnchor.  Running sums: the time per pixel does not grow with
+ *   the mask.
+ * FilterGauss_8u_C1R, _C3R: mask 33 (MaskSize3x3): weights [1 2 1] x [1 2 1],
+ *   dst = (sum + 8) >> 4; mask 55: [1 4 6 4 1] x [1 4 6 4 1], dst = (sum +
+ *   128) >> 8; centred on the pixel (reads 1 or 2 pixels around the ROI);
+ *   any other mask: StatusBadMaskSize.
+ * FilterLowpass_8u_C1R: mask 33 or 55: the centred 3x3 or 5x5 box mean of
+ *   FilterBox, (sum + 4) / 9 or (sum + 12) / 25; other: StatusBadMaskSize.
+ * FilterHipass_8u_C1R: mask 33: weight 8 at the centre and -1 at the other
+ *   8 pixels; 55: 24 at the centre, -1 at the other 24; centred; the sum
+ *   saturated to 0 .. 255.  Other mask: StatusBadMaskSize.
+ * FilterWienerGetBufferSize: the bytes of pBuffer that FilterWiener needs
+ *   for that ROI size, mask and channel count (a size for more channels
+ *   covers fewer).  Null pBufferSize -8, ROI below 1 -6, a mask that
+ *   FilterWiener refuses StatusBadMaskSize, channels below 1
+ *   StatusBadChannelCount, a size beyond the int range StatusBadSize.
+ * FilterWiener_8u_C1R: over the neighbourhood of FilterBox (checked the
+ *   same way, and more than 2^18 mask pixels is StatusBadMaskSize too; then
+ *   noise[0]) with S the sum and Q the sum of squares of its N pixels and
+ *   p = src(x, y):
+ *     mean m = S / N, variance v = Q / N - m^2 = (N Q - S^2) / N^2,
+ *     noise variance n = noise[0] 255^2,
+ *     dst = m + max(v - n, 0) / max(v, n) (p - m), and m where v = n = 0,
+ *   computed in double as D = N Q - S^2 (exact), g = max(D - n N^2, 0) /
+ *   max(D, n N^2) (0 where both are 0), dst = floor((S + g (N p - S)) / N
+ *   + 0.5) clamped to 0 .. 255.  noise[0] outside [0, 1) (NaN included):
+ *   StatusBadArgument.  noise[0] = 0 asks for an estimate: n becomes the
+ *   mean of v over the ROI pixels (exact sum of D, then divided by N^2 and
+ *   the pixel count in double), noise[0] is set to (float)(n / 255^2) and
+ *   that float is used, so a second call with the returned value gives the
+ *   same image.  pBuffer: at least the FilterWienerGetBufferSize bytes (with
+ *   channels 1), any alignment.
+ * ConvFull_32f_C1R: full two-dimensional convolution, dst W x H with W =
+ *   w1 + w2 - 1, H = h1 + h2 - 1 (beyond the int range: StatusBadSize):
+ *     dst(x, y) = sum over j, i of src2(i, j) src1(x - i, y - j)
+ *   over the terms whose two pixels exist; products and sum in double,
+ *   starting from +0 and adding in order of j then i ascending, rounded once
+ *   to float.
+ * ConvFull_8u_C1R: the same sum in exact integers, dst = floor(sum /
+ *   divisor + 1/2) saturated to 0 .. 255 (so a negative divisor gives 0
+ *   everywhere); divisor 0: StatusBadDivisor. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterBox_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
+        ImagePoint anchor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterBox_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
+        ImagePoint anchor))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterGauss_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterGauss_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterLowpass_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterHipass_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
+ZOR_FN(ZOR_GENERIC, Status, zoriFilterWienerGetBufferSize,
+       (ImageSize dstRoiSize, ImageSize maskSize, int channels, int* pBufferSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriFilterWiener_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
+        ImagePoint anchor, float noise[1], uint8_t* pBuffer))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvFull_32f_C1R,
+       (const float* pSrc1, int src1Step, ImageSize src1Size, const float* pSrc2, int src2Step,
+        ImageSize src2Size, float* pDst, int dstStep))
+ZOR_FN(ZOR_SSE2UP, Status, zoriConvFull_8u_C1R,
+       (const uint8_t* pSrc1, int src1Step, ImageSize src1Size, const uint8_t* pSrc2, int src2Step,
+        ImageSize src2Size, uint8_t* pDst, int dstStep, int divisor))
 
 /* ---- image/pixel/arith ----
  * Pixel arithmetic, logic, threshold, compare, alpha composition and
@@ -656,9 +957,97 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriDeinterlaceFilterTriangle_8u_C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, uint32_t centerWeight,
         uint32_t layout))
 
-/* ---- image/color/color ---- */
+/* ---- image/color/color ----
+ * Colour model conversions of whole images; every one checks the pointers,
+ * then the size (no step is checked: steps are used as given).
+ * Fixed-point YCbCr forms give exactly the bytes of their integer formulas,
+ * including the low-8-bit chroma wrap, the second luma of a 4:2:2 pair
+ * without the rounding half and the 4:2:0 one-eighth rounding term.
+ * 4:2:0 forms convert the even part of the ROI and return StatusWarnOddSize
+ * when a side is odd; a null step array is a null pointer like the others.
+ * HSV, HLS and YCC compute in double precision and round stores as
+ * trunc(x + 0.499999) (the 16-bit grey truncates); for 8-bit data that is
+ * the exact rational value rounded to nearest with halves down, which the
+ * SIMD RGB-to-HSV rows compute exactly (the other floating-point forms share
+ * one entry).
+ * ColorToGray: float weight w becomes trunc(w * 4096 + 0.5) taken modulo
+ * 2^32 (8u forms); a truncated value that is NaN or of magnitude 2^63 or
+ * more counts as 0; 16u forms store the truncated sum modulo 2^16 (NaN and
+ * magnitudes of 2^63 or more give 0).  A null coefficient pointer selects
+ * the default weights. */
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToYCbCr_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCrToRGB_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToHSV_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriHSVToRGB_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriRGBToHLS_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriHLSToRGB_8u_C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriRGBToYCC_16s_C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_GENERIC, Status, zoriYCCToRGB_16s_C3R,
+       (const int16_t* pSrc, int srcStep, int16_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToYCbCr422_8u_C3C2R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCr422ToRGB_8u_C2C3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr420_8u_C3P3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], const int dstStep[3], ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCr420ToBGR_8u_P3C3R,
+       (const uint8_t* const pSrc[3], const int srcStep[3], uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToGray_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriColorToGray_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriColorToGray_8u_AC4C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
+ZOR_FN(ZOR_GENERIC, Status, zoriColorToGray_16u_C3C1R,
+       (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
+ZOR_FN(ZOR_GENERIC, Status, zoriColorToGray_16u_AC4C1R,
+       (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
 
-/* ---- image/color/jpeg ---- */
+/* ---- image/color/jpeg ----
+ * Baseline JPEG building blocks.  Quantisation tables are 64 entries in
+ * natural (row-major) order except the raw table, which is in zigzag order.
+ * The forward DCT (Loeffler-Ligtenberg-Moschytz, 16-bit row results scaled
+ * by 8) on level-shifted samples, per 8 samples x0..x7 of a row, then of a
+ * column, with t_k = x_k + x_(7-k), d_k = x_k - x_(7-k), a >>> n meaning
+ * (a + 2^(n-1)) >> n:
+ *   even: e0 = t0 + t3, e3 = t0 - t3, e1 = t1 + t2, e2 = t1 - t2,
+ *         z = 17734 (e2 + e3);  X2 = z + 25080 e3,  X6 = z - 60547 e2
+ *         (row: X0 = 8 (e0 + e1), X4 = 8 (e0 - e1), X2 >>> 12, X6 >>> 12;
+ *          column: (e0 + e1) >>> 6, (e0 - e1) >>> 6, X2 >>> 21, X6 >>> 21)
+ *   odd:  o_k = (46341 d_k) >>> 12, then the rotations
+ *         z = 799 (o2 + o1):   a = z + 3218 o2,  b = z - 4816 o1,
+ *         z = 3406 (o3 + o0):  c = z - 5681 o3,  d = z - 1130 o0,
+ *         each >>> 12 (row) or >>> 18 (column), and
+ *         X3 = c - a, X5 = b + d, X1 = 46341 (a - b + c + d) >>> 16,
+ *         X7 = 46341 (a + b + c - d) >>> 16
+ *         (column: X3, X5 >>> 3 and X1, X7 >>> 19 instead).
+ * The inverse is the transpose of that flow with the same constants, exact
+ * in 64-bit intermediates except for one rounding of the odd part before its
+ * last sqrt 2 and one of each pass's results (columns kept at 2^3, rows
+ * divided by 8 with the level shift added back and clamped). */
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToY_JPEG_8u_C3C1R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr_JPEG_8u_C3P3R,
+       (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], int dstStep, ImageSize roiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriSampleDownH2V2_JPEG_8u_C1R,
+       (const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst, int dstStep, ImageSize dstRoiSize))
+ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr422LS_MCU_8u16s_C3P3R,
+       (const uint8_t* pSrc, int srcStep, int16_t* const pDstMCU[3]))
+ZOR_FN(ZOR_SSE2UP, Status, zoriJoin422LS_MCU_16s8u_P3C2R,
+       (const int16_t* const pSrcMCU[3], uint8_t* pDst, int dstStep))
+ZOR_FN(ZOR_SSE2UP, Status, zoriDCTQuantFwd8x8LS_JPEG_8u16s_C1R,
+       (const uint8_t* pSrc, int srcStep, int16_t* pDst, const uint16_t* pQuantFwdTable))
+ZOR_FN(ZOR_GENERIC, Status, zoriDCTQuantInv8x8LS_JPEG_16s8u_C1R,
+       (const int16_t* pSrc, uint8_t* pDst, int dstStep, const uint16_t* pQuantInvTable))
+ZOR_FN(ZOR_GENERIC, Status, zoriQuantFwdTableInit_JPEG_8u16u,
+       (const uint8_t* pQuantRawTable, uint16_t* pQuantFwdTable))
 
 /* ---- signal/transform/dft2d ----
  * Two-dimensional DFT of a real float image of any width W >= 1 and height

@@ -1,26 +1,36 @@
-// 3x3 maximum / minimum of 8-bit rows, shared by the rank filters and the
-// morphology.  Include after frame/variant.h.
+// Maximum and minimum picks, and the 3x3 maximum / minimum of 8-bit rows,
+// shared by the rank filters and the morphology.  Include after
+// frame/variant.h.
 #pragma once
 
 #include "frame/abi.h"
+#include "frame/simd.h"
 
 #include <cstddef>
 #include <cstdint>
 
 namespace zor { inline namespace ZOR_INLINE_NS {
 
-struct Max8u {
-    static uint8_t pick(uint8_t a, uint8_t b) { return a > b ? a : b; }
-#if ZOR_SIMD >= 2
-    static __m128i pick(__m128i a, __m128i b) { return _mm_max_epu8(a, b); }
-#endif
+// The larger (smaller) of a kept value a and a new one b, on single lanes
+// and on registers: b replaces a only when strictly larger (smaller), so a
+// float NaN already picked stays.
+struct PickMax {
+    template <class V>
+    static V pick(V a, V b) { return simd::max(b, a); }
 };
-struct Min8u {
-    static uint8_t pick(uint8_t a, uint8_t b) { return a < b ? a : b; }
-#if ZOR_SIMD >= 2
-    static __m128i pick(__m128i a, __m128i b) { return _mm_min_epu8(a, b); }
-#endif
+struct PickMin {
+    template <class V>
+    static V pick(V a, V b) { return simd::min(b, a); }
 };
+
+#if ZOR_SIMD >= 2
+// The picks down a column of three rows, a register of columns from `at`.
+template <class V, class Op>
+inline V pickDown3(const uint8_t* r0, const uint8_t* r1, const uint8_t* r2, int at) {
+    using simd::load;
+    return Op::pick(Op::pick(load<V>(r0 + at), load<V>(r1 + at)), load<V>(r2 + at));
+}
+#endif
 
 // out[x] = pick over rows t, t + step, t + 2 step and columns x .. x + 2 of
 // t (the neighbourhood's top-left pixel), for x in 0 .. w - 1; reads nothing
@@ -32,26 +42,26 @@ void extreme3x3Row(const uint8_t* t, ptrdiff_t step, uint8_t* out, int w) {
     const uint8_t* r2 = t + 2 * step;
     int x = 0;
 #if ZOR_SIMD >= 2
-    auto ld = [](const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); };
-    auto column = [&](int at) { return Op::pick(Op::pick(ld(r0 + at), ld(r1 + at)), ld(r2 + at)); };
+    using namespace simd;
 #  if ZOR_SIMD >= 4
-    // column picks of each block once; the shifted ones come from the next block
+    // column picks of each block once; the shifted ones come from the next
+    // block (the shifts reach across one 16-byte register)
+    using B = Vec<uint8_t, 16>;
     if (w >= 32) {
-        __m128i cur = column(0);
+        B cur = pickDown3<B, Op>(r0, r1, r2, 0);
         for (; x + 32 <= w + 2; x += 16) {  // reads up to column x + 31
-            const __m128i next = column(x + 16);
-            const __m128i v = Op::pick(Op::pick(cur, _mm_alignr_epi8(next, cur, 1)),
-                                       _mm_alignr_epi8(next, cur, 2));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), v);
+            const B next = pickDown3<B, Op>(r0, r1, r2, x + 16);
+            store(out + x, Op::pick(Op::pick(cur, alignBytes<1>(next, cur)), alignBytes<2>(next, cur)));
             cur = next;
         }
     }
 #  endif
-    if (w >= 16) {
-        for (; x < w; x += 16) {
-            if (x + 16 > w) x = w - 16;  // the last block overlaps
-            const __m128i v = Op::pick(Op::pick(column(x), column(x + 1)), column(x + 2));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), v);
+    using V = Vec<uint8_t>;
+    if (w >= V::kLanes) {
+        const auto column = [&](int at) { return pickDown3<V, Op>(r0, r1, r2, at); };
+        for (; x < w; x += V::kLanes) {
+            if (x + V::kLanes > w) x = w - V::kLanes;  // the last block overlaps
+            store(out + x, Op::pick(Op::pick(column(x), column(x + 1)), column(x + 2)));
         }
         return;
     }

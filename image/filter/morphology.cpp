@@ -14,26 +14,9 @@
 
 #include <cstddef>
 #include <cstring>
-#include <type_traits>
 
 namespace zor { namespace ZOR_NS {
 namespace {
-
-
-struct MaxOp {
-    template <class T>
-    static T pick(T a, T b) { return b > a ? b : a; }
-#if ZOR_SIMD >= 2
-    static __m128i pick(__m128i a, __m128i b) { return _mm_max_epu8(a, b); }
-#endif
-};
-struct MinOp {
-    template <class T>
-    static T pick(T a, T b) { return b < a ? b : a; }  // a NaN already picked stays
-#if ZOR_SIMD >= 2
-    static __m128i pick(__m128i a, __m128i b) { return _mm_min_epu8(a, b); }
-#endif
-};
 
 // ---- 3x3 ----------------------------------------------------------------------------
 
@@ -41,8 +24,7 @@ struct MinOp {
 template <class Op, class T>
 void row3x3(T* p, int step, T* out, int w) {
     if constexpr (sizeof(T) == 1) {
-        using Op8 = std::conditional_t<std::is_same_v<Op, MaxOp>, Max8u, Min8u>;
-        extreme3x3Row<Op8>(rowAt(p, step, -1) - 1, step, out, w);
+        extreme3x3Row<Op>(rowAt(p, step, -1) - 1, step, out, w);
     } else {
         const T* a = rowAt(p, step, -1);
         const T* b = p;
@@ -66,11 +48,11 @@ template <class Op>
 void rowMasked(uint8_t* p, const MaskTaps& taps, uint8_t* out, int w) {
     int x = 0;
 #if ZOR_SIMD >= 2
-    for (; x + 16 <= w; x += 16) {
-        __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + x + taps.offsets[0]));
-        for (int t = 1; t < taps.count; ++t)
-            v = Op::pick(v, _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + x + taps.offsets[t])));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), v);
+    using V = simd::Vec<uint8_t>;
+    for (; x + V::kLanes <= w; x += V::kLanes) {
+        V v = simd::load<V>(p + x + taps.offsets[0]);
+        for (int t = 1; t < taps.count; ++t) v = Op::pick(v, simd::load<V>(p + x + taps.offsets[t]));
+        simd::store(out + x, v);
     }
 #endif
     for (; x < w; ++x) {
@@ -146,25 +128,25 @@ Status morphMasked(uint8_t* img, int step, ImageSize roi, const uint8_t* mask, I
 }  // namespace
 
 Status ZOR_CALL zoriDilate3x3_8u_C1IR(uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize) {
-    return morph3x3<MaxOp>(pSrcDst, srcDstStep, roiSize);
+    return morph3x3<PickMax>(pSrcDst, srcDstStep, roiSize);
 }
 
 Status ZOR_CALL zoriErode3x3_8u_C1IR(uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize) {
-    return morph3x3<MinOp>(pSrcDst, srcDstStep, roiSize);
+    return morph3x3<PickMin>(pSrcDst, srcDstStep, roiSize);
 }
 
 Status ZOR_CALL zoriErode3x3_32f_C1IR(float* pSrcDst, int srcDstStep, ImageSize roiSize) {
-    return morph3x3<MinOp>(pSrcDst, srcDstStep, roiSize);
+    return morph3x3<PickMin>(pSrcDst, srcDstStep, roiSize);
 }
 
 Status ZOR_CALL zoriDilate_8u_C1IR(uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize,
                                    const uint8_t* pMask, ImageSize maskSize, ImagePoint anchor) {
-    return morphMasked<MaxOp>(pSrcDst, srcDstStep, roiSize, pMask, maskSize, anchor);
+    return morphMasked<PickMax>(pSrcDst, srcDstStep, roiSize, pMask, maskSize, anchor);
 }
 
 Status ZOR_CALL zoriErode_8u_C1IR(uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize,
                                   const uint8_t* pMask, ImageSize maskSize, ImagePoint anchor) {
-    return morphMasked<MinOp>(pSrcDst, srcDstStep, roiSize, pMask, maskSize, anchor);
+    return morphMasked<PickMin>(pSrcDst, srcDstStep, roiSize, pMask, maskSize, anchor);
 }
 
 }}  // namespace zor::ZOR_NS

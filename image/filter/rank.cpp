@@ -25,7 +25,6 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-
 Status checkRank(const void* src, int srcStep, const void* dst, int dstStep, ImageSize roi,
                  ImageSize mask, ImagePoint anchor, bool oddOnly) {
     if (Status s = checkFirst(anyNull(src, dst), badRoi(roi), badSteps(srcStep, dstStep)))
@@ -73,41 +72,54 @@ void medianRowHistogram(const uint8_t* top, int srcStep, uint8_t* dst, int w, Im
 // ---- median: 3x3 from sorted columns ---------------------------------------------------
 
 #if ZOR_SIMD >= 2
-inline void sort2(__m128i& a, __m128i& b) {
-    const __m128i t = a;
-    a = _mm_min_epu8(t, b);
-    b = _mm_max_epu8(t, b);
+using Pixels = simd::Vec<uint8_t>;  // a register of 8-bit pixels
+
+template <class V>
+inline void sort2(V& a, V& b) {
+    const V t = a;
+    a = simd::min(t, b);
+    b = simd::max(t, b);
 }
-inline __m128i median3(__m128i a, __m128i b, __m128i c) {
-    return _mm_max_epu8(_mm_min_epu8(a, b), _mm_min_epu8(_mm_max_epu8(a, b), c));
+template <class V>
+inline V median3(V a, V b, V c) {
+    using simd::max;
+    using simd::min;
+    return max(min(a, b), min(max(a, b), c));
 }
-inline __m128i load16(const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
 
 // The median of nine is the median of (largest of the column minima, median
 // of the column medians, smallest of the column maxima).
+template <class V>
 struct SortedColumns {
-    __m128i lo, mid, hi;
+    V lo, mid, hi;
 };
-inline SortedColumns sortColumns(const uint8_t* r0, const uint8_t* r1, const uint8_t* r2) {
-    __m128i a = load16(r0), b = load16(r1), c = load16(r2);
+template <class V>
+inline SortedColumns<V> sortColumns(const uint8_t* r0, const uint8_t* r1, const uint8_t* r2) {
+    using simd::load;
+    V a = load<V>(r0), b = load<V>(r1), c = load<V>(r2);
     sort2(a, b);
     sort2(b, c);
     sort2(a, b);
     return {a, b, c};
 }
-inline __m128i median9(const SortedColumns (&c)[3]) {
-    const __m128i maxLo = _mm_max_epu8(_mm_max_epu8(c[0].lo, c[1].lo), c[2].lo);
-    const __m128i minHi = _mm_min_epu8(_mm_min_epu8(c[0].hi, c[1].hi), c[2].hi);
+template <class V>
+inline V median9(const SortedColumns<V> (&c)[3]) {
+    using simd::max;
+    using simd::min;
+    const V maxLo = max(max(c[0].lo, c[1].lo), c[2].lo);
+    const V minHi = min(min(c[0].hi, c[1].hi), c[2].hi);
     return median3(maxLo, median3(c[0].mid, c[1].mid, c[2].mid), minHi);
 }
-inline __m128i median3x3(const uint8_t* r0, const uint8_t* r1, const uint8_t* r2) {
-    const SortedColumns c[3] = {sortColumns(r0, r1, r2), sortColumns(r0 + 1, r1 + 1, r2 + 1),
-                                sortColumns(r0 + 2, r1 + 2, r2 + 2)};
+inline Pixels median3x3(const uint8_t* r0, const uint8_t* r1, const uint8_t* r2) {
+    const SortedColumns<Pixels> c[3] = {sortColumns<Pixels>(r0, r1, r2), sortColumns<Pixels>(r0 + 1, r1 + 1, r2 + 1),
+                                        sortColumns<Pixels>(r0 + 2, r1 + 2, r2 + 2)};
     return median9(c);
 }
 
-// Rows of 16 or more pixels; the last block overlaps the one before.
+// Rows of a register's width or more; the last block overlaps the one
+// before.
 void median3x3Rows(const uint8_t* top, int srcStep, uint8_t* dst, int dstStep, ImageSize roi) {
+    using namespace simd;
     const int w = roi.width;
     for (int y = 0; y < roi.height; ++y) {
         const uint8_t* r0 = rowAt(top, srcStep, y);
@@ -116,39 +128,39 @@ void median3x3Rows(const uint8_t* top, int srcStep, uint8_t* dst, int dstStep, I
         uint8_t* d = rowAt(dst, dstStep, y);
         int x = 0;
 #  if ZOR_SIMD >= 4
-        // each block's columns sorted once; the shifted ones come from the next block
+        // each block's columns sorted once; the shifted ones come from the
+        // next block (the shifts reach across one 16-byte register)
+        using B = Vec<uint8_t, 16>;
         if (w >= 32) {
-            SortedColumns cur = sortColumns(r0, r1, r2);
+            SortedColumns<B> cur = sortColumns<B>(r0, r1, r2);
             for (; x + 32 <= w + 2; x += 16) {  // reads up to column x + 31
-                const SortedColumns next = sortColumns(r0 + x + 16, r1 + x + 16, r2 + x + 16);
-                auto shift = [](__m128i n, __m128i c, int k) {
-                    return k == 1 ? _mm_alignr_epi8(n, c, 1) : _mm_alignr_epi8(n, c, 2);
-                };
-                const SortedColumns c[3] = {
+                const SortedColumns<B> next = sortColumns<B>(r0 + x + 16, r1 + x + 16, r2 + x + 16);
+                const SortedColumns<B> c[3] = {
                     cur,
-                    {shift(next.lo, cur.lo, 1), shift(next.mid, cur.mid, 1), shift(next.hi, cur.hi, 1)},
-                    {shift(next.lo, cur.lo, 2), shift(next.mid, cur.mid, 2), shift(next.hi, cur.hi, 2)}};
-                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), median9(c));
+                    {alignBytes<1>(next.lo, cur.lo), alignBytes<1>(next.mid, cur.mid), alignBytes<1>(next.hi, cur.hi)},
+                    {alignBytes<2>(next.lo, cur.lo), alignBytes<2>(next.mid, cur.mid), alignBytes<2>(next.hi, cur.hi)}};
+                store(d + x, median9(c));
                 cur = next;
             }
         }
 #  endif
-        for (; x < w; x += 16) {
-            if (x + 16 > w) x = w - 16;
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), median3x3(r0 + x, r1 + x, r2 + x));
+        for (; x < w; x += Pixels::kLanes) {
+            if (x + Pixels::kLanes > w) x = w - Pixels::kLanes;
+            store(d + x, median3x3(r0 + x, r1 + x, r2 + x));
         }
     }
 }
 
 // The median of 25: a sorting network (odd-even merge sort) pruned to the
 // comparisons that reach the middle output; MN/MX keep one side only.
-inline __m128i median5x5(const uint8_t* r0, int step) {
-    __m128i v[25];
+inline Pixels median5x5(const uint8_t* r0, int step) {
+    using namespace simd;
+    Pixels v[25];
     for (int j = 0; j < 5; ++j)
-        for (int i = 0; i < 5; ++i) v[j * 5 + i] = load16(rowAt(r0, step, j) + i);
-#define S(a, b) { const __m128i t = _mm_min_epu8(v[a], v[b]); v[b] = _mm_max_epu8(v[a], v[b]); v[a] = t; }
-#define MN(a, b) v[a] = _mm_min_epu8(v[a], v[b]);
-#define MX(a, b) v[b] = _mm_max_epu8(v[a], v[b]);
+        for (int i = 0; i < 5; ++i) v[j * 5 + i] = load<Pixels>(rowAt(r0, step, j) + i);
+#define S(a, b) sort2(v[a], v[b]);
+#define MN(a, b) v[a] = min(v[a], v[b]);
+#define MX(a, b) v[b] = max(v[a], v[b]);
         S(0,1); S(2,3); S(4,5); S(6,7); S(8,9); S(10,11); S(12,13); S(14,15); S(16,17); S(18,19);
         S(20,21); S(22,23); S(0,2); S(1,3); S(4,6); S(5,7); S(8,10); S(9,11); S(12,14); S(13,15);
         S(16,18); S(17,19); S(20,22); S(21,23); S(1,2); S(5,6); S(9,10); S(13,14); S(17,18);
@@ -168,12 +180,13 @@ inline __m128i median5x5(const uint8_t* r0, int step) {
 }
 
 void median5x5Rows(const uint8_t* top, int srcStep, uint8_t* dst, int dstStep, ImageSize roi) {
+    constexpr int L = Pixels::kLanes;
     for (int y = 0; y < roi.height; ++y) {
         const uint8_t* r0 = rowAt(top, srcStep, y);
         uint8_t* d = rowAt(dst, dstStep, y);
-        for (int x0 = 0; x0 < roi.width; x0 += 16) {
-            const int x = x0 + 16 <= roi.width ? x0 : roi.width - 16;
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), median5x5(r0 + x, srcStep));
+        for (int x0 = 0; x0 < roi.width; x0 += L) {
+            const int x = x0 + L <= roi.width ? x0 : roi.width - L;
+            simd::store(d + x, median5x5(r0 + x, srcStep));
         }
     }
 }
@@ -233,17 +246,17 @@ Status medianGather(const T* top, int srcStep, T* dst, int dstStep, ImageSize ro
 
 // ---- maximum and minimum -------------------------------------------------------------
 
-// Op: Max8u or Min8u (image/filter/extreme3x3.h).
+// Op: PickMax or PickMin (image/filter/extreme3x3.h).
 // out[x] = pick of p[x .. x + n - 1]
 template <class Op>
 void pickRow(const uint8_t* p, uint8_t* out, int w, int n) {
     int x = 0;
 #if ZOR_SIMD >= 2
-    for (; x + 16 <= w; x += 16) {
-        __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + x));
-        for (int i = 1; i < n; ++i)
-            a = Op::pick(a, _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + x + i)));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), a);
+    using simd::load;
+    for (; x + Pixels::kLanes <= w; x += Pixels::kLanes) {
+        Pixels a = load<Pixels>(p + x);
+        for (int i = 1; i < n; ++i) a = Op::pick(a, load<Pixels>(p + x + i));
+        simd::store(out + x, a);
     }
 #endif
     for (; x < w; ++x) {
@@ -258,11 +271,11 @@ template <class Op>
 void pickColumn(uint8_t* const* rows, uint8_t* out, int w, int n) {
     int x = 0;
 #if ZOR_SIMD >= 2
-    for (; x + 16 <= w; x += 16) {
-        __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(rows[0] + x));
-        for (int j = 1; j < n; ++j)
-            a = Op::pick(a, _mm_loadu_si128(reinterpret_cast<const __m128i*>(rows[j] + x)));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), a);
+    using simd::load;
+    for (; x + Pixels::kLanes <= w; x += Pixels::kLanes) {
+        Pixels a = load<Pixels>(rows[0] + x);
+        for (int j = 1; j < n; ++j) a = Op::pick(a, load<Pixels>(rows[j] + x));
+        simd::store(out + x, a);
     }
 #endif
     for (; x < w; ++x) {
@@ -315,11 +328,11 @@ Status rankExtreme(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, I
 // The median proper, from the neighbourhood's top-left source sample.
 Status medianFrom(const uint8_t* top, int srcStep, uint8_t* pDst, int dstStep, ImageSize roi, ImageSize mask) {
 #if ZOR_SIMD >= 2
-    if (mask.width == 3 && mask.height == 3 && roi.width >= 16) {
+    if (mask.width == 3 && mask.height == 3 && roi.width >= Pixels::kLanes) {
         median3x3Rows(top, srcStep, pDst, dstStep, roi);
         return StatusOk;
     }
-    if (mask.width == 5 && mask.height == 5 && roi.width >= 16) {
+    if (mask.width == 5 && mask.height == 5 && roi.width >= Pixels::kLanes) {
         median5x5Rows(top, srcStep, pDst, dstStep, roi);
         return StatusOk;
     }
@@ -359,12 +372,12 @@ Status ZOR_CALL zoriFilterMedian_16s_C1R(const int16_t* pSrc, int srcStep, int16
 
 Status ZOR_CALL zoriFilterMax_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                      ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor) {
-    return rankExtreme<Max8u>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
+    return rankExtreme<PickMax>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
 }
 
 Status ZOR_CALL zoriFilterMin_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                      ImageSize dstRoiSize, ImageSize maskSize, ImagePoint anchor) {
-    return rankExtreme<Min8u>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
+    return rankExtreme<PickMin>(pSrc, srcStep, pDst, dstStep, dstRoiSize, maskSize, anchor);
 }
 
 }}  // namespace zor::ZOR_NS

@@ -23,6 +23,7 @@
 #include "frame/fpu.h"
 #include "frame/memory.h"
 #include "frame/status.h"
+#include "frame/simd.h"
 
 #include <cstddef>
 #include <cstring>
@@ -54,16 +55,15 @@ void rowPass(const uint8_t* s, int16_t* out, int w, const SobelKernel& k) {
     const int r = k.size / 2;
     int x = 0;
 #if ZOR_SIMD >= 2
-    const __m128i zero = _mm_setzero_si128();
-    for (; x + 8 <= w; x += 8) {
-        __m128i acc = zero;
+    using namespace simd;
+    using V = Vec<int16_t, 16>;
+    for (; x + V::kLanes <= w; x += V::kLanes) {
+        V acc = zero<V>();
         for (int i = 0; i < k.size; ++i) {
             if (k.x[i] == 0) continue;
-            const __m128i v = _mm_unpacklo_epi8(
-                _mm_loadl_epi64(reinterpret_cast<const __m128i*>(s + x - r + i)), zero);
-            acc = _mm_add_epi16(acc, _mm_mullo_epi16(v, _mm_set1_epi16(static_cast<int16_t>(k.x[i]))));
+            acc = acc + loadWidened<V>(s + x - r + i) * set1<V>(static_cast<int16_t>(k.x[i]));
         }
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), acc);
+        store(out + x, acc);
     }
 #endif
     for (; x < w; ++x) {
@@ -89,17 +89,19 @@ template <class Out>
 void colPass(const int16_t* const* rows, Out* dst, int w, const SobelKernel& k) {
     int x = 0;
 #if ZOR_SIMD >= 2
-    for (; x + 8 <= w; x += 8) {
-        __m128i acc = _mm_setzero_si128();
+    // one 16-byte register of sums; 8-bit results are its lower half narrowed
+    using namespace simd;
+    using V = Vec<int16_t, 16>;
+    for (; x + V::kLanes <= w; x += V::kLanes) {
+        V acc = zero<V>();
         for (int j = 0; j < k.size; ++j) {
             if (k.y[j] == 0) continue;
-            const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(rows[j] + x));
-            acc = _mm_add_epi16(acc, _mm_mullo_epi16(v, _mm_set1_epi16(static_cast<int16_t>(k.y[j]))));
+            acc = acc + load<V>(rows[j] + x) * set1<V>(static_cast<int16_t>(k.y[j]));
         }
         if constexpr (sizeof(Out) == 1)
-            _mm_storel_epi64(reinterpret_cast<__m128i*>(dst + x), _mm_packus_epi16(acc, acc));
+            storeHalf(dst + x, narrowSat<uint8_t>(acc, acc));
         else
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + x), acc);
+            store(dst + x, acc);
     }
 #endif
     for (; x < w; ++x) {
@@ -151,16 +153,21 @@ template <class In>
 using AccOf = std::conditional_t<sizeof(In) == 1, int16_t, float>;
 
 #if ZOR_SIMD >= 2
-// 3x3 on 8u sources in a single pass over three source rows, 16 pixels at a
-// time.  The sums are exact in 16 bits, so this equals the two passes.
-inline void widen(const uint8_t* p, __m128i& lo, __m128i& hi) {
-    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
-    lo = _mm_unpacklo_epi8(v, _mm_setzero_si128());
-    hi = _mm_unpackhi_epi8(v, _mm_setzero_si128());
-}
-
+// 3x3 on 8u sources in a single pass over three source rows, 16 pixels (a
+// 16-byte register widened into two) at a time.  The sums are exact in 16
+// bits, so this equals the two passes.
 template <class Out>
 void sobel3Direct(const uint8_t* src, int srcStep, Out* dst, int dstStep, ImageSize roi, Dir dir) {
+    using namespace simd;
+    using B = Vec<uint8_t, 16>;
+    using V = Vec<int16_t, 16>;
+    struct Halves {
+        V lo, hi;
+    };
+    const auto widened = [](const uint8_t* p) {
+        const B v = load<B>(p);
+        return Halves{bitcast<int16_t>(widenLo(v)), bitcast<int16_t>(widenHi(v))};
+    };
     const int w = roi.width;
     for (int y = 0; y < roi.height; ++y) {
         const uint8_t* p0 = rowAt(src, srcStep, y - 1);
@@ -169,39 +176,30 @@ void sobel3Direct(const uint8_t* src, int srcStep, Out* dst, int dstStep, ImageS
         Out* d = rowAt(dst, dstStep, y);
         for (int x0 = 0; x0 < w; x0 += 16) {
             const int x = x0 + 16 <= w ? x0 : w - 16;  // the last block overlaps
-            __m128i lo, hi;
+            Halves out;
             if (dir == Dir::Vert) {
                 // smooth down the columns x - 1 and x + 1, then left minus right
-                __m128i s[2][2];
+                Halves s[2];
                 for (int k = 0; k < 2; ++k) {
                     const int off = x - 1 + 2 * k;
-                    __m128i a0, a1, b0, b1, c0, c1;
-                    widen(p0 + off, a0, a1);
-                    widen(p1 + off, b0, b1);
-                    widen(p2 + off, c0, c1);
-                    s[k][0] = _mm_add_epi16(_mm_add_epi16(a0, c0), _mm_add_epi16(b0, b0));
-                    s[k][1] = _mm_add_epi16(_mm_add_epi16(a1, c1), _mm_add_epi16(b1, b1));
+                    const Halves a = widened(p0 + off), b = widened(p1 + off), c = widened(p2 + off);
+                    s[k] = {(a.lo + c.lo) + (b.lo + b.lo), (a.hi + c.hi) + (b.hi + b.hi)};
                 }
-                lo = _mm_sub_epi16(s[0][0], s[1][0]);
-                hi = _mm_sub_epi16(s[0][1], s[1][1]);
+                out = {s[0].lo - s[1].lo, s[0].hi - s[1].hi};
             } else {
                 // bottom minus top in columns x - 1, x, x + 1, then smoothed along the row
-                __m128i dl[3], dh[3];
+                Halves dv[3];
                 for (int k = 0; k < 3; ++k) {
-                    __m128i a0, a1, c0, c1;
-                    widen(p0 + x - 1 + k, a0, a1);
-                    widen(p2 + x - 1 + k, c0, c1);
-                    dl[k] = _mm_sub_epi16(c0, a0);
-                    dh[k] = _mm_sub_epi16(c1, a1);
+                    const Halves a = widened(p0 + x - 1 + k), c = widened(p2 + x - 1 + k);
+                    dv[k] = {c.lo - a.lo, c.hi - a.hi};
                 }
-                lo = _mm_add_epi16(_mm_add_epi16(dl[0], dl[2]), _mm_add_epi16(dl[1], dl[1]));
-                hi = _mm_add_epi16(_mm_add_epi16(dh[0], dh[2]), _mm_add_epi16(dh[1], dh[1]));
+                out = {(dv[0].lo + dv[2].lo) + (dv[1].lo + dv[1].lo), (dv[0].hi + dv[2].hi) + (dv[1].hi + dv[1].hi)};
             }
             if constexpr (sizeof(Out) == 1) {
-                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), _mm_packus_epi16(lo, hi));
+                store(d + x, narrowSat<uint8_t>(out.lo, out.hi));
             } else {
-                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x), lo);
-                _mm_storeu_si128(reinterpret_cast<__m128i*>(d + x + 8), hi);
+                store(d + x, out.lo);
+                store(d + x + 8, out.hi);
             }
         }
     }
@@ -440,7 +438,7 @@ Status ZOR_CALL zoriFilterSobelVertBorder_32f_C1R(const float* pSrc, int srcStep
 
 // ---- buffer sizes (one per data type; both directions share it) -----------------------
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 Status ZOR_CALL zoriFilterSobelHorizGetBufferSize_8u16s_C1R(ImageSize roiSize, int mask,
                                                             int* pBufferSize) {
     return sobelBufferSize(roiSize, mask, pBufferSize, false);

@@ -12,12 +12,13 @@
 // Integer work only: the SSE variant shares the generic entries.
 #include "frame/variant.h"
 #include "frame/status.h"
-#include "image/pixel/rows.h"
+#include "image/pixel/pixel_rows.h"
+#include "image/pixel/shuffle48.h"
 
 #include <cstring>
 #include <utility>
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -57,52 +58,28 @@ void copyReversedScalar(typename P::Elem* d, const typename P::Elem* s, ptrdiff_
 // ---- SIMD blocks ------------------------------------------------------------------
 
 #if ZOR_SIMD >= 2
-// Reversal of the pixels of one 16-byte register (pixels of 1, 2, 4 or 8
-// bytes), or of three registers (pixels of 3, 6 or 12 bytes, SSSE3).
+// Reversal of the pixels of one register (pixels of 1, 2, 4 or 8 bytes:
+// lanes of that size), or of a 48-byte block in three 16-byte registers
+// (pixels of 3, 6 or 12 bytes, SSSE3).  Reg is the register type, regs the
+// registers of a block.
 template <int PixelBytes>
 struct Reverse {
     static constexpr bool available = false;
 };
 
-template <>
-struct Reverse<1> {
+template <class Lane>
+struct ReverseLanes {
     static constexpr bool available = true;
     static constexpr int regs = 1;
-    static void apply(const __m128i (&in)[1], __m128i (&out)[1]) {
-#if ZOR_SIMD >= 4
-        out[0] = _mm_shuffle_epi8(in[0], _mm_setr_epi8(15, 14, 13, 12, 11, 10, 9, 8, 7, 6, 5, 4, 3, 2, 1, 0));
-#else
-        __m128i v = _mm_shuffle_epi32(in[0], _MM_SHUFFLE(0, 1, 2, 3));
-        v = _mm_shufflehi_epi16(_mm_shufflelo_epi16(v, _MM_SHUFFLE(2, 3, 0, 1)), _MM_SHUFFLE(2, 3, 0, 1));
-        out[0] = _mm_or_si128(_mm_slli_epi16(v, 8), _mm_srli_epi16(v, 8));
-#endif
+    using Reg = simd::Vec<uint8_t>;
+    static void apply(const Reg (&in)[1], Reg (&out)[1]) {
+        out[0] = simd::bitcast<uint8_t>(simd::reverseLanes(simd::bitcast<Lane>(in[0])));
     }
 };
-template <>
-struct Reverse<2> {
-    static constexpr bool available = true;
-    static constexpr int regs = 1;
-    static void apply(const __m128i (&in)[1], __m128i (&out)[1]) {
-        const __m128i v = _mm_shuffle_epi32(in[0], _MM_SHUFFLE(0, 1, 2, 3));
-        out[0] = _mm_shufflehi_epi16(_mm_shufflelo_epi16(v, _MM_SHUFFLE(2, 3, 0, 1)), _MM_SHUFFLE(2, 3, 0, 1));
-    }
-};
-template <>
-struct Reverse<4> {
-    static constexpr bool available = true;
-    static constexpr int regs = 1;
-    static void apply(const __m128i (&in)[1], __m128i (&out)[1]) {
-        out[0] = _mm_shuffle_epi32(in[0], _MM_SHUFFLE(0, 1, 2, 3));
-    }
-};
-template <>
-struct Reverse<8> {
-    static constexpr bool available = true;
-    static constexpr int regs = 1;
-    static void apply(const __m128i (&in)[1], __m128i (&out)[1]) {
-        out[0] = _mm_shuffle_epi32(in[0], _MM_SHUFFLE(1, 0, 3, 2));
-    }
-};
+template <> struct Reverse<1> : ReverseLanes<uint8_t> {};
+template <> struct Reverse<2> : ReverseLanes<uint16_t> {};
+template <> struct Reverse<4> : ReverseLanes<uint32_t> {};
+template <> struct Reverse<8> : ReverseLanes<uint64_t> {};
 
 #if ZOR_SIMD >= 4
 template <int PixelBytes>
@@ -116,28 +93,13 @@ template <int PixelBytes>
 struct Reverse48 {
     static constexpr bool available = true;
     static constexpr int regs = 3;
-    static void apply(const __m128i (&in)[3], __m128i (&out)[3]) {
-        Shuffle48<ReverseMap<PixelBytes>>::apply(in, out);
-    }
+    using Reg = Bytes16;
+    static void apply(const Reg (&in)[3], Reg (&out)[3]) { Shuffle48<ReverseMap<PixelBytes>>::apply(in, out); }
 };
 template <> struct Reverse<3> : Reverse48<3> {};
 template <> struct Reverse<6> : Reverse48<6> {};
 template <> struct Reverse<12> : Reverse48<12> {};
 #endif
-
-template <int R>
-inline void loadN(const void* p, __m128i (&v)[R]) {
-    for (int i = 0; i < R; ++i) v[i] = load16(static_cast<const uint8_t*>(p) + 16 * i);
-}
-template <int R>
-inline void storeN(void* p, const __m128i (&v)[R]) {
-    for (int i = 0; i < R; ++i) store16(static_cast<uint8_t*>(p) + 16 * i, v[i]);
-}
-
-template <class P>
-inline __m128i alphaMask() {
-    return alphaBytes<sizeof(typename P::Elem)>();
-}
 
 // SIMD parts return the number of pixels (or pixel pairs) they handled.
 template <class P>
@@ -146,26 +108,28 @@ ptrdiff_t swapReversedSimd(typename P::Elem* a, typename P::Elem* b, ptrdiff_t n
     if constexpr (!Rev::available) {
         return 0;
     } else {
+        using namespace simd;
+        using Reg = typename Rev::Reg;
         constexpr int R = Rev::regs;
-        constexpr ptrdiff_t per = 16 * R / P::bytes;
+        constexpr ptrdiff_t per = Reg::kBytes * R / P::bytes;
         uint8_t* pa = reinterpret_cast<uint8_t*>(a);
         uint8_t* pb = reinterpret_cast<uint8_t*>(b);
         ptrdiff_t x = 0;
         for (; x + per <= n; x += per) {
             uint8_t* qa = pa + x * P::bytes;
             uint8_t* qb = pb + (n - x - per) * P::bytes;
-            __m128i va[R], vb[R], ra[R], rb[R];
-            loadN<R>(qa, va);
-            loadN<R>(qb, vb);
+            Reg va[R], vb[R], ra[R], rb[R];
+            loadBlock(qa, va);
+            loadBlock(qb, vb);
             Rev::apply(vb, ra);  // new content of qa
             Rev::apply(va, rb);
             if constexpr (P::moved < P::channels) {
-                const __m128i alpha = alphaMask<P>();
-                ra[0] = blend16(ra[0], va[0], alpha);
-                rb[0] = blend16(rb[0], vb[0], alpha);
+                const Reg alpha = alphaBytes<sizeof(typename P::Elem), Reg::kBytes>();
+                ra[0] = select(alpha, va[0], ra[0]);
+                rb[0] = select(alpha, vb[0], rb[0]);
             }
-            storeN<R>(qa, ra);
-            storeN<R>(qb, rb);
+            storeBlock(qa, ra);
+            storeBlock(qb, rb);
         }
         return x;
     }
@@ -177,39 +141,43 @@ ptrdiff_t copyReversedSimd(typename P::Elem* d, const typename P::Elem* s, ptrdi
     if constexpr (!Rev::available) {
         return 0;
     } else {
+        using namespace simd;
+        using Reg = typename Rev::Reg;
         constexpr int R = Rev::regs;
-        constexpr ptrdiff_t per = 16 * R / P::bytes;
+        constexpr ptrdiff_t per = Reg::kBytes * R / P::bytes;
         uint8_t* pd = reinterpret_cast<uint8_t*>(d);
         const uint8_t* ps = reinterpret_cast<const uint8_t*>(s);
         ptrdiff_t x = 0;
         for (; x + per <= n; x += per) {
-            __m128i v[R], r[R];
-            loadN<R>(ps + (n - x - per) * P::bytes, v);
+            Reg v[R], r[R];
+            loadBlock(ps + (n - x - per) * P::bytes, v);
             Rev::apply(v, r);
-            storeN<R>(pd + x * P::bytes, r);
+            storeBlock(pd + x * P::bytes, r);
         }
         return x;
     }
 }
 
-// Whole 16-byte blocks of two rows exchanged; alpha stays for AC4 pixels.
+// Whole registers of two rows exchanged; alpha stays for AC4 pixels.
 template <class P>
 ptrdiff_t swapForwardSimd(typename P::Elem* a, typename P::Elem* b, ptrdiff_t n) {
+    using namespace simd;
+    using Reg = Vec<uint8_t>;
     constexpr bool alpha = P::moved < P::channels;
     // with alpha the blocks hold whole pixels; otherwise bytes are bytes
     const ptrdiff_t bytes = n * P::bytes;
     uint8_t* pa = reinterpret_cast<uint8_t*>(a);
     uint8_t* pb = reinterpret_cast<uint8_t*>(b);
     ptrdiff_t i = 0;
-    for (; i + 16 <= bytes; i += 16) {
-        const __m128i va = load16(pa + i), vb = load16(pb + i);
+    for (; i + Reg::kBytes <= bytes; i += Reg::kBytes) {
+        const Reg va = load<Reg>(pa + i), vb = load<Reg>(pb + i);
         if constexpr (alpha) {
-            const __m128i m = alphaMask<P>();
-            store16(pa + i, blend16(vb, va, m));
-            store16(pb + i, blend16(va, vb, m));
+            const Reg m = alphaBytes<sizeof(typename P::Elem)>();
+            store(pa + i, select(m, va, vb));
+            store(pb + i, select(m, vb, va));
         } else {
-            store16(pa + i, vb);
-            store16(pb + i, va);
+            store(pa + i, vb);
+            store(pb + i, va);
         }
     }
     if constexpr (alpha) return i / P::bytes;
@@ -321,4 +289,4 @@ Status ZOR_CALL zoriMirror_16u_AC4IR(uint16_t* pSrcDst, int srcDstStep, ImageSiz
 
 }}  // namespace zor::ZOR_NS
 
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)

@@ -9,9 +9,10 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/mxcsr.h"
-#include "image/pixel/rows.h"
+#include "frame/simd.h"
+#include "image/pixel/pixel_rows.h"
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -36,36 +37,43 @@ inline uint16_t shiftFactor(uint32_t s) { return s > 15 ? 0 : static_cast<uint16
 // ---- SIMD ------------------------------------------------------------------------
 
 #if ZOR_SIMD >= 2
+// The blocks are counted out in 16-byte registers of sources, whose halves
+// are widened and stored in order.
+using U8x16 = simd::Vec<uint8_t, 16>;
+using F4 = simd::Vec<float, 16>;
+using I4 = simd::Vec<int32_t, 16>;
+
 ptrdiff_t widen8u16uSimd(const uint8_t* s, uint16_t* d, ptrdiff_t n) {
-    const __m128i z = _mm_setzero_si128();
+    using namespace simd;
     return eachBlock<16>(n, [&](ptrdiff_t x) {
-        const __m128i v = load16(s + x);
-        store16(d + x, _mm_unpacklo_epi8(v, z));
-        store16(d + x + 8, _mm_unpackhi_epi8(v, z));
+        const U8x16 v = load<U8x16>(s + x);
+        store(d + x, widenLo(v));
+        store(d + x + 8, widenHi(v));
     });
 }
 
 // Sixteen bytes to sixteen floats, each byte zero-extended into a 32-bit lane.
 inline void bytesToFloat16(const uint8_t* s, float* d) {
-    const __m128i v = load16(s);
-    __m128i lanes[4];
-#if ZOR_SIMD >= 4
+    using namespace simd;
+    const U8x16 v = load<U8x16>(s);
+    I4 lanes[4];
+#  if ZOR_SIMD >= 4
     // one shuffle per four values: byte k of the load into the low byte of a
     // zeroed lane
     for (int q = 0; q < 4; ++q) {
-        const char b = static_cast<char>(4 * q);
-        lanes[q] = _mm_shuffle_epi8(v, _mm_setr_epi8(b, -1, -1, -1, char(b + 1), -1, -1, -1, char(b + 2), -1, -1, -1,
-                                                     char(b + 3), -1, -1, -1));
+        const uint8_t b = static_cast<uint8_t>(4 * q), z = 255;
+        const U8x16 spread = fromLanes<U8x16>(
+            {b, z, z, z, uint8_t(b + 1), z, z, z, uint8_t(b + 2), z, z, z, uint8_t(b + 3), z, z, z});
+        lanes[q] = bitcast<int32_t>(shuffleBytes(v, spread));
     }
-#else
-    const __m128i z = _mm_setzero_si128();
-    const __m128i lo = _mm_unpacklo_epi8(v, z), hi = _mm_unpackhi_epi8(v, z);
-    lanes[0] = _mm_unpacklo_epi16(lo, z);
-    lanes[1] = _mm_unpackhi_epi16(lo, z);
-    lanes[2] = _mm_unpacklo_epi16(hi, z);
-    lanes[3] = _mm_unpackhi_epi16(hi, z);
-#endif
-    for (int q = 0; q < 4; ++q) _mm_storeu_ps(d + 4 * q, _mm_cvtepi32_ps(lanes[q]));
+#  else
+    const auto lo = widenLo(v), hi = widenHi(v);
+    lanes[0] = bitcast<int32_t>(widenLo(lo));
+    lanes[1] = bitcast<int32_t>(widenHi(lo));
+    lanes[2] = bitcast<int32_t>(widenLo(hi));
+    lanes[3] = bitcast<int32_t>(widenHi(hi));
+#  endif
+    for (int q = 0; q < 4; ++q) store(d + 4 * q, toFloat(lanes[q]));
 }
 
 ptrdiff_t u8ToFloatSimd(const uint8_t* s, float* d, ptrdiff_t n) {
@@ -73,66 +81,65 @@ ptrdiff_t u8ToFloatSimd(const uint8_t* s, float* d, ptrdiff_t n) {
 }
 
 ptrdiff_t s16ToFloatSimd(const int16_t* s, float* d, ptrdiff_t n) {
+    using namespace simd;
+    using V = Vec<int16_t, 16>;
     return eachBlock<8>(n, [&](ptrdiff_t x) {
-        const __m128i v = load16(s + x);
-        // the word in the upper half, then an arithmetic shift: sign extension
-        _mm_storeu_ps(d + x, _mm_cvtepi32_ps(_mm_srai_epi32(_mm_unpacklo_epi16(v, v), 16)));
-        _mm_storeu_ps(d + x + 4, _mm_cvtepi32_ps(_mm_srai_epi32(_mm_unpackhi_epi16(v, v), 16)));
+        const V v = load<V>(s + x);
+        store(d + x, toFloat(widenLo(v)));
+        store(d + x + 4, toFloat(widenHi(v)));
     });
 }
 
-// Float to 8 bits, sixteen values at a time.  Unclamped, cvtps2dq (or
-// cvttps2dq) is right for every input it can represent, and the packs
-// saturate: negative values end as 0, large ones as 255.  The inputs it
-// cannot represent (NaN, values outside the int32 range) raise the invalid
-// flag, and the row is converted again with the upper clamp in float first:
+// Float to 8 bits, sixteen values at a time: the upper clamp in float, then
+// cvtps2dq (or cvttps2dq) and saturating packs.  Negative values end as 0;
 // min returns its second operand when one is NaN, so NaN stays NaN, becomes
-// INT_MIN and ends as 0; 255 and above end as 255.
+// INT_MIN and ends as 0; 255 and above (up to infinity) end as 255.
 //
 // With Aligned the loads fold into the conversions (legacy SSE takes only
 // aligned memory operands), which leaves more room in the out-of-order
 // window for loads in flight.
-template <bool Nearest, bool Clamp, bool Aligned>
-inline __m128i floatToInt(const float* s) {
-    __m128 v = Aligned ? _mm_load_ps(s) : _mm_loadu_ps(s);
-    if constexpr (Clamp) v = _mm_min_ps(_mm_set1_ps(255.0f), v);
-    return Nearest ? _mm_cvtps_epi32(v) : _mm_cvttps_epi32(v);
-}
-template <bool Nearest, bool Clamp, bool Aligned>
-inline __m128i floatToI16x8(const float* s) {
-    return _mm_packs_epi32(floatToInt<Nearest, Clamp, Aligned>(s), floatToInt<Nearest, Clamp, Aligned>(s + 4));
-}
-
-template <bool Nearest, bool Clamp, bool Aligned>
-[[gnu::noinline]] ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
-    return eachBlock<16>(n, [&](ptrdiff_t x) {
-        store16(d + x, _mm_packus_epi16(floatToI16x8<Nearest, Clamp, Aligned>(s + x),
-                                        floatToI16x8<Nearest, Clamp, Aligned>(s + x + 8)));
-    });
-}
-
-// The blocks of a row: fast, and again clamped if the fast pass met an
-// input it cannot take.  With the invalid exception unmasked, where a SIMD
-// conversion of such an input would trap, the row goes element by element.
 template <bool Nearest, bool Aligned>
-ptrdiff_t floatToU8Blocks(const float* s, uint8_t* d, ptrdiff_t n, ConversionScope& csr) {
-    if (!csr.armed()) return 0;
-    ptrdiff_t done = 0;
-    csr.run([&](bool clamp) {
-        done = clamp ? floatToU8Simd<Nearest, true, Aligned>(s, d, n) : floatToU8Simd<Nearest, false, Aligned>(s, d, n);
-    });
-    return done;
+inline I4 floatToInt(const float* s) {
+    using namespace simd;
+    F4 v = Aligned ? loadAligned<F4>(s) : load<F4>(s);
+    v = min(set1<F4>(255.0f), v);
+    return Nearest ? toInt32(v) : toInt32Trunc(v);
+}
+template <bool Nearest, bool Aligned>
+inline simd::Vec<int16_t, 16> floatToI16x8(const float* s) {
+    return simd::narrowSat<int16_t>(floatToInt<Nearest, Aligned>(s), floatToInt<Nearest, Aligned>(s + 4));
 }
 
-// Multiplies 24 words (three registers) by a repeating pattern of factors.
-ptrdiff_t shiftSimd(uint16_t* p, ptrdiff_t n, const __m128i (&f)[3], int period) {
+template <bool Nearest, bool Aligned>
+ptrdiff_t floatToU8Simd(const float* s, uint8_t* d, ptrdiff_t n) {
+    return eachBlock<16>(n, [&](ptrdiff_t x) {
+        simd::store(d + x, simd::narrowSat<uint8_t>(floatToI16x8<Nearest, Aligned>(s + x),
+                                                    floatToI16x8<Nearest, Aligned>(s + x + 8)));
+    });
+}
+
+// The blocks of a row, clamped on the way (see narrowFloats in the vector
+// initialisers: no status flag decides anything).  With the invalid
+// exception unmasked, where a SIMD conversion of a NaN would trap, the row
+// goes element by element.
+template <bool Nearest, bool Aligned>
+ptrdiff_t floatToU8Blocks(const float* s, uint8_t* d, ptrdiff_t n, const ConversionScope& csr) {
+    if (!csr.armed()) return 0;
+    return floatToU8Simd<Nearest, Aligned>(s, d, n);
+}
+
+// Multiplies 24 words (three 16-byte registers) by a repeating pattern of
+// factors.
+using U16x8 = simd::Vec<uint16_t, 16>;
+ptrdiff_t shiftSimd(uint16_t* p, ptrdiff_t n, const U16x8 (&f)[3], int period) {
+    using namespace simd;
     ptrdiff_t x = 0;
     const ptrdiff_t block = period == 3 ? 24 : 8;
     for (; x + block <= n; x += block) {
-        store16(p + x, _mm_mullo_epi16(load16(p + x), f[0]));
+        store(p + x, load<U16x8>(p + x) * f[0]);
         if (period == 3) {
-            store16(p + x + 8, _mm_mullo_epi16(load16(p + x + 8), f[1]));
-            store16(p + x + 16, _mm_mullo_epi16(load16(p + x + 16), f[2]));
+            store(p + x + 8, load<U16x8>(p + x + 8) * f[1]);
+            store(p + x + 16, load<U16x8>(p + x + 16) * f[2]);
         }
     }
     return x;
@@ -176,8 +183,7 @@ struct RowScope {};  // the generic rule needs no state
 
 // The blocks start where the source is 16-byte aligned (when it is at least
 // float aligned).  The elements before and after them go one by one, after
-// the blocks: their comparisons flag a NaN as invalid too, which must not
-// count against the blocks.
+// the blocks.
 template <bool Nearest>
 void toU8Row(const float* s, uint8_t* d, ptrdiff_t n, [[maybe_unused]] RowScope& csr) {
     ptrdiff_t head = 0, end = 0;
@@ -206,11 +212,11 @@ Status shift(const uint32_t* counts, uint16_t* p, int step, ImageSize roi) {
     constexpr int period = C == 1 ? 1 : C;
     const Rows r = rowsOf(roi, C, packed(step, roi, C * sizeof(uint16_t)));
 #if ZOR_SIMD >= 2
-    __m128i fv[3];
+    U16x8 fv[3];
     {
         alignas(16) uint16_t t[24];
         for (int i = 0; i < 24; ++i) t[i] = C == 1 ? f[0] : f[i % period];
-        for (int k = 0; k < 3; ++k) fv[k] = _mm_load_si128(reinterpret_cast<const __m128i*>(t) + k);
+        simd::loadBlock(t, fv);
     }
 #endif
     for (int y = 0; y < r.count; ++y) {
@@ -272,4 +278,4 @@ Status ZOR_CALL zoriLShiftC_16u_AC4IR(const uint32_t* value, uint16_t* pSrcDst, 
 
 }}  // namespace zor::ZOR_NS
 
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)

@@ -10,11 +10,14 @@
 // All of it is integer work: the SSE variant shares the generic entries.
 #include "frame/variant.h"
 #include "frame/status.h"
-#include "image/pixel/rows.h"
+#include "image/pixel/pixel_rows.h"
+#include "image/pixel/shuffle48.h"
 
 #include <cstring>
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
+
+#include "image/pixel/copy_kernels.h"
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -32,365 +35,6 @@ template <class F>
 inline void eachRow(int rows, F&& f) {
     for (int y = 0; y < rows; ++y) f(y);
 }
-
-// ---- generic row kernels ------------------------------------------------------
-
-// Takes N consecutive elements of every source pixel (stride SC) into every
-// destination pixel (stride DC); the destination's other elements stay.
-template <class E, int SC, int DC, int N>
-void pickRow(const E* s, E* d, ptrdiff_t n) {
-    for (ptrdiff_t x = 0; x < n; ++x, s += SC, d += DC)
-        for (int k = 0; k < N; ++k) d[k] = s[k];
-}
-
-template <class E, int C>
-void splitRow(const E* s, E* const* planes, ptrdiff_t n) {
-    for (int k = 0; k < C; ++k) {
-        E* d = planes[k];
-        const E* p = s + k;
-        for (ptrdiff_t x = 0; x < n; ++x, p += C) d[x] = *p;
-    }
-}
-
-template <class E, int C>
-void mergeRow(const E* const* planes, E* d, ptrdiff_t n) {
-    for (int k = 0; k < C; ++k) {
-        const E* s = planes[k];
-        E* p = d + k;
-        for (ptrdiff_t x = 0; x < n; ++x, p += C) *p = s[x];
-    }
-}
-
-template <class E>
-void fillRow(E* d, ptrdiff_t n, E v) {
-    for (ptrdiff_t x = 0; x < n; ++x) d[x] = v;
-}
-
-template <class E>
-void fill3Row(E* d, ptrdiff_t n, const E (&v)[3]) {
-    for (ptrdiff_t x = 0; x < n; ++x, d += 3) {
-        d[0] = v[0];
-        d[1] = v[1];
-        d[2] = v[2];
-    }
-}
-
-// Fills `bytes` bytes of a row with a pattern whose period divides
-// kRepeatBytes: head(d, n) writes the first n bytes, the rest of the row is
-// copies of them.  The copies come from the row's own start, still in the L1
-// cache, and memcpy writes them with the widest stores the processor has,
-// faster than the 16-byte stores of the pattern loops.
-constexpr ptrdiff_t kRepeatBytes = 3072;  // 64 blocks of 48 bytes; a multiple of every pixel size
-template <class Head>
-void repeatFill(uint8_t* d, ptrdiff_t bytes, Head&& head) {
-    const ptrdiff_t first = bytes < kRepeatBytes ? bytes : kRepeatBytes;
-    head(d, first);
-    for (ptrdiff_t i = first; i < bytes; i += first)
-        std::memcpy(d + i, d, static_cast<size_t>(bytes - i < first ? bytes - i : first));
-}
-
-template <class E>
-void swapRow(const E* s, E* d, ptrdiff_t n, int C, const int (&o)[3]) {
-    for (ptrdiff_t x = 0; x < n; ++x, s += C, d += C) {
-        // all three read before any is written: the in-place form relies on it
-        const E a = s[o[0]], b = s[o[1]], c = s[o[2]];
-        d[0] = a;
-        d[1] = b;
-        d[2] = c;
-    }
-}
-
-// ---- SIMD row kernels ---------------------------------------------------------
-
-#if ZOR_SIMD >= 2
-// Repeats the 48-byte pattern p (16 pixels of 8-bit or 8 of 16-bit
-// elements) over the first bytes of d; returns the bytes written (whole blocks).
-inline ptrdiff_t fill48(uint8_t* d, ptrdiff_t bytes, const __m128i (&p)[3]) {
-    return eachBlock<48>(bytes, [&](ptrdiff_t i) { store48(d + i, p); });
-}
-
-template <class E>
-ptrdiff_t fillRowSimd(E* d, ptrdiff_t n, E v) {
-    __m128i p;
-    if constexpr (sizeof(E) == 1) p = _mm_set1_epi8(static_cast<char>(v));
-    else if constexpr (sizeof(E) == 2) p = _mm_set1_epi16(static_cast<short>(v));
-    else p = _mm_set1_epi32(static_cast<int>(v));
-    return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) { store16(d + x, p); });
-}
-#endif
-
-#if ZOR_SIMD >= 4
-// Interleaved three channels <-> three planes, 48 bytes at a time.
-template <int E>
-struct SplitMap {  // output register k = plane k
-    static constexpr int src(int j) {
-        const int plane = j / 16, elem = (j % 16) / E, byte = j % E;
-        return (elem * 3 + plane) * E + byte;
-    }
-};
-
-template <class E>
-ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
-    E* p0 = planes[0];
-    E* p1 = planes[1];
-    E* p2 = planes[2];
-    return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) {
-        __m128i in[3], out[3];
-        load48(s + 3 * x, in);
-        Shuffle48<SplitMap<sizeof(E)>>::apply(in, out);
-        store16(p0 + x, out[0]);
-        store16(p1 + x, out[1]);
-        store16(p2 + x, out[2]);
-    });
-}
-
-// Three planes into interleaved pixels: the first two planes are interleaved
-// into pairs by unpacking (lo: the first half of the pixels, hi: the second,
-// mid: the pairs from kMid on), so every output register is one shuffle of a
-// pair register ORed with one shuffle of the third plane: nine shuffle-unit
-// operations as with three shuffles per output, but half the ORs and fewer
-// register copies.
-template <int E>
-struct MergeShuffles {
-    static constexpr int kMid = E == 1 ? 5 : 3;  // first pixel with an element of plane 0 or 1 in output 1
-    static constexpr int kFirst[3] = {0, kMid, 8 / E};  // first pair of lo, mid, hi
-    alignas(16) uint8_t pairs[3][16];
-    alignas(16) uint8_t third[3][16];
-    constexpr MergeShuffles() : pairs{}, third{} {
-        for (int o = 0; o < 3; ++o)
-            for (int l = 0; l < 16; ++l) {
-                const int elem = (o * 16 + l) / E, byte = l % E, pixel = elem / 3, k = elem % 3;
-                pairs[o][l] = k < 2 ? static_cast<uint8_t>(((pixel - kFirst[o]) * 2 + k) * E + byte) : uint8_t(0x80);
-                third[o][l] = k == 2 ? static_cast<uint8_t>(pixel * E + byte) : uint8_t(0x80);
-            }
-    }
-};
-
-template <class E>
-ptrdiff_t merge3Simd(const E* const* planes, E* d, ptrdiff_t n) {
-    constexpr int e = sizeof(E);
-    alignas(16) static constexpr MergeShuffles<e> t{};
-    const auto mask = [](const uint8_t* m) { return _mm_load_si128(reinterpret_cast<const __m128i*>(m)); };
-    const E* p0 = planes[0];
-    const E* p1 = planes[1];
-    const E* p2 = planes[2];
-    return eachBlock<16 / e>(n, [&](ptrdiff_t x) {
-        const __m128i a = load16(p0 + x), b = load16(p1 + x), c = load16(p2 + x);
-        const __m128i lo = e == 1 ? _mm_unpacklo_epi8(a, b) : _mm_unpacklo_epi16(a, b);
-        const __m128i hi = e == 1 ? _mm_unpackhi_epi8(a, b) : _mm_unpackhi_epi16(a, b);
-        const __m128i mid = _mm_alignr_epi8(hi, lo, MergeShuffles<e>::kMid * 2 * e);
-        const __m128i pairs[3] = {lo, mid, hi};
-        E* out = d + 3 * x;
-        for (int o = 0; o < 3; ++o)
-            store16(out + o * (16 / e),
-                    _mm_or_si128(_mm_shuffle_epi8(pairs[o], mask(t.pairs[o])), _mm_shuffle_epi8(c, mask(t.third[o]))));
-    });
-}
-
-// Four channels <-> four planes, 64 bytes at a time: one shuffle per
-// register groups each channel's elements into one 32-bit lane, then a 4 x 4
-// transpose of those lanes across the registers (its own inverse).
-inline void transpose4x4(__m128i (&v)[4]) {
-    const __m128i t0 = _mm_unpacklo_epi32(v[0], v[1]), t1 = _mm_unpackhi_epi32(v[0], v[1]);
-    const __m128i t2 = _mm_unpacklo_epi32(v[2], v[3]), t3 = _mm_unpackhi_epi32(v[2], v[3]);
-    v[0] = _mm_unpacklo_epi64(t0, t2);
-    v[1] = _mm_unpackhi_epi64(t0, t2);
-    v[2] = _mm_unpacklo_epi64(t1, t3);
-    v[3] = _mm_unpackhi_epi64(t1, t3);
-}
-// Lane k of the result holds channel k of the register's pixels.
-template <int E>
-inline __m128i groupChannels() {
-    if constexpr (E == 1) return _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
-    else return _mm_setr_epi8(0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15);
-}
-template <int E>
-inline __m128i spreadChannels() {  // the inverse of groupChannels
-    if constexpr (E == 1) return _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15);
-    else return _mm_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, 2, 3, 6, 7, 10, 11, 14, 15);
-}
-
-template <class E>
-ptrdiff_t split4Simd(const E* s, E* const* planes, ptrdiff_t n) {
-    constexpr ptrdiff_t per = 16 / sizeof(E);
-    const __m128i g = groupChannels<sizeof(E)>();
-    ptrdiff_t x = 0;
-    for (; x + per <= n; x += per) {
-        __m128i v[4];
-        for (int k = 0; k < 4; ++k) v[k] = _mm_shuffle_epi8(load16(s + 4 * x + k * per), g);
-        transpose4x4(v);
-        for (int k = 0; k < 4; ++k) store16(planes[k] + x, v[k]);
-    }
-    return x;
-}
-
-template <class E>
-ptrdiff_t merge4Simd(const E* const* planes, E* d, ptrdiff_t n) {
-    constexpr ptrdiff_t per = 16 / sizeof(E);
-    const __m128i sp = spreadChannels<sizeof(E)>();
-    ptrdiff_t x = 0;
-    for (; x + per <= n; x += per) {
-        __m128i v[4];
-        for (int k = 0; k < 4; ++k) v[k] = load16(planes[k] + x);
-        transpose4x4(v);
-        for (int k = 0; k < 4; ++k) store16(d + 4 * x + k * per, _mm_shuffle_epi8(v[k], sp));
-    }
-    return x;
-}
-
-// One element of every SC-element pixel (SC = 3 or 4) into a plain row.
-// The loads never reach past the last chosen element: the pointer may
-// address the pixel's last channel, with nothing of the row after it.
-template <class E, int SC>
-struct PickMap {
-    static constexpr int src(int j) { return (j / static_cast<int>(sizeof(E))) * SC * sizeof(E) + j % sizeof(E); }
-};
-template <class E, int SC>
-ptrdiff_t pickOneSimd(const E* s, E* d, ptrdiff_t n) {
-    constexpr ptrdiff_t per = 16 / sizeof(E);
-    // masks for register r of the SC-register block: output lane j takes
-    // byte src(j) - 16 r when it falls into register r
-    alignas(16) static constexpr auto masks = [] {
-        struct { uint8_t m[SC][16]; } t{};
-        for (int r = 0; r < SC; ++r)
-            for (int j = 0; j < 16; ++j) {
-                const int b = PickMap<E, SC>::src(j);
-                t.m[r][j] = b / 16 == r ? static_cast<uint8_t>(b % 16) : uint8_t(0x80);
-            }
-        return t;
-    }();
-    ptrdiff_t x = 0;
-    // last chosen element at (n-1)*SC: the block [x*SC, x*SC + per*SC) must end by it
-    for (; (x + per) * SC <= (n - 1) * SC + 1; x += per) {
-        const uint8_t* b = reinterpret_cast<const uint8_t*>(s + x * SC);
-        __m128i acc = _mm_shuffle_epi8(load16(b), _mm_load_si128(reinterpret_cast<const __m128i*>(masks.m[0])));
-        for (int r = 1; r < SC; ++r)
-            acc = _mm_or_si128(acc, _mm_shuffle_epi8(load16(b + 16 * r),
-                                                     _mm_load_si128(reinterpret_cast<const __m128i*>(masks.m[r]))));
-        store16(d + x, acc);
-    }
-    return x;
-}
-
-// Four-element pixels with alpha <-> three-element pixels, 64 <-> 48 bytes:
-// within a register the colour elements are packed into its first 12 bytes
-// (or spread from them), and byte shifts move the 12-byte groups between
-// registers.  E is the element size; the masks only differ by it.
-template <int E>
-inline __m128i packColour() {  // 16 bytes of 4-element pixels -> 12 bytes of colour, 4 zero
-    if constexpr (E == 1) return _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, -1, -1, -1, -1);
-    else return _mm_setr_epi8(0, 1, 2, 3, 4, 5, 8, 9, 10, 11, 12, 13, -1, -1, -1, -1);
-}
-template <int E>
-inline __m128i spreadColour() {  // 12 bytes of colour -> 16 bytes of pixels, alpha zero
-    if constexpr (E == 1) return _mm_setr_epi8(0, 1, 2, -1, 3, 4, 5, -1, 6, 7, 8, -1, 9, 10, 11, -1);
-    else return _mm_setr_epi8(0, 1, 2, 3, 4, 5, -1, -1, 6, 7, 8, 9, 10, 11, -1, -1);
-}
-
-template <class E>
-ptrdiff_t dropAlphaSimd(const E* s, E* d, ptrdiff_t n) {
-    constexpr ptrdiff_t per = 16 / sizeof(E);  // pixels per 64 source bytes
-    const __m128i m = packColour<sizeof(E)>();
-    const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
-    uint8_t* db = reinterpret_cast<uint8_t*>(d);
-    ptrdiff_t x = 0;
-    for (; x + per <= n; x += per, sb += 64, db += 48) {
-        const __m128i a = _mm_shuffle_epi8(load16(sb), m), b = _mm_shuffle_epi8(load16(sb + 16), m);
-        const __m128i c = _mm_shuffle_epi8(load16(sb + 32), m), e = _mm_shuffle_epi8(load16(sb + 48), m);
-        store16(db, _mm_or_si128(a, _mm_slli_si128(b, 12)));
-        store16(db + 16, _mm_or_si128(_mm_srli_si128(b, 4), _mm_slli_si128(c, 8)));
-        store16(db + 32, _mm_or_si128(_mm_srli_si128(c, 8), _mm_slli_si128(e, 4)));
-    }
-    return x;
-}
-
-template <class E>
-ptrdiff_t keepAlphaSimd(const E* s, E* d, ptrdiff_t n) {
-    constexpr ptrdiff_t per = 16 / sizeof(E);
-    const __m128i m = spreadColour<sizeof(E)>(), alpha = alphaBytes<sizeof(E)>();
-    const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
-    uint8_t* db = reinterpret_cast<uint8_t*>(d);
-    ptrdiff_t x = 0;
-    for (; x + per <= n; x += per, sb += 48, db += 64) {
-        const __m128i i0 = load16(sb), i1 = load16(sb + 16), i2 = load16(sb + 32);
-        const __m128i g[4] = {i0, _mm_alignr_epi8(i1, i0, 12), _mm_alignr_epi8(i2, i1, 8), _mm_srli_si128(i2, 4)};
-        for (int k = 0; k < 4; ++k)  // the destination's alpha is carried over as it is
-            store16(db + 16 * k, blend16(_mm_shuffle_epi8(g[k], m), load16(db + 16 * k), alpha));
-    }
-    return x;
-}
-
-struct DupMap {  // one plane into all three channels
-    static constexpr int src(int j) { return j / 3; }
-};
-
-// Sixteen three-channel 8-bit pixels under a mask: where the mask byte is
-// non-zero the pixel takes `fresh`, elsewhere it keeps what it holds.
-inline void maskedStore48(uint8_t* d, const uint8_t* m, const __m128i (&fresh)[3]) {
-    const __m128i stays = _mm_cmpeq_epi8(load16(m), _mm_setzero_si128());
-    const __m128i in[3] = {stays, stays, stays};
-    __m128i keep[3];
-    Shuffle48<DupMap>::apply(in, keep);
-    for (int k = 0; k < 3; ++k) store16(d + 16 * k, blend16(fresh[k], load16(d + 16 * k), keep[k]));
-}
-
-// Channel order applied to 48-byte blocks of three-element pixels: output
-// register k draws on input registers k-1..k+1 only (a pixel never moves
-// further than its own bytes).
-struct SwapShuffle {
-    __m128i m[3][3];
-    SwapShuffle(const int (&o)[3], int elemBytes) {
-        alignas(16) uint8_t t[3][3][16];
-        for (int j = 0; j < 48; ++j) {
-            const int elem = j / elemBytes, byte = j % elemBytes;
-            const int s = ((elem / 3) * 3 + o[elem % 3]) * elemBytes + byte;
-            for (int r = 0; r < 3; ++r)
-                t[j / 16][r][j % 16] = s / 16 == r ? static_cast<uint8_t>(s % 16) : uint8_t(0x80);
-        }
-        for (int a = 0; a < 3; ++a)
-            for (int r = 0; r < 3; ++r) m[a][r] = _mm_load_si128(reinterpret_cast<const __m128i*>(t[a][r]));
-    }
-    void apply(const __m128i (&in)[3], __m128i (&out)[3]) const {
-        out[0] = _mm_or_si128(_mm_shuffle_epi8(in[0], m[0][0]), _mm_shuffle_epi8(in[1], m[0][1]));
-        out[1] = _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(in[0], m[1][0]), _mm_shuffle_epi8(in[1], m[1][1])),
-                              _mm_shuffle_epi8(in[2], m[1][2]));
-        out[2] = _mm_or_si128(_mm_shuffle_epi8(in[1], m[2][1]), _mm_shuffle_epi8(in[2], m[2][2]));
-    }
-};
-
-// Returns the bytes done (whole 48-byte blocks).
-ptrdiff_t swap3Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle& sh) {
-    return eachBlock<48>(bytes, [&](ptrdiff_t i) {
-        __m128i in[3], out[3];
-        load48(s + i, in);
-        sh.apply(in, out);
-        store48(d + i, out);
-    });
-}
-
-// Four-element pixels: the order picks colour elements inside 16 bytes; the
-// destination's alpha is carried over unchanged.
-struct SwapShuffle4 {
-    __m128i m, alpha;
-    SwapShuffle4(const int (&o)[3], int elemBytes) {
-        alignas(16) uint8_t t[16], a[16];
-        for (int j = 0; j < 16; ++j) {
-            const int elem = j / elemBytes, byte = j % elemBytes, pixel = elem / 4, k = elem % 4;
-            t[j] = k == 3 ? uint8_t(0x80) : static_cast<uint8_t>((pixel * 4 + o[k]) * elemBytes + byte);
-            a[j] = k == 3 ? 0xFF : 0;
-        }
-        m = _mm_load_si128(reinterpret_cast<const __m128i*>(t));
-        alpha = _mm_load_si128(reinterpret_cast<const __m128i*>(a));
-    }
-};
-
-ptrdiff_t swap4Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle4& sh) {
-    ptrdiff_t i = 0;
-    for (; i + 16 <= bytes; i += 16)
-        store16(d + i, blend16(_mm_shuffle_epi8(load16(s + i), sh.m), load16(d + i), sh.alpha));
-    return i;
-}
-#endif
 
 // ---- the forms ------------------------------------------------------------------
 
@@ -517,9 +161,8 @@ Status setC3(const T* value, T* pDst, int dstStep, ImageSize roi) {
 #if ZOR_SIMD >= 2
     alignas(16) E pattern[48 / sizeof(E)];
     for (size_t i = 0; i < 48 / sizeof(E); ++i) pattern[i] = v[i % 3];
-    const __m128i p[3] = {_mm_load_si128(reinterpret_cast<const __m128i*>(pattern)),
-                          _mm_load_si128(reinterpret_cast<const __m128i*>(pattern) + 1),
-                          _mm_load_si128(reinterpret_cast<const __m128i*>(pattern) + 2)};
+    Bytes16 p[3];
+    simd::loadBlock(pattern, p);
 #endif
     eachRow(r.count, [&](int y) {
         repeatFill(reinterpret_cast<uint8_t*>(rowAt(pDst, dstStep, y)), r.elems * ptrdiff_t(3 * sizeof(E)),
@@ -644,8 +287,8 @@ Status ZOR_CALL zoriCopy_8u_C3MR(const uint8_t* pSrc, int srcStep, uint8_t* pDst
         int x = 0;
 #if ZOR_SIMD >= 4
         for (; x + 16 <= roiSize.width; x += 16) {
-            __m128i fresh[3];
-            load48(s + 3 * x, fresh);
+            Bytes16 fresh[3];
+            simd::loadBlock(s + 3 * x, fresh);
             maskedStore48(d + 3 * x, m + x, fresh);
         }
 #endif
@@ -698,11 +341,11 @@ Status ZOR_CALL zoriDup_8u_C1C3R(const uint8_t* pSrc, int srcStep, uint8_t* pDst
         ptrdiff_t x = 0;
 #if ZOR_SIMD >= 4
         for (; x + 16 <= r.elems; x += 16) {
-            const __m128i v = load16(s + x);
-            const __m128i in[3] = {v, v, v};
-            __m128i out[3];
+            const Bytes16 v = simd::load<Bytes16>(s + x);
+            const Bytes16 in[3] = {v, v, v};
+            Bytes16 out[3];
             Shuffle48<DupMap>::apply(in, out);
-            store48(d + 3 * x, out);
+            simd::storeBlock(d + 3 * x, out);
         }
 #endif
         for (; x < r.elems; ++x) d[3 * x] = d[3 * x + 1] = d[3 * x + 2] = s[x];
@@ -739,8 +382,8 @@ Status ZOR_CALL zoriSet_8u_C3MR(const uint8_t* value, uint8_t* pDst, int dstStep
 #if ZOR_SIMD >= 4
     alignas(16) uint8_t pattern[48];
     for (int i = 0; i < 48; ++i) pattern[i] = value[i % 3];
-    __m128i fresh[3];
-    load48(pattern, fresh);
+    Bytes16 fresh[3];
+    simd::loadBlock(pattern, fresh);
 #endif
     for (int y = 0; y < roiSize.height; ++y) {
         uint8_t* d = rowAt(pDst, dstStep, y);
@@ -802,4 +445,4 @@ Status ZOR_CALL zoriCopyReplicateBorder_16s_C1R(const int16_t* pSrc, int srcStep
 
 }}  // namespace zor::ZOR_NS
 
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)

@@ -4,6 +4,7 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
+#include "frame/simd.h"
 #include "frame/memory.h"
 
 #include <climits>
@@ -32,7 +33,7 @@ inline int64_t pairCount(int64_t lenCeps) { return (lenCeps + 1) / 2; }
 
 // x[n] -= val x[n-1] from the end, so every step sees the original x[n-1].
 // In double, rounded once; the SSE2 path does the same four at a time.
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 Status ZOR_CALL zorsPreemphasize_32f(float* pSrcDst, int len, float val) {
     if (!pSrcDst) return StatusNullPointer;
     if (len < 1) return StatusBadSize;
@@ -41,30 +42,28 @@ Status ZOR_CALL zorsPreemphasize_32f(float* pSrcDst, int len, float val) {
     const double v = val;
     int n = len - 1;
 #if ZOR_SIMD >= 2
-    const __m128d vv = _mm_set1_pd(v);
+    // blocks of four as two 16-byte registers of doubles
+    using namespace simd;
+    using F4 = Vec<float, 16>;
+    using D2 = Vec<double, 16>;
+    const D2 vv = set1<D2>(v);
     // Blocks of four from the top, each value converted once: a block's
     // lowest predecessor comes from the block below it, which is loaded
     // and converted one step ahead (before this block is stored).
     if (n >= 7) {
-        auto pairAt = [](const float* p) {
-            return _mm_cvtps_pd(_mm_castsi128_ps(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p))));
-        };
-        __m128d lo = pairAt(x + n - 3), hi = pairAt(x + n - 1);
+        D2 lo = loadWidened<D2>(x + n - 3), hi = loadWidened<D2>(x + n - 1);
         for (; n >= 7; n -= 4) {
-            const __m128d belowLo = pairAt(x + n - 7), belowHi = pairAt(x + n - 5);
-            const __m128d prevLo = _mm_shuffle_pd(belowHi, lo, 1), prevHi = _mm_shuffle_pd(lo, hi, 1);
-            const __m128d a = _mm_sub_pd(lo, _mm_mul_pd(vv, prevLo)), b = _mm_sub_pd(hi, _mm_mul_pd(vv, prevHi));
-            _mm_storeu_ps(x + n - 3, _mm_movelh_ps(_mm_cvtpd_ps(a), _mm_cvtpd_ps(b)));
+            const D2 belowLo = loadWidened<D2>(x + n - 7), belowHi = loadWidened<D2>(x + n - 5);
+            // the predecessors: one lane down
+            const D2 prevLo = alignBytes<8>(lo, belowHi), prevHi = alignBytes<8>(hi, lo);
+            store(x + n - 3, narrowSat<float>(lo - vv * prevLo, hi - vv * prevHi));
             lo = belowLo;
             hi = belowHi;
         }
     }
     for (; n >= 4; n -= 4) {
-        const __m128 cur = _mm_loadu_ps(x + n - 3), prev = _mm_loadu_ps(x + n - 4);
-        const __m128d lo = _mm_sub_pd(_mm_cvtps_pd(cur), _mm_mul_pd(vv, _mm_cvtps_pd(prev)));
-        const __m128d hi = _mm_sub_pd(_mm_cvtps_pd(_mm_movehl_ps(cur, cur)),
-                                      _mm_mul_pd(vv, _mm_cvtps_pd(_mm_movehl_ps(prev, prev))));
-        _mm_storeu_ps(x + n - 3, _mm_movelh_ps(_mm_cvtpd_ps(lo), _mm_cvtpd_ps(hi)));
+        const F4 cur = load<F4>(x + n - 3), prev = load<F4>(x + n - 4);
+        store(x + n - 3, narrowSat<float>(widenLo(cur) - vv * widenLo(prev), widenHi(cur) - vv * widenHi(prev)));
     }
 #endif
     for (; n >= 1; --n) x[n] = toFloat(double(x[n]) - v * double(x[n - 1]));
@@ -74,23 +73,25 @@ Status ZOR_CALL zorsPreemphasize_32f(float* pSrcDst, int len, float val) {
 
 #if ZOR_SIMD >= 2
 // G pairs of rows (w: G blocks of n pairs) times x, into sums[0 .. 2G-1].
+// (The pairs table holds two coefficients' terms per 16-byte register.)
 template <int G>
 inline void pairSums(const double* w, const float* x, int n, double* sums) {
-    __m128d acc[G];
-    for (int q = 0; q < G; ++q) acc[q] = _mm_setzero_pd();
+    using namespace simd;
+    using D2 = Vec<double, 16>;
+    D2 acc[G];
+    for (int q = 0; q < G; ++q) acc[q] = zero<D2>();
     for (int j = 0; j < n; ++j) {
-        const __m128d v = _mm_set1_pd(double(x[j]));
-        for (int q = 0; q < G; ++q)
-            acc[q] = _mm_add_pd(acc[q], _mm_mul_pd(_mm_load_pd(w + (int64_t(q) * n + j) * 2), v));
+        const D2 v = set1<D2>(double(x[j]));
+        for (int q = 0; q < G; ++q) acc[q] = acc[q] + loadAligned<D2>(w + (int64_t(q) * n + j) * 2) * v;
     }
-    for (int q = 0; q < G; ++q) _mm_storeu_pd(sums + 2 * q, acc[q]);
+    for (int q = 0; q < G; ++q) store(sums + 2 * q, acc[q]);
 }
 #endif
 
 // Cosine transform with lifter.  Each coefficient's sum runs in increasing
 // j (the products of two floats are exact in double); the SSE2 path runs
 // two coefficients per register and up to eight side by side.
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 Status ZOR_CALL zorsDCTLifter_32f(const float* pSrc, float* pDst, const void* pDCTLifter) {
     if (Status s = anyNull(pSrc, pDst, pDCTLifter)) return s;
     const DctLifter* d = static_cast<const DctLifter*>(pDCTLifter);
@@ -127,7 +128,7 @@ Status ZOR_CALL zorsDCTLifter_32f(const float* pSrc, float* pDst, const void* pD
 }
 #endif
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 Status ZOR_CALL zorsCopyWithPadding_32f(const float* pSrc, int lenSrc, float* pDst, int lenDst) {
     if (Status s = anyNull(pSrc, pDst)) return s;
     if (lenSrc < 1 || lenDst < 1 || lenDst < lenSrc) return StatusBadSize;
@@ -246,6 +247,6 @@ Status ZOR_CALL zorsAutoCorrLagMax_Fwd_16s(const int16_t* pSrc, int len, int low
     *pMax = best >= (1 << 30) ? INT32_MAX : best < -(1 << 30) ? INT32_MIN : 2 * best;
     return StatusOk;
 }
-#endif  // ZOR_VARIANT == 0
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 
 }}  // namespace zor::ZOR_NS

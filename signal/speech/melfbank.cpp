@@ -11,7 +11,7 @@
 
 // The vector conversions and magnitudes have no SSE-only entry: that
 // column runs their generic code.
-#if ZOR_VARIANT == 1
+#if !ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 #  define ZOR_ENTRY_NS v0
 #  include "frame/entries.h"
 #endif
@@ -25,7 +25,7 @@ constexpr int kSpectrum = 4;
 constexpr int kRoundZero = 0;
 constexpr int kRoundNear = 1;
 
-#if ZOR_VARIANT == 1
+#if !ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 namespace vec = zor::v0;
 #else
 namespace vec = zor::ZOR_NS;

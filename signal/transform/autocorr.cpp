@@ -9,6 +9,7 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
+#include "frame/simd.h"
 #include "frame/memory.h"
 
 #include <cmath>
@@ -156,16 +157,19 @@ Status ZOR_CALL zorsAutoCorr_32f(const float* pSrc, int srcLen, float* pDst, int
     // the longer lanes then finish their last few terms one by one.
     for (; k + 4 <= lags; k += 4) {
         const int common = srcLen - k - 3;
-        __m128d lo = _mm_setzero_pd(), hi = _mm_setzero_pd();
+        using namespace simd;
+        using F4 = Vec<float, 16>;
+        using D2 = Vec<double, 16>;
+        D2 lo = zero<D2>(), hi = zero<D2>();
         for (int n = 0; n < common; ++n) {
-            const __m128d x = _mm_set1_pd(pSrc[n]);
-            const __m128 y = _mm_loadu_ps(pSrc + n + k);
-            lo = _mm_add_pd(lo, _mm_mul_pd(x, _mm_cvtps_pd(y)));
-            hi = _mm_add_pd(hi, _mm_mul_pd(x, _mm_cvtps_pd(_mm_movehl_ps(y, y))));
+            const D2 x = set1<D2>(pSrc[n]);
+            const F4 y = load<F4>(pSrc + n + k);
+            lo = lo + x * widenLo(y);
+            hi = hi + x * widenHi(y);
         }
         double acc[4];
-        _mm_storeu_pd(acc, lo);
-        _mm_storeu_pd(acc + 2, hi);
+        store(acc, lo);
+        store(acc + 2, hi);
         for (int j = 0; j < 4; ++j)
             pDst[k + j] = toFloat(lagTerms(pSrc, k + j, common > 0 ? common : 0, srcLen - k - j, acc[j]));
     }

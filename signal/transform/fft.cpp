@@ -16,6 +16,7 @@
 #include "frame/status.h"
 #include "frame/memory.h"
 #include "frame/fpu.h"
+#include "frame/simd.h"
 #include "signal/transform/fft_internal.h"
 
 #include <cmath>
@@ -115,36 +116,25 @@ void unitRoot(int64_t num, int64_t den, float& c, float& s) {
 }
 
 // ---- four-lane vectors ----------------------------------------------------
+//
+// The passes count out four lanes: V is a 16-byte register of the lane
+// vocabulary from SSE on, and in the generic variant a plain record with the
+// same operations, lane by lane.
 
 #if ZOR_SIMD >= 1
-struct V { __m128 v; };
-inline V ld(const float* p) { return {_mm_loadu_ps(p)}; }
-inline void st(float* p, V a) { _mm_storeu_ps(p, a.v); }
-inline V splat(float x) { return {_mm_set1_ps(x)}; }
-inline V operator+(V a, V b) { return {_mm_add_ps(a.v, b.v)}; }
-inline V operator-(V a, V b) { return {_mm_sub_ps(a.v, b.v)}; }
-inline V operator*(V a, V b) { return {_mm_mul_ps(a.v, b.v)}; }
-inline void transpose(V& a, V& b, V& c, V& d) { _MM_TRANSPOSE4_PS(a.v, b.v, c.v, d.v); }
-inline V reversed(V a) { return {_mm_shuffle_ps(a.v, a.v, _MM_SHUFFLE(0, 1, 2, 3))}; }
-// p[0..7] = re0 im0 re1 im1 ... into re and im lanes
-inline void ldPairs(const float* p, V& re, V& im) {
-    const __m128 a = _mm_loadu_ps(p), b = _mm_loadu_ps(p + 4);
-    re.v = _mm_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
-    im.v = _mm_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
-}
-inline void stPairs(float* p, V re, V im) {
-    _mm_storeu_ps(p, _mm_unpacklo_ps(re.v, im.v));
-    _mm_storeu_ps(p + 4, _mm_unpackhi_ps(re.v, im.v));
-}
+using namespace simd;
+using V = Vec<float, 16>;
 #else
 struct V { float v[4]; };
-inline V ld(const float* p) { return {{p[0], p[1], p[2], p[3]}}; }
-inline void st(float* p, V a) { for (int i = 0; i < 4; ++i) p[i] = a.v[i]; }
-inline V splat(float x) { return {{x, x, x, x}}; }
+template <class>
+inline V load(const float* p) { return {{p[0], p[1], p[2], p[3]}}; }
+inline void store(float* p, V a) { for (int i = 0; i < 4; ++i) p[i] = a.v[i]; }
+template <class>
+inline V set1(float x) { return {{x, x, x, x}}; }
 inline V operator+(V a, V b) { for (int i = 0; i < 4; ++i) a.v[i] += b.v[i]; return a; }
 inline V operator-(V a, V b) { for (int i = 0; i < 4; ++i) a.v[i] -= b.v[i]; return a; }
 inline V operator*(V a, V b) { for (int i = 0; i < 4; ++i) a.v[i] *= b.v[i]; return a; }
-inline void transpose(V& a, V& b, V& c, V& d) {
+inline void transpose4(V& a, V& b, V& c, V& d) {
     V* r[4] = {&a, &b, &c, &d};
     for (int i = 0; i < 4; ++i)
         for (int j = i + 1; j < 4; ++j) {
@@ -153,13 +143,11 @@ inline void transpose(V& a, V& b, V& c, V& d) {
             r[j]->v[i] = t;
         }
 }
-inline V reversed(V a) { return {{a.v[3], a.v[2], a.v[1], a.v[0]}}; }
-inline void ldPairs(const float* p, V& re, V& im) {
-    for (int i = 0; i < 4; ++i) { re.v[i] = p[2 * i]; im.v[i] = p[2 * i + 1]; }
-}
-inline void stPairs(float* p, V re, V im) {
-    for (int i = 0; i < 4; ++i) { p[2 * i] = re.v[i]; p[2 * i + 1] = im.v[i]; }
-}
+inline V reverseLanes(V a) { return {{a.v[3], a.v[2], a.v[1], a.v[0]}}; }
+inline V concatEven(V a, V b) { return {{a.v[0], a.v[2], b.v[0], b.v[2]}}; }
+inline V concatOdd(V a, V b) { return {{a.v[1], a.v[3], b.v[1], b.v[3]}}; }
+inline V zipLo(V a, V b) { return {{a.v[0], b.v[0], a.v[1], b.v[1]}}; }
+inline V zipHi(V a, V b) { return {{a.v[2], b.v[2], a.v[3], b.v[3]}}; }
 #endif
 
 // (ar + i ai)(wr + i wi)
@@ -175,12 +163,19 @@ inline void cmul(V ar, V ai, V wr, V wi, V& rr, V& ri) {
 struct SplitInput {
     const float* re;
     const float* im;
-    void get(int i, V& r, V& m) const { r = ld(re + i); m = ld(im + i); }
+    void get(int i, V& r, V& m) const {
+        r = load<V>(re + i);
+        m = load<V>(im + i);
+    }
 };
 // Complex values packed as re, im pairs (the real transform's input).
 struct PairInput {
     const float* p;
-    void get(int i, V& r, V& m) const { ldPairs(p + 2 * i, r, m); }
+    void get(int i, V& r, V& m) const {
+        const V a = load<V>(p + 2 * i), b = load<V>(p + 2 * i + 4);
+        r = concatEven(a, b);
+        m = concatOdd(a, b);
+    }
 };
 
 // Bit-reversed gather fused with the 4-point transforms: the transform of
@@ -200,25 +195,25 @@ void firstPass(const In& in, float* wr, float* wi, int n, const int32_t* rev) {
         V y1r = d02r + d13i, y1i = d02i - d13r;  // d02 - i d13
         V y2r = s02r - s13r, y2i = s02i - s13i;
         V y3r = d02r - d13i, y3i = d02i + d13r;  // d02 + i d13
-        transpose(y0r, y1r, y2r, y3r);
-        transpose(y0i, y1i, y2i, y3i);
+        transpose4(y0r, y1r, y2r, y3r);
+        transpose4(y0i, y1i, y2i, y3i);
         const int j0 = 4 * rev[c], j1 = 4 * rev[c + 1], j2 = 4 * rev[c + 2], j3 = 4 * rev[c + 3];
-        st(wr + j0, y0r); st(wi + j0, y0i);
-        st(wr + j1, y1r); st(wi + j1, y1i);
-        st(wr + j2, y2r); st(wi + j2, y2i);
-        st(wr + j3, y3r); st(wi + j3, y3i);
+        store(wr + j0, y0r); store(wi + j0, y0i);
+        store(wr + j1, y1r); store(wi + j1, y1i);
+        store(wr + j2, y2r); store(wi + j2, y2i);
+        store(wr + j3, y3r); store(wi + j3, y3i);
     }
 }
 
 // Radix 2 over pairs of 4-point transforms; tw = cos[4], sin[4] of -2 pi k / 8.
 void radix2Pass(const float* ir, const float* ii, float* orr, float* oi, int n, const float* tw) {
-    const V wr = ld(tw), wi = ld(tw + 4);
+    const V wr = load<V>(tw), wi = load<V>(tw + 4);
     for (int b = 0; b < n; b += 8) {
-        const V a0r = ld(ir + b), a0i = ld(ii + b);
+        const V a0r = load<V>(ir + b), a0i = load<V>(ii + b);
         V tr, ti;
-        cmul(ld(ir + b + 4), ld(ii + b + 4), wr, wi, tr, ti);
-        st(orr + b, a0r + tr); st(oi + b, a0i + ti);
-        st(orr + b + 4, a0r - tr); st(oi + b + 4, a0i - ti);
+        cmul(load<V>(ir + b + 4), load<V>(ii + b + 4), wr, wi, tr, ti);
+        store(orr + b, a0r + tr); store(oi + b, a0i + ti);
+        store(orr + b + 4, a0r - tr); store(oi + b + 4, a0i - ti);
     }
 }
 
@@ -228,17 +223,17 @@ void radix2Pass(const float* ir, const float* ii, float* orr, float* oi, int n, 
 inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, int p0, int L,
                        V w1r, V w1i, V w2r, V w2i, V w3r, V w3i) {
     const int p1 = p0 + L, p2 = p1 + L, p3 = p2 + L;
-    const V a0r = ld(ir + p0), a0i = ld(ii + p0);
+    const V a0r = load<V>(ir + p0), a0i = load<V>(ii + p0);
     V t1r, t1i, t2r, t2i, t3r, t3i;
-    cmul(ld(ir + p2), ld(ii + p2), w1r, w1i, t1r, t1i);
-    cmul(ld(ir + p1), ld(ii + p1), w2r, w2i, t2r, t2i);
-    cmul(ld(ir + p3), ld(ii + p3), w3r, w3i, t3r, t3i);
+    cmul(load<V>(ir + p2), load<V>(ii + p2), w1r, w1i, t1r, t1i);
+    cmul(load<V>(ir + p1), load<V>(ii + p1), w2r, w2i, t2r, t2i);
+    cmul(load<V>(ir + p3), load<V>(ii + p3), w3r, w3i, t3r, t3i);
     const V s02r = a0r + t2r, s02i = a0i + t2i, d02r = a0r - t2r, d02i = a0i - t2i;
     const V s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
-    st(orr + p0, s02r + s13r); st(oi + p0, s02i + s13i);
-    st(orr + p2, s02r - s13r); st(oi + p2, s02i - s13i);
-    st(orr + p1, d02r + d13i); st(oi + p1, d02i - d13r);
-    st(orr + p3, d02r - d13i); st(oi + p3, d02i + d13r);
+    store(orr + p0, s02r + s13r); store(oi + p0, s02i + s13i);
+    store(orr + p2, s02r - s13r); store(oi + p2, s02i - s13i);
+    store(orr + p1, d02r + d13i); store(oi + p1, d02i - d13r);
+    store(orr + p3, d02r - d13i); store(oi + p3, d02i + d13r);
 }
 
 // Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds, per
@@ -246,23 +241,23 @@ inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, 
 void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, int L,
                 const float* tw) {
     if (L == 4) {  // one twiddle chunk serves every block: keep it in registers
-        const V w1r = ld(tw), w1i = ld(tw + 4), w2r = ld(tw + 8), w2i = ld(tw + 12);
-        const V w3r = ld(tw + 16), w3i = ld(tw + 20);
+        const V w1r = load<V>(tw), w1i = load<V>(tw + 4), w2r = load<V>(tw + 8), w2i = load<V>(tw + 12);
+        const V w3r = load<V>(tw + 16), w3i = load<V>(tw + 20);
         for (int p0 = 0; p0 < n; p0 += 16) butterfly4(ir, ii, orr, oi, p0, 4, w1r, w1i, w2r, w2i, w3r, w3i);
         return;
     }
     for (int base = 0; base < n; base += 4 * L) {
         const float* t = tw;
         for (int k = 0; k < L; k += 4, t += 24)
-            butterfly4(ir, ii, orr, oi, base + k, L, ld(t), ld(t + 4), ld(t + 8), ld(t + 12),
-                       ld(t + 16), ld(t + 20));
+            butterfly4(ir, ii, orr, oi, base + k, L, load<V>(t), load<V>(t + 4), load<V>(t + 8), load<V>(t + 12),
+                       load<V>(t + 16), load<V>(t + 20));
     }
 }
 
 void scaleArray(float* p, int n, float s) {
-    const V v = splat(s);
+    const V v = set1<V>(s);
     int i = 0;
-    for (; i + 4 <= n; i += 4) st(p + i, ld(p + i) * v);
+    for (; i + 4 <= n; i += 4) store(p + i, load<V>(p + i) * v);
     for (; i < n; ++i) p[i] *= s;
 }
 
@@ -400,14 +395,14 @@ template <class Sink>
 void recombine(const FftSpec* s, const float* zr, const float* zi, int m, Sink& out) {
     const float* rc = s->realTwiddles;
     const float* rs = s->realTwiddles2;
-    const V half = splat(0.5f);
+    const V half = set1<V>(0.5f);
     for (int k = 1; k <= m / 2; k += 4) {
-        const V ar = ld(zr + k), ai = ld(zi + k);
-        const V br = reversed(ld(zr + m - k - 3)), bi = reversed(ld(zi + m - k - 3));
+        const V ar = load<V>(zr + k), ai = load<V>(zi + k);
+        const V br = reverseLanes(load<V>(zr + m - k - 3)), bi = reverseLanes(load<V>(zi + m - k - 3));
         // B = conj Z[m-k]: (br, -bi)
         const V er = half * (ar + br), ei = half * (ai - bi);
         const V dr = ar - br, di = ai + bi;
-        const V c = ld(rc + k), sn = ld(rs + k);
+        const V c = load<V>(rc + k), sn = load<V>(rs + k);
         const V tr = c * di + sn * dr, ti = sn * di - c * dr;
         out.up(k, er + tr, ei + ti);
         out.down(m - k - 3, er - tr, ti - ei);
@@ -419,8 +414,11 @@ void recombine(const FftSpec* s, const float* zr, const float* zi, int m, Sink& 
 // Writes the CCS layout.
 struct CcsSink {
     float* dst;
-    void up(int k, V re, V im) { stPairs(dst + 2 * k, re, im); }
-    void down(int k, V re, V im) { stPairs(dst + 2 * k, reversed(re), reversed(im)); }
+    void up(int k, V re, V im) {
+        store(dst + 2 * k, zipLo(re, im));
+        store(dst + 2 * k + 4, zipHi(re, im));
+    }
+    void down(int k, V re, V im) { up(k, reverseLanes(re), reverseLanes(im)); }
     void ends(float x0, float xm, int m) {
         dst[0] = x0;
         dst[1] = 0.0f;
@@ -436,30 +434,27 @@ struct MagnitudeSink {
     float* mag;
 #if ZOR_SIMD >= 2
     static V magnitudes(V re, V im) {
-        auto half = [](__m128 r, __m128 i) {
-            const __m128d a = _mm_cvtps_pd(r), b = _mm_cvtps_pd(i);
-            return _mm_cvtpd_ps(_mm_sqrt_pd(_mm_add_pd(_mm_mul_pd(a, a), _mm_mul_pd(b, b))));
-        };
-        return {_mm_movelh_ps(half(re.v, im.v), half(_mm_movehl_ps(re.v, re.v), _mm_movehl_ps(im.v, im.v)))};
+        const auto norm = [](auto r, auto i) { return sqrt(r * r + i * i); };  // on doubles
+        return narrowSat<float>(norm(widenLo(re), widenLo(im)), norm(widenHi(re), widenHi(im)));
     }
 #else
     static V magnitudes(V re, V im) {
         alignas(16) float r[4], i[4], out[4];
-        st(r, re);
-        st(i, im);
+        store(r, re);
+        store(i, im);
         for (int l = 0; l < 4; ++l) {
             const double a = r[l], b = i[l];
             out[l] = toFloat(std::sqrt(toDouble(a * a + b * b)));
         }
-        return ld(out);
+        return load<V>(out);
     }
 #endif
     static float magnitude(float x) {
         const double a = x;
         return toFloat(std::sqrt(toDouble(a * a + 0.0)));
     }
-    void up(int k, V re, V im) { st(mag + k, magnitudes(re, im)); }
-    void down(int k, V re, V im) { st(mag + k, reversed(magnitudes(re, im))); }
+    void up(int k, V re, V im) { store(mag + k, magnitudes(re, im)); }
+    void down(int k, V re, V im) { store(mag + k, reverseLanes(magnitudes(re, im))); }
     void ends(float x0, float xm, int m) {
         mag[0] = magnitude(x0);
         mag[m] = magnitude(xm);

@@ -5,6 +5,7 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
+#include "frame/simd.h"
 #include "frame/memory.h"
 
 #include <cmath>
@@ -66,19 +67,23 @@ int drawAccepted(Generator& g, int n, double* u1s, double* u2s, double* qs, int 
     for (int j = 0; j < n; ++j) g.pair(w1[j], w2[j]);
     int j = 0;
 #if ZOR_SIMD >= 2
-    const __m128d unit = _mm_set1_pd(kUnit), one = _mm_set1_pd(1.0), zero = _mm_setzero_pd();
+    // two pairs per 16-byte register, each kept or dropped on its own
+    using namespace simd;
+    using I4 = Vec<int32_t, 16>;
+    using D2 = Vec<double, 16>;
+    const D2 unit = set1<D2>(kUnit), one = set1<D2>(1.0), z = zero<D2>();
     for (; j + 2 <= n; j += 2) {
-        const __m128d u1 = _mm_mul_pd(unit, _mm_cvtepi32_pd(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(w1 + j))));
-        const __m128d u2 = _mm_mul_pd(unit, _mm_cvtepi32_pd(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(w2 + j))));
-        const __m128d q = _mm_add_pd(_mm_mul_pd(u1, u1), _mm_mul_pd(u2, u2));
-        const int ok = _mm_movemask_pd(_mm_and_pd(_mm_cmplt_pd(q, one), _mm_cmpneq_pd(q, zero)));
-        _mm_storel_pd(u1s + got, u1);
-        _mm_storel_pd(u2s + got, u2);
-        _mm_storel_pd(qs + got, q);
+        const D2 u1 = unit * toDoubleLo(loadHalf<I4>(w1 + j));
+        const D2 u2 = unit * toDoubleLo(loadHalf<I4>(w2 + j));
+        const D2 q = u1 * u1 + u2 * u2;
+        const int ok = laneMask(andNot(eq(q, z), lt(q, one)));
+        u1s[got] = getLane<0>(u1);
+        u2s[got] = getLane<0>(u2);
+        qs[got] = getLane<0>(q);
         got += ok & 1;
-        _mm_storeh_pd(u1s + got, u1);
-        _mm_storeh_pd(u2s + got, u2);
-        _mm_storeh_pd(qs + got, q);
+        u1s[got] = getLane<1>(u1);
+        u2s[got] = getLane<1>(u2);
+        qs[got] = getLane<1>(q);
         got += ok >> 1;
     }
 #endif
@@ -144,22 +149,26 @@ Status ZOR_CALL zorsRandGauss_32f(float* pDst, int len, void* pState) {
         for (int t = 0; t < want; ++t) fs[t] = toDouble(-2.0 * std::log(qs[t]));
         int t = 0;
 #if ZOR_SIMD >= 2
-        // IEEE division and square root: the same bits two at a time
-        for (; t + 2 <= want; t += 2)
-            _mm_storeu_pd(fs + t, _mm_sqrt_pd(_mm_div_pd(_mm_loadu_pd(fs + t), _mm_loadu_pd(qs + t))));
+        // IEEE division and square root: the same bits a register at a time
+        using D = simd::Vec<double>;
+        for (; t + D::kLanes <= want; t += D::kLanes)
+            simd::store(fs + t, simd::sqrt(simd::load<D>(fs + t) / simd::load<D>(qs + t)));
 #endif
         for (; t < want; ++t) fs[t] = std::sqrt(toDouble(fs[t] / qs[t]));
         t = 0;
 #if ZOR_SIMD >= 2
         // Whole pairs two at a time: (u2, u1) of pair t, then of pair t + 1.
         const int whole = (len - i) / 2 < want ? (len - i) / 2 : want;
-        const __m128d sdV = _mm_set1_pd(sd), meanV = _mm_set1_pd(mean);
-        for (; t + 2 <= whole; t += 2, i += 4) {
-            const __m128d sf = _mm_mul_pd(sdV, _mm_loadu_pd(fs + t));
-            const __m128d v2 = _mm_add_pd(_mm_mul_pd(sf, _mm_loadu_pd(u2s + t)), meanV);
-            const __m128d v1 = _mm_add_pd(_mm_mul_pd(sf, _mm_loadu_pd(u1s + t)), meanV);
-            _mm_storeu_ps(pDst + i, _mm_movelh_ps(_mm_cvtpd_ps(_mm_unpacklo_pd(v2, v1)),
-                                                  _mm_cvtpd_ps(_mm_unpackhi_pd(v2, v1))));
+        {
+            using namespace simd;
+            using D2 = Vec<double, 16>;
+            const D2 sdV = set1<D2>(sd), meanV = set1<D2>(mean);
+            for (; t + 2 <= whole; t += 2, i += 4) {
+                const D2 sf = sdV * load<D2>(fs + t);
+                const D2 v2 = sf * load<D2>(u2s + t) + meanV;
+                const D2 v1 = sf * load<D2>(u1s + t) + meanV;
+                store(pDst + i, narrowSat<float>(zipLo(v2, v1), zipHi(v2, v1)));
+            }
         }
 #endif
         for (; t < want; ++t) {

@@ -20,6 +20,8 @@
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
+#include "frame/mxcsr.h"
+#include "frame/simd.h"
 
 #include <cmath>
 #include <cstring>
@@ -27,7 +29,7 @@
 
 namespace zor { namespace ZOR_NS {
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 namespace {
 
 constexpr double kTwoPi = 6.283185307179586;
@@ -118,48 +120,41 @@ struct KeptWeights {
 };
 KeptWeights kept;
 
-// Everything the recurrence's roundings depend on: the SSE control bits
-// (rounding, flush-to-zero, denormals-are-zero, not the sticky flags) and
-// the x87 control word, which the library cosine may use.
-inline uint32_t arithmeticState() {
-    uint16_t cw;
-    __asm__ volatile("fnstcw %0" : "=m"(cw));
-    return (_mm_getcsr() & 0xFFC0u) | (uint32_t(cw) << 16);
-}
-
 template <class T>
 void applyWeights(const T* s, T* d, int n, const double* w) {
     for (int i = 0; i < n; ++i) d[i] = weigh(s[i], w[i]);
 }
-// Two floats widened straight from a 64-bit load: no shuffle is needed to
-// reach the upper pair, which measured faster than splitting a 16-byte load.
-inline __m128d widen2(const void* p) {
-    return _mm_cvtps_pd(_mm_castsi128_ps(_mm_loadl_epi64(static_cast<const __m128i*>(p))));
-}
-inline void narrowStore4(void* p, __m128d lo, __m128d hi) {
-    _mm_storeu_ps(static_cast<float*>(p), _mm_movelh_ps(_mm_cvtpd_ps(lo), _mm_cvtpd_ps(hi)));
-}
+// The table is 16-byte aligned and read two weights at a time.
+using D2 = simd::Vec<double, 16>;
+
+// Floats are widened straight from 64-bit loads (loadWidened): no shuffle is
+// needed to reach the upper pair, which measured faster than splitting a
+// 16-byte load.
 void applyWeights(const float* s, float* d, int n, const double* w) {
+    using namespace simd;
     int i = 0;
     for (; i + 4 <= n; i += 4)
-        narrowStore4(d + i, _mm_mul_pd(widen2(s + i), _mm_load_pd(w + i)),
-                     _mm_mul_pd(widen2(s + i + 2), _mm_load_pd(w + i + 2)));
+        store(d + i, narrowSat<float>(loadWidened<D2>(s + i) * loadAligned<D2>(w + i),
+                                      loadWidened<D2>(s + i + 2) * loadAligned<D2>(w + i + 2)));
     for (; i < n; ++i) d[i] = weigh(s[i], w[i]);
 }
 void applyWeights(const Complex32f* s, Complex32f* d, int n, const double* w) {
+    using namespace simd;
+    const auto at = [](const Complex32f* c) { return loadWidened<D2>(&c->re); };
     int k = 0;
     for (; k + 2 <= n; k += 2)
-        narrowStore4(d + k, _mm_mul_pd(widen2(s + k), _mm_set1_pd(w[k])),
-                     _mm_mul_pd(widen2(s + k + 1), _mm_set1_pd(w[k + 1])));
+        storeTo(d + k, narrowSat<float>(at(s + k) * set1<D2>(w[k]), at(s + k + 1) * set1<D2>(w[k + 1])));
     for (; k < n; ++k) d[k] = weigh(s[k], w[k]);
 }
 void applyWeights(const double* s, double* d, int n, const double* w) {
+    using namespace simd;
     int i = 0;
-    for (; i + 2 <= n; i += 2) _mm_storeu_pd(d + i, _mm_mul_pd(_mm_loadu_pd(s + i), _mm_load_pd(w + i)));
+    for (; i + 2 <= n; i += 2) store(d + i, load<D2>(s + i) * loadAligned<D2>(w + i));
     for (; i < n; ++i) d[i] = weigh(s[i], w[i]);
 }
 void applyWeights(const Complex64f* s, Complex64f* d, int n, const double* w) {
-    for (int k = 0; k < n; ++k) _mm_storeu_pd(&d[k].re, _mm_mul_pd(_mm_loadu_pd(&s[k].re), _mm_set1_pd(w[k])));
+    using namespace simd;
+    for (int k = 0; k < n; ++k) store(&d[k].re, load<D2>(&s[k].re) * set1<D2>(w[k]));
 }
 
 // Applies the kept table, or rebuilds it while applying the recurrence when
@@ -236,6 +231,6 @@ Status ZOR_CALL zorsWinHamming_64fc_I(Complex64f* pSrcDst, int len) {
 Status ZOR_CALL zorsWinHann_32f_I(float* pSrcDst, int len) {
     return applyWindow<Hann>(pSrcDst, pSrcDst, len);
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 }}  // namespace zor::ZOR_NS

@@ -12,6 +12,8 @@
 #include "frame/variant.h"
 #include "frame/fpu.h"
 #include "frame/status.h"
+#include "frame/simd.h"
+#include "signal/vector/arith_kernels.h"
 
 #include <cmath>
 #include <cstddef>
@@ -21,124 +23,48 @@
 namespace zor { namespace ZOR_NS {
 namespace {
 
-inline uint32_t bitsOf(float x) {
-    uint32_t u;
-    std::memcpy(&u, &x, 4);
-    return u;
-}
-inline float floatOf(uint32_t u) {
-    float x;
-    std::memcpy(&x, &u, 4);
-    return x;
-}
-
-// The quiet NaN that square root and logarithm leave for negative inputs.
-constexpr uint32_t kNegNaN = 0xFFC00000u;
-
-// ---- elementwise float kernels ------------------------------------------------
+// ---- elementwise operations -----------------------------------------------
 //
-// An operation is a small struct: operator() on scalars and, under SSE, vec()
-// on four lanes.  The loops load before they store, so in-place calls (the
-// same pointer as source and destination) are safe.  Operations are passed by
-// value so that their constants stay in registers across the stores.
+// Each operation is written once, as a generic lambda (or a struct with a
+// lane and a register overload) over the lane vocabulary, and run by
+// simd::mapLanes: registers from the column that has them (floats from SSE,
+// 16-bit lanes from SSE2), single elements for the rest.  mapLanes loads
+// before it stores, so in-place calls (the same pointer as source and
+// destination) are safe.
 
-#if ZOR_SIMD >= 1
-#  define ZOR_VEC1(expr) \
-      __m128 vec(__m128 a) const { return expr; }
-#  define ZOR_VEC2(expr) \
-      __m128 vec(__m128 a, __m128 b) const { return expr; }
-#else
-#  define ZOR_VEC1(expr)
-#  define ZOR_VEC2(expr)
-#endif
+constexpr auto kAdd = [](auto a, auto b) { return a + b; };
+constexpr auto kSub = [](auto a, auto b) { return a - b; };
+constexpr auto kMul = [](auto a, auto b) { return a * b; };
+constexpr auto kDiv = [](auto a, auto b) { return a / b; };
+constexpr auto kSquare = [](auto a) { return a * a; };
+// Float absolute value clears the sign bit, NaNs included.
+constexpr auto kAbs = [](auto a) { return simd::abs(a); };
 
-template <class Op>
-void map32f(const float* s, float* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 1
-    for (; i + 8 <= n; i += 8) {
-        const __m128 a = _mm_loadu_ps(s + i), b = _mm_loadu_ps(s + i + 4);
-        _mm_storeu_ps(d + i, op.vec(a));
-        _mm_storeu_ps(d + i + 4, op.vec(b));
-    }
-    for (; i + 4 <= n; i += 4) _mm_storeu_ps(d + i, op.vec(_mm_loadu_ps(s + i)));
-#endif
-    for (; i < n; ++i) d[i] = op(s[i]);
-}
-
-template <class Op>
-void map32f(const float* s1, const float* s2, float* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 1
-    for (; i + 8 <= n; i += 8) {
-        const __m128 a0 = _mm_loadu_ps(s1 + i), a1 = _mm_loadu_ps(s1 + i + 4);
-        const __m128 b0 = _mm_loadu_ps(s2 + i), b1 = _mm_loadu_ps(s2 + i + 4);
-        _mm_storeu_ps(d + i, op.vec(a0, b0));
-        _mm_storeu_ps(d + i + 4, op.vec(a1, b1));
-    }
-    for (; i + 4 <= n; i += 4)
-        _mm_storeu_ps(d + i, op.vec(_mm_loadu_ps(s1 + i), _mm_loadu_ps(s2 + i)));
-#endif
-    for (; i < n; ++i) d[i] = op(s1[i], s2[i]);
-}
-
-struct AddF { float operator()(float a, float b) const { return a + b; } ZOR_VEC2(_mm_add_ps(a, b)) };
-struct SubF { float operator()(float a, float b) const { return a - b; } ZOR_VEC2(_mm_sub_ps(a, b)) };
-struct MulF { float operator()(float a, float b) const { return a * b; } ZOR_VEC2(_mm_mul_ps(a, b)) };
-struct DivF { float operator()(float a, float b) const { return a / b; } ZOR_VEC2(_mm_div_ps(a, b)) };
-
-// Operations with a constant keep it both as a scalar and broadcast.
-struct ConstF {
-    float c;
-#if ZOR_SIMD >= 1
-    __m128 vc;
-    explicit ConstF(float v) : c(v), vc(_mm_set1_ps(v)) {}
-#else
-    explicit ConstF(float v) : c(v) {}
-#endif
-};
-struct AddCF : ConstF { using ConstF::ConstF; float operator()(float a) const { return a + c; } ZOR_VEC1(_mm_add_ps(a, vc)) };
-struct SubCF : ConstF { using ConstF::ConstF; float operator()(float a) const { return a - c; } ZOR_VEC1(_mm_sub_ps(a, vc)) };
-struct MulCF : ConstF { using ConstF::ConstF; float operator()(float a) const { return a * c; } ZOR_VEC1(_mm_mul_ps(a, vc)) };
-
-struct SqrF { float operator()(float a) const { return a * a; } ZOR_VEC1(_mm_mul_ps(a, a)) };
-
-// Absolute value clears the sign bit, NaNs included.
-struct AbsF {
-    float operator()(float a) const { return floatOf(bitsOf(a) & 0x7FFFFFFFu); }
-    ZOR_VEC1(_mm_andnot_ps(_mm_set1_ps(-0.0f), a))
-};
-
-#if ZOR_SIMD >= 1
-// a where mask is clear, b where it is set.
-inline __m128 select(__m128 mask, __m128 a, __m128 b) {
-    return _mm_or_ps(_mm_andnot_ps(mask, a), _mm_and_ps(mask, b));
-}
-#endif
+// Operations with a constant c.
+inline auto addConst(float c) { return [c](auto a) { return a + simd::set1<decltype(a)>(c); }; }
+inline auto subConst(float c) { return [c](auto a) { return a - simd::set1<decltype(a)>(c); }; }
+inline auto mulConst(float c) { return [c](auto a) { return a * simd::set1<decltype(a)>(c); }; }
 
 // Clipping keeps NaN elements (no comparison holds for them).
-struct ClipAbove : ConstF {
-    using ConstF::ConstF;
-    float operator()(float a) const { return a > c ? c : a; }
-    ZOR_VEC1(select(_mm_cmpgt_ps(a, vc), a, vc))
-};
-struct ClipBelow : ConstF {
-    using ConstF::ConstF;
-    float operator()(float a) const { return a < c ? c : a; }
-    ZOR_VEC1(select(_mm_cmplt_ps(a, vc), a, vc))
-};
+inline auto clipAbove(float c) {
+    return [c](auto a) {
+        const auto v = simd::set1<decltype(a)>(c);
+        return simd::select(simd::gt(a, v), v, a);
+    };
+}
+inline auto clipBelow(float c) {
+    return [c](auto a) {
+        const auto v = simd::set1<decltype(a)>(c);
+        return simd::select(simd::lt(a, v), v, a);
+    };
+}
 // Replaces every element that is not >= level (so NaNs too) by value.
-struct BelowToValue : ConstF {
-    float value;
-#if ZOR_SIMD >= 1
-    __m128 vvalue;
-    BelowToValue(float level, float v) : ConstF(level), value(v), vvalue(_mm_set1_ps(v)) {}
-#else
-    BelowToValue(float level, float v) : ConstF(level), value(v) {}
-#endif
-    float operator()(float a) const { return a >= c ? a : value; }
-    ZOR_VEC1(select(_mm_cmpnge_ps(a, vc), a, vvalue))
-};
+inline auto belowToValue(float level, float value) {
+    return [level, value](auto a) {
+        using A = decltype(a);
+        return simd::select(simd::ge(a, simd::set1<A>(level)), a, simd::set1<A>(value));
+    };
+}
 
 void copy32f(const float* s, float* d, int n) {
     if (s != d) std::memmove(d, s, static_cast<size_t>(n) * sizeof(float));
@@ -147,763 +73,123 @@ void zero32f(float* d, int n) { std::memset(d, 0, static_cast<size_t>(n) * sizeo
 
 // ---- 16-bit integer kernels ---------------------------------------------------
 
-#if ZOR_SIMD >= 2
-#  define ZOR_VEC16_1(expr) \
-      __m128i vec(__m128i a) const { return expr; }
-#  define ZOR_VEC16_2(expr) \
-      __m128i vec(__m128i a, __m128i b) const { return expr; }
-#else
-#  define ZOR_VEC16_1(expr)
-#  define ZOR_VEC16_2(expr)
-#endif
-
-template <class Op>
-void map16s(const int16_t* s, int16_t* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    if (op.simd()) {
-        for (; i + 8 <= n; i += 8) {
-            const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s + i));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i), op.vec(a));
-        }
-    }
-#endif
-    for (; i < n; ++i) d[i] = op(s[i]);
-}
-
-template <class Op>
-void map16s(const int16_t* s1, const int16_t* s2, int16_t* d, int n, const Op op) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    if (op.simd()) {
-        for (; i + 16 <= n; i += 16) {
-            const __m128i a0 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s1 + i));
-            const __m128i b0 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s2 + i));
-            const __m128i a1 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s1 + i + 8));
-            const __m128i b1 = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s2 + i + 8));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i), op.vec(a0, b0));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i + 8), op.vec(a1, b1));
-        }
-        for (; i + 8 <= n; i += 8) {
-            const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s1 + i));
-            const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(s2 + i));
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(d + i), op.vec(a, b));
-        }
-    }
-#endif
-    for (; i < n; ++i) d[i] = op(s1[i], s2[i]);
-}
-
 // |x| with -32768 saturating to 32767: max(x, 0 -sat x).
-struct Abs16 {
-    bool simd() const { return true; }
-    int16_t operator()(int16_t a) const { return saturate<int16_t>(a < 0 ? -int32_t(a) : int32_t(a)); }
-    ZOR_VEC16_1(_mm_max_epi16(a, _mm_subs_epi16(_mm_setzero_si128(), a)))
-};
+constexpr auto kAbs16 = [](auto a) { return simd::max(a, simd::subSat(simd::zero<decltype(a)>(), a)); };
 
-// Saturated sum with a constant (a difference is a sum with -val, formed
-// in 32 bits so that -(-32768) is exact).
-struct AddC16 {
-    int32_t c;
-    bool simd() const { return c >= -32768 && c <= 32767; }
-    int16_t operator()(int16_t a) const { return saturate<int16_t>(int32_t(a) + c); }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a) const { return _mm_adds_epi16(a, _mm_set1_epi16(static_cast<int16_t>(c))); }
-#endif
-};
+// Saturated sum with a constant in -32768 .. 32768 (a difference is a sum
+// with -val, formed in 32 bits so that -(-32768) is exact; that one constant
+// goes element by element).
+template <class Run>
+void addConst16(int32_t c, Run&& run) {
+    if (c <= 32767)
+        run([v = int16_t(c)](auto a) { return simd::addSat(a, simd::set1<decltype(a)>(v)); });
+    else
+        run([c](int16_t a) { return saturate<int16_t>(int32_t(a) + c); });
+}
 
 // Sum of two vectors scaled by 2^-sf with ties to even (see zorsAdd_16s_Sfs).
-struct AddSfs16 {
+struct AddScaled16 {
     int sf;
-    bool simd() const { return true; }
     int16_t operator()(int16_t a, int16_t b) const {
         return saturate<int16_t>(scaleRound(int32_t(a) + int32_t(b), sf));
     }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a, __m128i b) const {
-        if (sf == 0) return _mm_adds_epi16(a, b);
-        if (sf > 16) return _mm_setzero_si128();
+    template <int B>
+    simd::Vec<int16_t, B> operator()(simd::Vec<int16_t, B> a, simd::Vec<int16_t, B> b) const {
+        using namespace simd;
+        using V = Vec<int16_t, B>;
+        using W = Vec<int32_t, B>;
+        if (sf == 0) return addSat(a, b);
+        if (sf > 16) return zero<V>();
         if (sf <= -16) {
             // Only the sign of the sum survives; the saturating sum keeps it.
-            const __m128i s = _mm_adds_epi16(a, b), z = _mm_setzero_si128();
-            const __m128i pos = _mm_and_si128(_mm_cmpgt_epi16(s, z), _mm_set1_epi16(32767));
-            const __m128i neg = _mm_and_si128(_mm_cmplt_epi16(s, z), _mm_set1_epi16(-32768));
-            return _mm_or_si128(pos, neg);
+            const V s = addSat(a, b), z = zero<V>();
+            return (gt(s, z) & set1<V>(32767)) | (lt(s, z) & set1<V>(-32768));
         }
-        // Widen to 32 bits: the low/high halves sign-extended.
-        __m128i lo = _mm_add_epi32(_mm_srai_epi32(_mm_unpacklo_epi16(a, a), 16),
-                                   _mm_srai_epi32(_mm_unpacklo_epi16(b, b), 16));
-        __m128i hi = _mm_add_epi32(_mm_srai_epi32(_mm_unpackhi_epi16(a, a), 16),
-                                   _mm_srai_epi32(_mm_unpackhi_epi16(b, b), 16));
+        W lo = widenLo(a) + widenLo(b), hi = widenHi(a) + widenHi(b);
         if (sf < 0) {
-            const __m128i cnt = _mm_cvtsi32_si128(-sf);
-            lo = _mm_sll_epi32(lo, cnt);
-            hi = _mm_sll_epi32(hi, cnt);
+            lo = shl(lo, -sf);
+            hi = shl(hi, -sf);
         } else {
-            const __m128i cnt = _mm_cvtsi32_si128(sf);
-            const __m128i half = _mm_set1_epi32((1 << (sf - 1)) - 1), one = _mm_set1_epi32(1);
-            lo = _mm_sra_epi32(_mm_add_epi32(_mm_add_epi32(lo, half),
-                                             _mm_and_si128(_mm_sra_epi32(lo, cnt), one)), cnt);
-            hi = _mm_sra_epi32(_mm_add_epi32(_mm_add_epi32(hi, half),
-                                             _mm_and_si128(_mm_sra_epi32(hi, cnt), one)), cnt);
+            const W half = set1<W>((1 << (sf - 1)) - 1), one = set1<W>(1);
+            lo = shr(lo + half + (shr(lo, sf) & one), sf);
+            hi = shr(hi + half + (shr(hi, sf) & one), sf);
         }
-        return _mm_packs_epi32(lo, hi);
+        return narrowSat<int16_t>(lo, hi);
     }
-#endif
 };
 
-// Product scaled by 2^-sf, rounded half up (toward +inf), saturated.  The
-// SIMD path covers 0 <= sf <= 30, where p + 2^(sf-1) stays inside 32 bits.
-struct MulNR16 {
+// Product scaled by 2^-sf, rounded half up (toward +inf), saturated.  In
+// registers for 0 <= sf <= 30, where p + 2^(sf-1) stays inside 32 bits.
+struct MulRounded16 {
     int sf;
-#if ZOR_SIMD >= 2
-    __m128i cnt, half;
-    explicit MulNR16(int scale)
-        : sf(scale), cnt(_mm_cvtsi32_si128(scale)),
-          half(_mm_set1_epi32(scale > 0 && scale <= 30 ? 1 << (scale - 1) : 0)) {}
-#else
-    explicit MulNR16(int scale) : sf(scale) {}
-#endif
-    bool simd() const { return sf <= 30; }
+    bool fitsRegisters() const { return sf <= 30; }
     int16_t operator()(int16_t a, int16_t b) const {
         return saturate<int16_t>(scaleRoundHalfUp(int32_t(a) * int32_t(b), sf));
     }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a, __m128i b) const {
-        const __m128i pl = _mm_mullo_epi16(a, b), ph = _mm_mulhi_epi16(a, b);
-        __m128i lo = _mm_unpacklo_epi16(pl, ph), hi = _mm_unpackhi_epi16(pl, ph);
+    template <int B>
+    simd::Vec<int16_t, B> operator()(simd::Vec<int16_t, B> a, simd::Vec<int16_t, B> b) const {
+        using namespace simd;
+        using W = Vec<int32_t, B>;
+        const auto low = a * b, high = mulHi(a, b);
         // With sf 0 both the half and the shift are 0.
-        lo = _mm_sra_epi32(_mm_add_epi32(lo, half), cnt);
-        hi = _mm_sra_epi32(_mm_add_epi32(hi, half), cnt);
-        return _mm_packs_epi32(lo, hi);
+        const W half = set1<W>(sf > 0 ? 1 << (sf - 1) : 0);
+        const W lo = shr(bitcast<int32_t>(zipLo(low, high)) + half, sf);
+        const W hi = shr(bitcast<int32_t>(zipHi(low, high)) + half, sf);
+        return narrowSat<int16_t>(lo, hi);
     }
-#endif
-};
-struct MulCNR16 : MulNR16 {
-    int16_t c;
-    MulCNR16(int scale, int16_t v) : MulNR16(scale), c(v) {}
-    int16_t operator()(int16_t a) const { return MulNR16::operator()(a, c); }
-#if ZOR_SIMD >= 2
-    __m128i vec(__m128i a) const { return MulNR16::vec(a, _mm_set1_epi16(c)); }
-#endif
 };
 
-// ---- 64-bit float absolute value ---------------------------------------------
-
-[[maybe_unused]] void abs64f(const double* s, double* d, int n) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    const __m128d m = _mm_castsi128_pd(_mm_set1_epi64x(0x7FFFFFFFFFFFFFFFll));
-    for (; i + 4 <= n; i += 4) {
-        const __m128d a = _mm_loadu_pd(s + i), b = _mm_loadu_pd(s + i + 2);
-        _mm_storeu_pd(d + i, _mm_and_pd(a, m));
-        _mm_storeu_pd(d + i + 2, _mm_and_pd(b, m));
-    }
-#endif
-    for (; i < n; ++i) {
-        uint64_t u;
-        std::memcpy(&u, s + i, 8);
-        u &= 0x7FFFFFFFFFFFFFFFull;
-        std::memcpy(d + i, &u, 8);
-    }
+// MulRounded16 on registers where it can, element by element otherwise.
+[[maybe_unused]] void mulRounded16(const int16_t* a, const int16_t* b, int16_t* d, int n, MulRounded16 op) {
+    if (op.fitsRegisters())
+        simd::mapLanes(a, b, d, n, op);
+    else
+        simd::mapLanes(a, b, d, n, [op](int16_t x, int16_t y) { return op(x, y); });
 }
-
-// ---- square root and logarithm -------------------------------------------------
-
-void sqrtInPlace(float* p, int n, bool& negative) {
-    int i = 0;
-#if ZOR_SIMD >= 1
-    const __m128 zero = _mm_setzero_ps(), nan = _mm_set1_ps(floatOf(kNegNaN));
-    __m128 seen = _mm_setzero_ps();
-    for (; i + 4 <= n; i += 4) {
-        const __m128 x = _mm_loadu_ps(p + i);
-        const __m128 bad = _mm_cmpnge_ps(x, zero);  // negative or NaN
-        seen = _mm_or_ps(seen, bad);
-        _mm_storeu_ps(p + i, select(bad, _mm_sqrt_ps(x), nan));
-    }
-    if (_mm_movemask_ps(seen)) negative = true;
-#endif
-    for (; i < n; ++i) {
-        if (p[i] >= 0.0f) {
-            p[i] = std::sqrt(p[i]);  // +-0 stays as it is
-        } else {
-            p[i] = floatOf(kNegNaN);
-            negative = true;
-        }
-    }
-}
-
-// One element of the logarithm with its special cases; `first` records the
-// first special condition of the vector.
-inline float lnElement(float x, Status& first) {
-    const uint32_t u = bitsOf(x);
-    if (u & 0x80000000u) {  // every negative number, -0.0 and negative NaNs
-        if (first == StatusOk) first = StatusWarnLnNegative;
-        return floatOf(kNegNaN);
-    }
-    if (u > 0x7F800000u) return floatOf(u | 0x00400000u);  // NaN: quieted
-    if (u == 0) {
-        if (first == StatusOk) first = StatusWarnLnZero;
-        return -std::numeric_limits<float>::infinity();
-    }
-    return toFloat(std::log(static_cast<double>(x)));
-}
-
-// The logarithm and the arctangent run as table-driven approximations in
-// double whose relative error has a proven bound far below the float
-// precision.  The float that the standard library's result (correct to
-// within an ulp) rounds to is then known, unless the approximation lies
-// within that bound of a rounding midpoint between two floats: such
-// elements (about one in ten thousand) are recomputed with the library.
-
-#if ZOR_SIMD >= 2
-// Lanes (of the four doubles y0[0], y0[1], y1[0], y1[1], normal-range float
-// values) that lie within Margin double ulps of a float rounding midpoint.
-// A double rounds to float by its 29 low mantissa bits: the midpoints are
-// where those read 2^28, so the low 32 bits of each double decide.  The
-// midpoint below a power of two (whose float neighbour below is closer) lies
-// 2^27 ulps away, beyond any Margin used here.
-template <int Margin>
-inline __m128i nearMidpoint(__m128d y0, __m128d y1) {
-    static_assert(Margin > 0 && Margin < (1 << 26), "margin must stay inside one float ulp");
-    const __m128i low = _mm_castps_si128(
-        _mm_shuffle_ps(_mm_castpd_ps(y0), _mm_castpd_ps(y1), _MM_SHUFFLE(2, 0, 2, 0)));
-    const __m128i off = _mm_and_si128(_mm_add_epi32(low, _mm_set1_epi32(Margin - (1 << 28))),
-                                      _mm_set1_epi32(0x1FFFFFFF));
-    return _mm_cmplt_epi32(off, _mm_set1_epi32(2 * Margin));
-}
-
-inline __m128d loadRow(const void* table, int byteOffset) {
-    return _mm_load_pd(reinterpret_cast<const double*>(static_cast<const char*>(table) + byteOffset));
-}
-
-// ---- logarithm ----
-//
-// x = 2^e m with m within 2^-9 of c = 1 + k/256 (m may be just below 1, the
-// rounding to the nearest c having carried into the exponent), so that
-// log x = e log 2 + log c + log(1 + r), r = (m - c)/c, |r| <= 2^-9, and
-// log(1 + r) = r - r^2/2 + r^3/3 - r^4/4 to within |r|^5/5.
-//
-// Error: where e = k = 0 the result is log(1 + r) itself, to within
-// |r|^4/5 < 2^-38.3 relative.  Elsewhere |log x| >= 2^-10 and the truncation
-// is below 2^-47.3, 2^-37.3 relative; e log 2 + log c, exact where it
-// cancels (e = -1, c near 2: Sterbenz), adds a few 2^-53 relative.  So the
-// approximation is within 2^-37.2 |log x|: 2^15.8 double ulps.  With the
-// library's own ulp, a margin of 2^17 ulps is safe with room to spare.
-constexpr int kLnMargin = 1 << 17;
-
-constexpr double kLogC[256] = {
-    0x0.0p+0, 0x1.ff00aa2b10bc0p-9, 0x1.fe02a6b106789p-8, 0x1.7dc475f810a77p-7,
-    0x1.fc0a8b0fc03e4p-7, 0x1.3cea44346a575p-6, 0x1.7b91b07d5b11bp-6, 0x1.b9fc027af9198p-6,
-    0x1.f829b0e783300p-6, 0x1.1b0d98923d980p-5, 0x1.39e87b9febd60p-5, 0x1.58a5bafc8e4d5p-5,
-    0x1.77458f632dcfcp-5, 0x1.95c830ec8e3ebp-5, 0x1.b42dd711971bfp-5, 0x1.d276b8adb0b52p-5,
-    0x1.f0a30c01162a6p-5, 0x1.075983598e471p-4, 0x1.16536eea37ae1p-4, 0x1.253f62f0a1417p-4,
-    0x1.341d7961bd1d1p-4, 0x1.42edcbea646f0p-4, 0x1.51b073f06183fp-4, 0x1.60658a93750c4p-4,
-    0x1.6f0d28ae56b4cp-4, 0x1.7da766d7b12cdp-4, 0x1.8c345d6319b21p-4, 0x1.9ab42462033adp-4,
-    0x1.a926d3a4ad563p-4, 0x1.b78c82bb0eda1p-4, 0x1.c5e548f5bc743p-4, 0x1.d4313d66cb35dp-4,
-    0x1.e27076e2af2e6p-4, 0x1.f0a30c01162a6p-4, 0x1.fec9131dbeabbp-4, 0x1.0671512ca596ep-3,
-    0x1.0d77e7cd08e59p-3, 0x1.14785846742acp-3, 0x1.1b72ad52f67a0p-3, 0x1.2266f190a5acbp-3,
-    0x1.29552f81ff523p-3, 0x1.303d718e47fd3p-3, 0x1.371fc201e8f74p-3, 0x1.3dfc2b0ecc62ap-3,
-    0x1.44d2b6ccb7d1ep-3, 0x1.4ba36f39a55e5p-3, 0x1.526e5e3a1b438p-3, 0x1.59338d9982086p-3,
-    0x1.5ff3070a793d4p-3, 0x1.66acd4272ad51p-3, 0x1.6d60fe719d21dp-3, 0x1.740f8f54037a5p-3,
-    0x1.7ab890210d909p-3, 0x1.815c0a14357ebp-3, 0x1.87fa06520c911p-3, 0x1.8e928de886d41p-3,
-    0x1.9525a9cf456b4p-3, 0x1.9bb362e7dfb83p-3, 0x1.a23bc1fe2b563p-3, 0x1.a8becfc882f19p-3,
-    0x1.af3c94e80bff3p-3, 0x1.b5b519e8fb5a4p-3, 0x1.bc286742d8cd6p-3, 0x1.c2968558c18c1p-3,
-    0x1.c8ff7c79a9a22p-3, 0x1.cf6354e09c5dcp-3, 0x1.d5c216b4fbb91p-3, 0x1.dc1bca0abec7dp-3,
-    0x1.e27076e2af2e6p-3, 0x1.e8c0252aa5a60p-3, 0x1.ef0adcbdc5936p-3, 0x1.f550a564b7b37p-3,
-    0x1.fb9186d5e3e2bp-3, 0x1.00e6c45ad501dp-2, 0x1.0402594b4d041p-2, 0x1.071b85fcd590dp-2,
-    0x1.0a324e27390e3p-2, 0x1.0d46b579ab74bp-2, 0x1.1058bf9ae4ad5p-2, 0x1.136870293a8b0p-2,
-    0x1.1675cababa60ep-2, 0x1.1980d2dd4236fp-2, 0x1.1c898c16999fbp-2, 0x1.1f8ff9e48a2f3p-2,
-    0x1.22941fbcf7966p-2, 0x1.2596010df763ap-2, 0x1.2895a13de86a3p-2, 0x1.2b9303ab89d25p-2,
-    0x1.2e8e2bae11d31p-2, 0x1.31871c9544185p-2, 0x1.347dd9a987d55p-2, 0x1.3772662bfd85bp-2,
-    0x1.3a64c556945eap-2, 0x1.3d54fa5c1f710p-2, 0x1.404308686a7e4p-2, 0x1.432ef2a04e814p-2,
-    0x1.4618bc21c5ec2p-2, 0x1.49006804009d1p-2, 0x1.4be5f957778a1p-2, 0x1.4ec973260026ap-2,
-    0x1.51aad872df82dp-2, 0x1.548a2c3add263p-2, 0x1.5767717455a6cp-2, 0x1.5a42ab0f4cfe2p-2,
-    0x1.5d1bdbf5809cap-2, 0x1.5ff3070a793d4p-2, 0x1.62c82f2b9c795p-2, 0x1.659b57303e1f3p-2,
-    0x1.686c81e9b14afp-2, 0x1.6b3bb2235943ep-2, 0x1.6e08eaa2ba1e4p-2, 0x1.70d42e2789236p-2,
-    0x1.739d7f6bbd007p-2, 0x1.7664e1239dbcfp-2, 0x1.792a55fdd47a2p-2, 0x1.7bede0a37afc0p-2,
-    0x1.7eaf83b82afc3p-2, 0x1.816f41da0d496p-2, 0x1.842d1da1e8b17p-2, 0x1.86e919a330ba0p-2,
-    0x1.89a3386c1425bp-2, 0x1.8c5b7c858b48bp-2, 0x1.8f11e873662c7p-2, 0x1.91c67eb45a83ep-2,
-    0x1.947941c2116fbp-2, 0x1.972a341135158p-2, 0x1.99d958117e08bp-2, 0x1.9c86b02dc0863p-2,
-    0x1.9f323ecbf984cp-2, 0x1.a1dc064d5b995p-2, 0x1.a484090e5bb0ap-2, 0x1.a72a4966bd9eap-2,
-    0x1.a9cec9a9a084ap-2, 0x1.ac718c258b0e4p-2, 0x1.af1293247786bp-2, 0x1.b1b1e0ebdfc5bp-2,
-    0x1.b44f77bcc8f63p-2, 0x1.b6eb59d3cf35ep-2, 0x1.b9858969310fbp-2, 0x1.bc1e08b0dad0ap-2,
-    0x1.beb4d9da71b7cp-2, 0x1.c149ff115f027p-2, 0x1.c3dd7a7cdad4dp-2, 0x1.c66f4e3ff6ff8p-2,
-    0x1.c8ff7c79a9a22p-2, 0x1.cb8e0744d7acap-2, 0x1.ce1af0b85f3ebp-2, 0x1.d0a63ae721e64p-2,
-    0x1.d32fe7e00ebd5p-2, 0x1.d5b7f9ae2c684p-2, 0x1.d83e7258a2f3ep-2, 0x1.dac353e2c5954p-2,
-    0x1.dd46a04c1c4a1p-2, 0x1.dfc859906d5b5p-2, 0x1.e24881a7c6c26p-2, 0x1.e4c71a8687704p-2,
-    0x1.e744261d68788p-2, 0x1.e9bfa659861f5p-2, 0x1.ec399d2468cc0p-2, 0x1.eeb20c640ddf4p-2,
-    0x1.f128f5faf06edp-2, 0x1.f39e5bc811e5cp-2, 0x1.f6123fa7028acp-2, 0x1.f884a36fe9ec2p-2,
-    0x1.faf588f78f31fp-2, 0x1.fd64f20f61572p-2, 0x1.ffd2e0857f498p-2, 0x1.011fab125ff8ap-1,
-    0x1.02552a5a5d0ffp-1, 0x1.0389eefce633bp-1, 0x1.04bdf9da926d2p-1, 0x1.05f14bd26459cp-1,
-    0x1.0723e5c1cdf40p-1, 0x1.0855c884b450ep-1, 0x1.0986f4f573521p-1, 0x1.0ab76bece14d2p-1,
-    0x1.0be72e4252a83p-1, 0x1.0d163ccb9d6b8p-1, 0x1.0e44985d1cc8cp-1, 0x1.0f7241c9b497dp-1,
-    0x1.109f39e2d4c97p-1, 0x1.11cb81787ccf8p-1, 0x1.12f719593efbcp-1, 0x1.1422025243d45p-1,
-    0x1.154c3d2f4d5eap-1, 0x1.1675cababa60ep-1, 0x1.179eabbd899a1p-1, 0x1.18c6e0ff5cf06p-1,
-    0x1.19ee6b467c96fp-1, 0x1.1b154b57da29fp-1, 0x1.1c3b81f713c25p-1, 0x1.1d610fe677003p-1,
-    0x1.1e85f5e7040d0p-1, 0x1.1faa34b87094cp-1, 0x1.20cdcd192ab6ep-1, 0x1.21f0bfc65beecp-1,
-    0x1.23130d7bebf43p-1, 0x1.2434b6f483934p-1, 0x1.2555bce98f7cbp-1, 0x1.26762013430e0p-1,
-    0x1.2795e1289b11bp-1, 0x1.28b500df60783p-1, 0x1.29d37fec2b08bp-1, 0x1.2af15f02640adp-1,
-    0x1.2c0e9ed448e8cp-1, 0x1.2d2b4012edc9ep-1, 0x1.2e47436e40268p-1, 0x1.2f62a99509546p-1,
-    0x1.307d7334f10bep-1, 0x1.3197a0fa7fe6ap-1, 0x1.32b1339121d71p-1, 0x1.33ca2ba328995p-1,
-    0x1.34e289d9ce1d3p-1, 0x1.35fa4edd36ea0p-1, 0x1.37117b54747b6p-1, 0x1.38280fe58797fp-1,
-    0x1.393e0d3562a1ap-1, 0x1.3a5373e7ebdfap-1, 0x1.3b68449fffc23p-1, 0x1.3c7c7fff73206p-1,
-    0x1.3d9026a7156fbp-1, 0x1.3ea33936b2f5cp-1, 0x1.3fb5b84d16f42p-1, 0x1.40c7a4880dce9p-1,
-    0x1.41d8fe84672aep-1, 0x1.42e9c6ddf80bfp-1, 0x1.43f9fe2f9ce67p-1, 0x1.4509a5133bb0ap-1,
-    0x1.4618bc21c5ec2p-1, 0x1.472743f33aaadp-1, 0x1.48353d1ea88dfp-1, 0x1.4942a83a2fc07p-1,
-    0x1.4a4f85db03ebbp-1, 0x1.4b5bd6956e274p-1, 0x1.4c679afccee3ap-1, 0x1.4d72d3a39fd00p-1,
-    0x1.4e7d811b75bb1p-1, 0x1.4f87a3f5026e9p-1, 0x1.50913cc01686bp-1, 0x1.519a4c0ba3446p-1,
-    0x1.52a2d265bc5abp-1, 0x1.53aad05b99b7dp-1, 0x1.54b2467999498p-1, 0x1.55b9354b40bcdp-1,
-    0x1.56bf9d5b3f399p-1, 0x1.57c57f336f191p-1, 0x1.58cadb5cd7989p-1, 0x1.59cfb25fae87ep-1,
-    0x1.5ad404c359f2dp-1, 0x1.5bd7d30e71c73p-1, 0x1.5cdb1dc6c1765p-1, 0x1.5ddde57149923p-1,
-    0x1.5ee02a9241675p-1, 0x1.5fe1edad18919p-1, 0x1.60e32f44788d9p-1, 0x1.61e3efda46467p-1,
-};
-constexpr double kLn2 = 0x1.62e42fefa39efp-1;
-
-struct LnRow {
-    double inv, logc;
-};
-struct LnTable {
-    alignas(16) LnRow row[256];
-};
-constexpr LnTable makeLnTable() {
-    LnTable t{};
-    for (int k = 0; k < 256; ++k) t.row[k] = LnRow{1.0 / (1.0 + k / 256.0), kLogC[k]};
-    return t;
-}
-// 1/c rounds the same at compile time on every platform (IEEE division).
-constexpr LnTable kLnTable = makeLnTable();
-
-// Byte offset of the table row for the float with bits u (k * sizeof(LnRow)),
-// formed in general registers: it starts the longest dependency chain of
-// the loop, and that way it needs neither the vector unit nor a transfer
-// out of it.
-inline int lnRowOffset(const float* p) {
-    uint32_t u;
-    std::memcpy(&u, p, 4);
-    return static_cast<int>(((u + 0x4000u) >> (15 - 4)) & 0xFF0u);
-}
-
-// log x for two lanes: e as integers, d = m - c (exact in float), table rows
-// at the byte offsets o0, o1.  The polynomial is evaluated in a split form
-// for a shorter dependency chain.
-inline __m128d lnPair(__m128i e, __m128 d, int o0, int o1) {
-    const __m128d row0 = loadRow(kLnTable.row, o0), row1 = loadRow(kLnTable.row, o1);
-    const __m128d r = _mm_mul_pd(_mm_cvtps_pd(d), _mm_unpacklo_pd(row0, row1));
-    const __m128d hi = _mm_add_pd(_mm_mul_pd(_mm_cvtepi32_pd(e), _mm_set1_pd(kLn2)), _mm_unpackhi_pd(row0, row1));
-    const __m128d r2 = _mm_mul_pd(r, r);
-    // r + r2 (a + b) with a = r/3 - 1/2 and b = -r2/4 computed side by side.
-    const __m128d a = _mm_add_pd(_mm_mul_pd(r, _mm_set1_pd(1.0 / 3)), _mm_set1_pd(-0.5));
-    const __m128d b = _mm_mul_pd(r2, _mm_set1_pd(-0.25));
-    return _mm_add_pd(_mm_add_pd(hi, r), _mm_mul_pd(r2, _mm_add_pd(a, b)));
-}
-#endif
-
-#if ZOR_SIMD >= 2
-// The logarithms of q[0 .. 3] in place, unless one of them is not a
-// positive normal finite float or lies near a rounding midpoint: then false
-// and nothing is written.
-inline bool lnBlock(float* q) {
-    const __m128i one = _mm_set1_epi32(0x3F800000);
-    const __m128i u = _mm_loadu_si128(reinterpret_cast<const __m128i*>(q));
-    // Round the mantissa to 8 bits: a carry moves into the exponent.
-    // Lanes other than positive normal finite floats compute garbage
-    // harmlessly and are redone element by element.
-    const __m128i t = _mm_add_epi32(u, _mm_set1_epi32(0x4000));
-    const __m128i expo = _mm_and_si128(t, _mm_set1_epi32(0x7F800000));
-    const __m128i kbits = _mm_and_si128(t, _mm_set1_epi32(0x007F8000));
-    const __m128 m = _mm_castsi128_ps(_mm_add_epi32(_mm_sub_epi32(u, expo), one));
-    const __m128 d = _mm_sub_ps(m, _mm_castsi128_ps(_mm_or_si128(kbits, one)));
-    const __m128i e = _mm_sub_epi32(_mm_srli_epi32(expo, 23), _mm_set1_epi32(127));
-    const __m128d y0 = lnPair(e, d, lnRowOffset(q), lnRowOffset(q + 1));
-    const __m128d y1 = lnPair(_mm_shuffle_epi32(e, 0xEE), _mm_movehl_ps(d, d), lnRowOffset(q + 2), lnRowOffset(q + 3));
-    // Not a positive normal finite float: u outside [0x00800000,
-    // 0x7F800000), tested as one signed compare.
-    const __m128i special = _mm_cmpgt_epi32(_mm_add_epi32(u, _mm_set1_epi32(0x7F800000)),
-                                            _mm_set1_epi32(-0x01000001));
-    if (_mm_movemask_epi8(_mm_or_si128(special, nearMidpoint<kLnMargin>(y0, y1))) != 0) return false;
-    _mm_storeu_ps(q, _mm_movelh_ps(_mm_cvtpd_ps(y0), _mm_cvtpd_ps(y1)));
-    return true;
-}
-#endif
-
-[[maybe_unused]] Status lnInPlace(float* p, int n) {
-    Status first = StatusOk;
-    int i = 0;
-#if ZOR_SIMD >= 2
-    for (; i + 4 <= n; i += 4)
-        if (!lnBlock(p + i))
-            for (int j = i; j < i + 4; ++j) p[j] = lnElement(p[j], first);
-    // The last one to three elements as a block padded with ones, so that
-    // short vectors avoid the library too.
-    if (i < n) {
-        float q[4] = {1.0f, 1.0f, 1.0f, 1.0f};
-        std::memcpy(q, p + i, sizeof(float) * size_t(n - i));
-        if (lnBlock(q)) {
-            std::memcpy(p + i, q, sizeof(float) * size_t(n - i));
-            i = n;
-        }
-    }
-#else
-    DoublePrecisionScope precision;
-#endif
-    for (; i < n; ++i) p[i] = lnElement(p[i], first);
-    return first;
-}
-
-// ---- arctangent -----------------------------------------------------------------
-
-inline float atan2Element(float y, float x) {
-    return toFloat(std::atan2(static_cast<double>(y), static_cast<double>(x)));
-}
-
-#if ZOR_SIMD >= 2
-// With num = min(|y|, |x|), den = max(|y|, |x|), t = num/den in [0, 1] and
-// c = k/64 within 2^-6.9 of t (k from a float estimate of t):
-//   atan(t) = atan(c) + atan(z),  z = (num - c den) / (den + c num),
-// where num - c den and den + c num are exact in double, so z is the
-// correctly rounded quotient, |z| <= 2^-6.9, and atan(z) = z - z^3/3 + z^5/5
-// to within |z|^7/7, 2^-44.2 relative.  The octant (|y| > |x|) and the side
-// (x < 0) select base and sign:
-//   atan2(|y|, x) = base + sigma atan(t) = T + atan(sigma z),
-// with T = base + sigma atan(c) from a table per octant and k, and sigma
-// applied to num and c; the sign of y is applied last (atan2 is odd
-// in y).  T is within 2^-52 relative and never cancels against atan(z) by
-// more than a factor 3: the whole is within 2^-43.5 relative, 2^9.5 double
-// ulps; margin 2^13.
-constexpr int kPhaseMargin = 1 << 13;
-
-constexpr double kAtanK[65] = {
-    0x0.0p+0, 0x1.fff555bbb729bp-7, 0x1.ffd55bba97625p-6, 0x1.7fb818430da2ap-5,
-    0x1.ff55bb72cfdeap-5, 0x1.3f59f0e7c559dp-4, 0x1.7ee182602f10fp-4, 0x1.be39ebe6f07c3p-4,
-    0x1.fd5ba9aac2f6ep-4, 0x1.1e1fafb043727p-3, 0x1.3d6eee8c6626cp-3, 0x1.5c9811e3ec26ap-3,
-    0x1.7b97b4bce5b02p-3, 0x1.9a6a8e96c8626p-3, 0x1.b90d7529260a2p-3, 0x1.d77d5df205736p-3,
-    0x1.f5b75f92c80ddp-3, 0x1.09dc597d86362p-2, 0x1.18bf5a30bf178p-2, 0x1.278372057ef46p-2,
-    0x1.362773707ebccp-2, 0x1.44aa436c2af0ap-2, 0x1.530ad9951cd4ap-2, 0x1.614840309cfe2p-2,
-    0x1.6f61941e4def1p-2, 0x1.7d5604b63b3f7p-2, 0x1.8b24d394a1b25p-2, 0x1.98cd5454d6b18p-2,
-    0x1.a64eec3cc23fdp-2, 0x1.b3a911da65c6cp-2, 0x1.c0db4c94ec9f0p-2, 0x1.cde53432c1351p-2,
-    0x1.dac670561bb4fp-2, 0x1.e77eb7f175a34p-2, 0x1.f40dd0b541418p-2, 0x1.0039c73c1a40cp-1,
-    0x1.0657e94db30d0p-1, 0x1.0c6145b5b43dap-1, 0x1.1255d9bfbd2a9p-1, 0x1.1835a88be7c13p-1,
-    0x1.1e00babdefeb4p-1, 0x1.23b71e2cc9e6ap-1, 0x1.2958e59308e31p-1, 0x1.2ee628406cbcap-1,
-    0x1.345f01cce37bbp-1, 0x1.39c391cd4171ap-1, 0x1.3f13fb89e96f4p-1, 0x1.445065b795b56p-1,
-    0x1.4978fa3269ee1p-1, 0x1.4e8de5bb6ec04p-1, 0x1.538f57b89061fp-1, 0x1.587d81f732fbbp-1,
-    0x1.5d58987169b18p-1, 0x1.6220d115d7b8ep-1, 0x1.66d663923e087p-1, 0x1.6b798920b3d99p-1,
-    0x1.700a7c5784634p-1, 0x1.748978fba8e0fp-1, 0x1.78f6bbd5d315ep-1, 0x1.7d528289fa093p-1,
-    0x1.819d0b7158a4dp-1, 0x1.85d69576cc2c5p-1, 0x1.89ff5ff57f1f8p-1, 0x1.8e17aa99cc05ep-1,
-    0x1.921fb54442d18p-1,
-};
-constexpr double kPi = 0x1.921fb54442d18p+1, kHalfPi = 0x1.921fb54442d18p+0;
-
-// T for row (steep + 2 left) * 128 + k: steep for |y| > |x|, left for x < 0.
-// Rows with k above 64 are never used for results (zero); they keep the
-// loads of lanes that are recomputed anyway inside the table.
-struct PhaseTable {
-    alignas(16) double base[4 * 128];
-};
-constexpr PhaseTable makePhaseTable() {
-    PhaseTable t{};
-    for (int oct = 0; oct < 4; ++oct) {
-        const bool steep = oct & 1, left = oct & 2;
-        const double base = steep ? kHalfPi : left ? kPi : 0.0;
-        const double sigma = steep != left ? -1.0 : 1.0;
-        for (int k = 0; k <= 64; ++k) t.base[oct * 128 + k] = base + sigma * kAtanK[k];
-    }
-    return t;
-}
-constexpr PhaseTable kPhaseTable = makePhaseTable();
-
-inline double phaseBase(int row) { return kPhaseTable.base[row]; }
-
-// Two lanes of atan(z) with snum = sigma num, den and sc = sigma c as floats
-// (widened exactly), plus T.
-inline __m128d phasePair(__m128 snum, __m128 den, __m128 sc, int row0, int row1) {
-    const __m128d c = _mm_cvtps_pd(sc), nd = _mm_cvtps_pd(snum), dd = _mm_cvtps_pd(den);
-    const __m128d z = _mm_div_pd(_mm_sub_pd(nd, _mm_mul_pd(c, dd)), _mm_add_pd(dd, _mm_mul_pd(c, nd)));
-    const __m128d z2 = _mm_mul_pd(z, z);
-    const __m128d q = _mm_add_pd(_mm_mul_pd(z2, _mm_set1_pd(1.0 / 5)), _mm_set1_pd(-1.0 / 3));
-    const __m128d t = _mm_set_pd(phaseBase(row1), phaseBase(row0));
-    return _mm_add_pd(_mm_add_pd(t, z), _mm_mul_pd(_mm_mul_pd(z, z2), q));
-}
-#endif
-
-// dst = atan2(y, x), rounded to float.
-[[maybe_unused]] void atan2Vec(const float* py, const float* px, float* d, int n) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    const __m128i signBit = _mm_set1_epi32(INT32_MIN);
-    for (; i + 4 <= n; i += 4) {
-        const __m128i yb = _mm_loadu_si128(reinterpret_cast<const __m128i*>(py + i));
-        const __m128i xb = _mm_loadu_si128(reinterpret_cast<const __m128i*>(px + i));
-        const __m128i ya = _mm_andnot_si128(signBit, yb), xa = _mm_andnot_si128(signBit, xb);
-        // A NaN in either makes num (x's) or den (y's) NaN.
-        const __m128 num = _mm_min_ps(_mm_castsi128_ps(ya), _mm_castsi128_ps(xa));
-        const __m128 den = _mm_max_ps(_mm_castsi128_ps(xa), _mm_castsi128_ps(ya));
-        // t + 2^17 rounds t to a multiple of 1/64: the low bits hold k, and
-        // subtracting 2^17 again leaves c = k/64 exactly.  The reciprocal
-        // estimate (12 bits) keeps |t - c| <= 2^-7 + 2^-11.4 and k <= 64.
-        const __m128 tk = _mm_add_ps(_mm_mul_ps(num, _mm_rcp_ps(den)), _mm_set1_ps(0x1p17f));
-        const __m128i steep = _mm_cmpgt_epi32(ya, xa);  // positive floats order as integers
-        const __m128i left = _mm_srai_epi32(xb, 31);
-        const __m128i row = _mm_or_si128(_mm_and_si128(_mm_castps_si128(tk), _mm_set1_epi32(127)),
-                                         _mm_or_si128(_mm_and_si128(steep, _mm_set1_epi32(128)),
-                                                      _mm_and_si128(left, _mm_set1_epi32(256))));
-        const __m128 sigma = _mm_castsi128_ps(_mm_slli_epi32(_mm_xor_si128(steep, left), 31));
-        const __m128 snum = _mm_xor_ps(num, sigma);
-        const __m128 sc = _mm_xor_ps(_mm_sub_ps(tk, _mm_set1_ps(0x1p17f)), sigma);
-        const __m128d r0 = phasePair(snum, den, sc, _mm_extract_epi16(row, 0), _mm_extract_epi16(row, 2));
-        const __m128d r1 = phasePair(_mm_movehl_ps(snum, snum), _mm_movehl_ps(den, den), _mm_movehl_ps(sc, sc),
-                                     _mm_extract_epi16(row, 4), _mm_extract_epi16(row, 6));
-        // Both magnitudes must lie in [2^-60, 2^60): zeros, infinities, NaNs
-        // and extreme ratios (a result below the normal floats, a reciprocal
-        // estimate out of range) are left to the library, like results near
-        // a rounding midpoint.
-        const __m128 special = _mm_or_ps(_mm_cmpnle_ps(_mm_set1_ps(0x1p-60f), num),
-                                         _mm_cmpnlt_ps(den, _mm_set1_ps(0x1p60f)));
-        if (_mm_movemask_ps(_mm_or_ps(special, _mm_castsi128_ps(nearMidpoint<kPhaseMargin>(r0, r1)))) == 0) {
-            const __m128 r = _mm_movelh_ps(_mm_cvtpd_ps(r0), _mm_cvtpd_ps(r1));
-            _mm_storeu_ps(d + i, _mm_or_ps(r, _mm_castsi128_ps(_mm_and_si128(yb, signBit))));
-            continue;
-        }
-        for (int j = i; j < i + 4; ++j) d[j] = atan2Element(py[j], px[j]);
-    }
-#else
-    DoublePrecisionScope precision;
-#endif
-    for (; i < n; ++i) d[i] = atan2Element(py[i], px[i]);
-}
-
-// ---- double-precision elementwise results --------------------------------------
-
-// dst = sqrt(re^2 + im^2) or re^2 + im^2, each in double, rounded once.
-template <bool Root>
-void squaresSum(const float* re, const float* im, float* d, int n) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    for (; i + 4 <= n; i += 4) {
-        const __m128 r = _mm_loadu_ps(re + i), m = _mm_loadu_ps(im + i);
-        const __m128d r0 = _mm_cvtps_pd(r), m0 = _mm_cvtps_pd(m);
-        const __m128d r1 = _mm_cvtps_pd(_mm_movehl_ps(r, r)), m1 = _mm_cvtps_pd(_mm_movehl_ps(m, m));
-        __m128d s0 = _mm_add_pd(_mm_mul_pd(r0, r0), _mm_mul_pd(m0, m0));
-        __m128d s1 = _mm_add_pd(_mm_mul_pd(r1, r1), _mm_mul_pd(m1, m1));
-        if (Root) {
-            s0 = _mm_sqrt_pd(s0);
-            s1 = _mm_sqrt_pd(s1);
-        }
-        _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(s0), _mm_cvtpd_ps(s1)));
-    }
-#else
-    DoublePrecisionScope precision;
-#endif
-    for (; i < n; ++i) {
-        const double a = re[i], b = im[i];
-        const double s = toDouble(a * a + b * b);
-        d[i] = toFloat(Root ? std::sqrt(s) : s);
-    }
-}
-
-[[maybe_unused]] void magnitudeComplex(const Complex32f* src, float* d, int n) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    const float* p = reinterpret_cast<const float*>(src);
-    for (; i + 4 <= n; i += 4) {
-        const float* q = p + 2 * static_cast<ptrdiff_t>(i);
-        const __m128 a = _mm_loadu_ps(q), b = _mm_loadu_ps(q + 4);
-        __m128d q0 = _mm_cvtps_pd(a), q1 = _mm_cvtps_pd(_mm_movehl_ps(a, a));
-        __m128d q2 = _mm_cvtps_pd(b), q3 = _mm_cvtps_pd(_mm_movehl_ps(b, b));
-        q0 = _mm_mul_pd(q0, q0); q1 = _mm_mul_pd(q1, q1);
-        q2 = _mm_mul_pd(q2, q2); q3 = _mm_mul_pd(q3, q3);
-#  if ZOR_SIMD >= 3
-        const __m128d s0 = _mm_hadd_pd(q0, q1), s1 = _mm_hadd_pd(q2, q3);
-#  else
-        const __m128d s0 = _mm_add_pd(_mm_unpacklo_pd(q0, q1), _mm_unpackhi_pd(q0, q1));
-        const __m128d s1 = _mm_add_pd(_mm_unpacklo_pd(q2, q3), _mm_unpackhi_pd(q2, q3));
-#  endif
-        _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(_mm_sqrt_pd(s0)), _mm_cvtpd_ps(_mm_sqrt_pd(s1))));
-    }
-#else
-    DoublePrecisionScope precision;
-#endif
-    for (; i < n; ++i) {
-        const double a = src[i].re, b = src[i].im;
-        d[i] = toFloat(std::sqrt(toDouble(a * a + b * b)));
-    }
-}
-
-// dst = (src - sub) * rcp, both steps in double.
-[[maybe_unused]] void normalizeVec(const float* s, float* d, int n, float sub, double rcp) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    const __m128d vs = _mm_set1_pd(sub), vr = _mm_set1_pd(rcp);
-    for (; i + 4 <= n; i += 4) {
-        const __m128 x = _mm_loadu_ps(s + i);
-        const __m128d a = _mm_mul_pd(_mm_sub_pd(_mm_cvtps_pd(x), vs), vr);
-        const __m128d b = _mm_mul_pd(_mm_sub_pd(_mm_cvtps_pd(_mm_movehl_ps(x, x)), vs), vr);
-        _mm_storeu_ps(d + i, _mm_movelh_ps(_mm_cvtpd_ps(a), _mm_cvtpd_ps(b)));
-    }
-#else
-    DoublePrecisionScope precision;
-#endif
-    for (; i < n; ++i) d[i] = toFloat(toDouble(static_cast<double>(s[i]) - sub) * rcp);
-}
-
-// ---- sort -------------------------------------------------------------------------
-
-#if ZOR_VARIANT == 0
-inline void swapAt(float* a, int i, int j) {
-    const float t = a[i];
-    a[i] = a[j];
-    a[j] = t;
-}
-
-// The partition of a descending quicksort about pivot, as the classic
-// two-scan loop
-//     i = lo, j = hi;
-//     for (;;) { do ++i; while (a[i] > pivot); do --j; while (pivot > a[j]);
-//                if (i >= j) break; swap(a[i], a[j]); }
-// does it, same swaps and same j (so equal elements such as -0 and +0 end
-// where that loop leaves them), returning j.  Between the last pair swapped
-// (l, r) the scans meet only original values, and l, r themselves (holding
-// swapped values) stop the opposite scan; so the stops are found in blocks
-// with branch-free loops, and the next i is min(next left stop, r), the
-// next j max(next right stop, l).  Blocks are clipped at r and l so that
-// they read original values only.
-inline int partitionDescend(float* a, int lo, int hi, float pivot) {
-    constexpr int kBlock = 64;
-    int lstop[kBlock], rstop[kBlock];
-    int ln = 0, lk = 0, rn = 0, rk = 0;
-    int lscan = lo + 1, rscan = hi - 1;  // next positions to scan
-    int l = lo, r = hi;                  // last swapped pair
-    for (;;) {
-        while (lk == ln && lscan < r) {
-            const int end = lscan + kBlock < r ? lscan + kBlock : r;
-            lk = ln = 0;
-            for (int p = lscan; p < end; ++p) {
-                lstop[ln] = p;
-                ln += !(a[p] > pivot);
-            }
-            lscan = end;
-        }
-        while (rk == rn && rscan > l) {
-            const int end = rscan - kBlock > l ? rscan - kBlock : l;
-            rk = rn = 0;
-            for (int q = rscan; q > end; --q) {
-                rstop[rn] = q;
-                rn += !(pivot > a[q]);
-            }
-            rscan = end;
-        }
-        const int i = lk < ln && lstop[lk] < r ? lstop[lk] : r;
-        const int j = rk < rn && rstop[rk] > l ? rstop[rk] : l;
-        if (i >= j) return j;
-        swapAt(a, i, j);
-        l = i;
-        r = j;
-        ++lk;
-        ++rk;
-    }
-}
-
-// Descending quicksort without recursion: median-of-three pivot, the larger
-// part stacked and the smaller one done first (so 32 entries cover any int
-// length), short runs finished by selection sort.
-void sortDescend(float* a, int n) {
-    struct Range { int lo, hi; };
-    Range stack[32];
-    int top = 0;
-    int lo = 0, hi = n - 1;
-    for (;;) {
-        while (hi - lo + 1 > 9) {
-            const int mid = lo + (hi - lo) / 2;
-            if (a[mid] > a[lo]) swapAt(a, lo, mid);
-            if (a[hi] > a[mid]) {
-                swapAt(a, mid, hi);
-                if (a[mid] > a[lo]) swapAt(a, lo, mid);
-            }
-            const int j = partitionDescend(a, lo, hi, a[mid]);
-            // [lo, j] holds the larger elements, [j + 1, hi] the smaller.
-            if (j - lo < hi - j) {
-                stack[top++] = Range{j + 1, hi};
-                hi = j;
-            } else {
-                stack[top++] = Range{lo, j};
-                lo = j + 1;
-            }
-        }
-        // Selection sort: the smallest remaining element goes to the end.
-        for (int end = hi; end > lo; --end) {
-            int m = lo;
-            float v = a[lo];
-            for (int k = lo + 1; k <= end; ++k) {
-                const float x = a[k];
-                const bool smaller = x < v;  // selects, not branches: the outcome is random
-                v = smaller ? x : v;
-                m = smaller ? k : m;
-            }
-            a[m] = a[end];
-            a[end] = v;
-        }
-        if (top == 0) break;
-        --top;
-        lo = stack[top].lo;
-        hi = stack[top].hi;
-    }
-}
-#endif
-
-// ---- deinterleave -------------------------------------------------------------------
-
-[[maybe_unused]] void deinterleave2(const int16_t* s, int16_t* d0, int16_t* d1, int n) {
-    int i = 0;
-#if ZOR_SIMD >= 2
-    for (; i + 8 <= n; i += 8) {
-        const int16_t* p = s + 2 * static_cast<ptrdiff_t>(i);
-        const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
-        const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + 8));
-        // Even elements sign-extended from the low halves, odd ones from the high.
-        const __m128i e = _mm_packs_epi32(_mm_srai_epi32(_mm_slli_epi32(a, 16), 16),
-                                          _mm_srai_epi32(_mm_slli_epi32(b, 16), 16));
-        const __m128i o = _mm_packs_epi32(_mm_srai_epi32(a, 16), _mm_srai_epi32(b, 16));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(d0 + i), e);
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(d1 + i), o);
-    }
-#endif
-    for (; i < n; ++i) {
-        d0[i] = s[2 * static_cast<ptrdiff_t>(i)];
-        d1[i] = s[2 * static_cast<ptrdiff_t>(i) + 1];
-    }
+[[maybe_unused]] void mulRounded16(const int16_t* s, int16_t c, int16_t* d, int n, MulRounded16 op) {
+    const auto withC = [op, c](auto a) { return op(a, simd::set1<decltype(a)>(c)); };
+    if (op.fitsRegisters())
+        simd::mapLanes(s, d, n, withC);
+    else
+        simd::mapLanes(s, d, n, [withC](int16_t x) { return withC(x); });
 }
 
 [[maybe_unused]] bool misaligned16(const void* p) { return (reinterpret_cast<uintptr_t>(p) & 15) != 0; }
+
+// The plain elementwise exports: pointers and length checked, then op over
+// every element.
+template <class S, class D, class Op>
+Status checkedMap(const S* s, D* d, int len, Op op) {
+    if (Status st = checkFirst(anyNull(s, d), badLength(len))) return st;
+    simd::mapLanes(s, d, len, op);
+    return StatusOk;
+}
+template <class S, class D, class Op>
+Status checkedMap(const S* a, const S* b, D* d, int len, Op op) {
+    if (Status st = checkFirst(anyNull(a, b, d), badLength(len))) return st;
+    simd::mapLanes(a, b, d, len, op);
+    return StatusOk;
+}
 
 }  // namespace
 
 // ---- exports ---------------------------------------------------------------------------
 
 Status ZOR_CALL zorsAdd_32f(const float* pSrc1, const float* pSrc2, float* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDst), badLength(len))) return s;
-    map32f(pSrc1, pSrc2, pDst, len, AddF{});
-    return StatusOk;
+    return checkedMap(pSrc1, pSrc2, pDst, len, kAdd);
 }
 Status ZOR_CALL zorsAdd_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, AddF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kAdd);
 }
 Status ZOR_CALL zorsSub_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, SubF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kSub);
 }
 Status ZOR_CALL zorsMul_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, MulF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kMul);
 }
 // No check for zero divisors: IEEE infinities and NaNs result.
 Status ZOR_CALL zorsDiv_32f_I(const float* pSrc, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrc, pSrcDst, len, DivF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrc, pSrcDst, len, kDiv);
 }
 
 // The constant shortcuts (add 0, multiply by 1 or 0, subtract 0) skip the
@@ -912,7 +198,7 @@ Status ZOR_CALL zorsDiv_32f_I(const float* pSrc, float* pSrcDst, int len) {
 Status ZOR_CALL zorsAddC_32f_I(float val, float* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (val == 0.0f) return StatusOk;
-    map32f(pSrcDst, pSrcDst, len, AddCF(val));
+    simd::mapLanes(pSrcDst, pSrcDst, len, addConst(val));
     return StatusOk;
 }
 Status ZOR_CALL zorsSubC_32f(const float* pSrc, float val, float* pDst, int len) {
@@ -920,13 +206,11 @@ Status ZOR_CALL zorsSubC_32f(const float* pSrc, float val, float* pDst, int len)
     if (val == 0.0f)
         copy32f(pSrc, pDst, len);
     else
-        map32f(pSrc, pDst, len, SubCF(val));
+        simd::mapLanes(pSrc, pDst, len, subConst(val));
     return StatusOk;
 }
 Status ZOR_CALL zorsSubC_32f_I(float val, float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, SubCF(val));
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, subConst(val));
 }
 Status ZOR_CALL zorsMulC_32f(const float* pSrc, float val, float* pDst, int len) {
     if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
@@ -935,7 +219,7 @@ Status ZOR_CALL zorsMulC_32f(const float* pSrc, float val, float* pDst, int len)
     else if (val == 0.0f)
         zero32f(pDst, len);
     else
-        map32f(pSrc, pDst, len, MulCF(val));
+        simd::mapLanes(pSrc, pDst, len, mulConst(val));
     return StatusOk;
 }
 Status ZOR_CALL zorsMulC_32f_I(float val, float* pSrcDst, int len) {
@@ -944,7 +228,7 @@ Status ZOR_CALL zorsMulC_32f_I(float val, float* pSrcDst, int len) {
     if (val == 0.0f)
         zero32f(pSrcDst, len);
     else
-        map32f(pSrcDst, pSrcDst, len, MulCF(val));
+        simd::mapLanes(pSrcDst, pSrcDst, len, mulConst(val));
     return StatusOk;
 }
 // Division by a constant multiplies by its float reciprocal (formed in double
@@ -962,7 +246,7 @@ Status ZOR_CALL zorsDivC_32f_I(float val, float* pSrcDst, int len) {
     return zorsMulC_32f(pSrcDst, toFloat(1.0 / static_cast<double>(val)), pSrcDst, len);
 }
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 Status ZOR_CALL zorsAdd_16s_Sfs(const int16_t* pSrc1, const int16_t* pSrc2, int16_t* pDst, int len,
                                 int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDst), badLength(len))) return s;
@@ -970,19 +254,19 @@ Status ZOR_CALL zorsAdd_16s_Sfs(const int16_t* pSrc1, const int16_t* pSrc2, int1
         std::memset(pDst, 0, static_cast<size_t>(len) * sizeof(int16_t));
         return StatusOk;
     }
-    map16s(pSrc1, pSrc2, pDst, len, AddSfs16{scaleFactor});
+    simd::mapLanes(pSrc1, pSrc2, pDst, len, AddScaled16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsAddC_16s_I(int16_t val, int16_t* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (val == 0) return StatusOk;
-    map16s(pSrcDst, pSrcDst, len, AddC16{val});
+    addConst16(val, [&](auto op) { simd::mapLanes(pSrcDst, pSrcDst, len, op); });
     return StatusOk;
 }
 Status ZOR_CALL zorsSubC_16s_I(int16_t val, int16_t* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (val == 0) return StatusOk;
-    map16s(pSrcDst, pSrcDst, len, AddC16{-int32_t(val)});
+    addConst16(-int32_t(val), [&](auto op) { simd::mapLanes(pSrcDst, pSrcDst, len, op); });
     return StatusOk;
 }
 
@@ -992,70 +276,54 @@ Status ZOR_CALL zorsMul_NR_16s_Sfs(const int16_t* pSrc1, const int16_t* pSrc2, i
                                    int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrc1, pSrc2, pDst, len, MulNR16(scaleFactor));
+    mulRounded16(pSrc1, pSrc2, pDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsMul_NR_16s_ISfs(const int16_t* pSrc, int16_t* pSrcDst, int len, int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc, pSrcDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrc, pSrcDst, pSrcDst, len, MulNR16(scaleFactor));
+    mulRounded16(pSrc, pSrcDst, pSrcDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsMulC_NR_16s_Sfs(const int16_t* pSrc, int16_t val, int16_t* pDst, int len,
                                     int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrc, pDst, len, MulCNR16(scaleFactor, val));
+    mulRounded16(pSrc, val, pDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 Status ZOR_CALL zorsMulC_NR_16s_ISfs(int16_t val, int16_t* pSrcDst, int len, int scaleFactor) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (scaleFactor < 0) return StatusBadScaleFactor;
-    map16s(pSrcDst, pSrcDst, len, MulCNR16(scaleFactor, val));
+    mulRounded16(pSrcDst, val, pSrcDst, len, MulRounded16{scaleFactor});
     return StatusOk;
 }
 
 Status ZOR_CALL zorsAbs_16s(const int16_t* pSrc, int16_t* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map16s(pSrc, pDst, len, Abs16{});
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kAbs16);
 }
 Status ZOR_CALL zorsAbs_16s_I(int16_t* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map16s(pSrcDst, pSrcDst, len, Abs16{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kAbs16);
 }
 Status ZOR_CALL zorsAbs_64f(const double* pSrc, double* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    abs64f(pSrc, pDst, len);
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kAbs);
 }
 Status ZOR_CALL zorsAbs_64f_I(double* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    abs64f(pSrcDst, pSrcDst, len);
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kAbs);
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 Status ZOR_CALL zorsAbs_32f(const float* pSrc, float* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map32f(pSrc, pDst, len, AbsF{});
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kAbs);
 }
 Status ZOR_CALL zorsAbs_32f_I(float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, AbsF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kAbs);
 }
 Status ZOR_CALL zorsSqr_32f(const float* pSrc, float* pDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map32f(pSrc, pDst, len, SqrF{});
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, kSquare);
 }
 Status ZOR_CALL zorsSqr_32f_I(float* pSrcDst, int len) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, SqrF{});
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, kSquare);
 }
 // Negative elements and NaNs become the quiet NaN 0xFFC00000; +-0 stays.
 Status ZOR_CALL zorsSqrt_32f_I(float* pSrcDst, int len) {
@@ -1069,23 +337,19 @@ Status ZOR_CALL zorsSqrt_32f_I(float* pSrcDst, int len) {
 Status ZOR_CALL zorsThreshold_32f_I(float* pSrcDst, int len, float level, int relOp) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (relOp == CmpGreater)
-        map32f(pSrcDst, pSrcDst, len, ClipAbove(level));
+        simd::mapLanes(pSrcDst, pSrcDst, len, clipAbove(level));
     else
-        map32f(pSrcDst, pSrcDst, len, ClipBelow(level));
+        simd::mapLanes(pSrcDst, pSrcDst, len, clipBelow(level));
     return StatusOk;
 }
 Status ZOR_CALL zorsThreshold_LTVal_32f(const float* pSrc, float* pDst, int len, float level, float value) {
-    if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
-    map32f(pSrc, pDst, len, BelowToValue(level, value));
-    return StatusOk;
+    return checkedMap(pSrc, pDst, len, belowToValue(level, value));
 }
 Status ZOR_CALL zorsThreshold_LTVal_32f_I(float* pSrcDst, int len, float level, float value) {
-    if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
-    map32f(pSrcDst, pSrcDst, len, BelowToValue(level, value));
-    return StatusOk;
+    return checkedMap(pSrcDst, pSrcDst, len, belowToValue(level, value));
 }
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 // The logarithm reports the first special element it met: a zero
 // (StatusWarnLnZero) or anything with the sign bit set (StatusWarnLnNegative).
 Status ZOR_CALL zorsLn_32f_I(float* pSrcDst, int len) {
@@ -1157,9 +421,9 @@ Status ZOR_CALL zorsDeinterleave_16s(const int16_t* pSrc, int channels, int len,
     }
     return misaligned ? StatusWarnMisaligned : StatusOk;
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 // Sorting is the same comparison sequence on every processor.
 Status ZOR_CALL zorsSortDescend_32f_I(float* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;

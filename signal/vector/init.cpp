@@ -10,20 +10,19 @@
 #include "frame/status.h"
 #include "frame/fpu.h"
 #include "frame/mxcsr.h"
+#include "frame/simd.h"
 
 #include <algorithm>
 #include <cstring>
 #include <limits>
 #include <type_traits>
 
-#include "signal/vector/vector_common.h"
-
 namespace zor { namespace ZOR_NS {
 namespace {
 
 // ---- zero and copy: byte operations, generic entry only ----------------------
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 template <class T>
 Status zeroVector(T* pDst, int len) {
     if (Status s = checkFirst(anyNull(pDst), badLength(len))) return s;
@@ -52,18 +51,17 @@ void fillPattern(T* pDst, const T& val, int len) {
     const size_t bytes = static_cast<size_t>(len) * sizeof(T);
     size_t i = 0;
 #if ZOR_SIMD >= 1
-    // 16 bytes of repeated elements: sizeof(T) divides 16, so storing the
-    // pattern at any multiple of 16 bytes keeps the elements in phase.
-    alignas(16) uint8_t pattern[16];
-    for (size_t k = 0; k < 16; k += sizeof(T)) std::memcpy(pattern + k, &val, sizeof(T));
-    const __m128 p = _mm_load_ps(reinterpret_cast<const float*>(pattern));
-    for (; i + 64 <= bytes; i += 64) {
-        _mm_storeu_ps(reinterpret_cast<float*>(d + i), p);
-        _mm_storeu_ps(reinterpret_cast<float*>(d + i + 16), p);
-        _mm_storeu_ps(reinterpret_cast<float*>(d + i + 32), p);
-        _mm_storeu_ps(reinterpret_cast<float*>(d + i + 48), p);
-    }
-    for (; i + 16 <= bytes; i += 16) _mm_storeu_ps(reinterpret_cast<float*>(d + i), p);
+    // A register of repeated elements (float lanes only carry the bytes):
+    // sizeof(T) divides its width, so storing it at any multiple of the
+    // width keeps the elements in phase.
+    using V = simd::Vec<float>;
+    constexpr size_t kWidth = V::kBytes;
+    alignas(64) uint8_t pattern[kWidth];
+    for (size_t k = 0; k < kWidth; k += sizeof(T)) std::memcpy(pattern + k, &val, sizeof(T));
+    const V p = simd::loadFrom<V>(pattern);
+    for (; i + 4 * kWidth <= bytes; i += 4 * kWidth)
+        for (size_t k = 0; k < 4; ++k) simd::storeTo(d + i + k * kWidth, p);
+    for (; i + kWidth <= bytes; i += kWidth) simd::storeTo(d + i, p);
 #endif
     for (; i < bytes; i += sizeof(T)) std::memcpy(d + i, &val, sizeof(T));
 }
@@ -77,7 +75,7 @@ Status setVector(const T& val, T* pDst, int len) {
 
 // ---- integer and float widening -----------------------------------------------
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 // The per-element rule of the widening and 32s16s conversions.
 template <class S, class D>
 inline D widenOne(S v) {
@@ -85,7 +83,7 @@ inline D widenOne(S v) {
     else return static_cast<D>(v);  // exact, or (32s to 32f) rounded once, ties to even
 }
 
-#  if ZOR_VARIANT == 0
+#  if ZOR_SIMD < 2
 // The float values -128 .. 255: 8-bit sources are converted by lookup.
 struct ByteFloatTable {
     float v[384];
@@ -97,70 +95,57 @@ constexpr ByteFloatTable kByteFloat;
 #  endif
 
 #  if ZOR_SIMD >= 2
-// Sign or zero extension of the low and high halves of a register.
-inline __m128i extendLo8(__m128i v, std::true_type) { return _mm_srai_epi16(_mm_unpacklo_epi8(v, v), 8); }
-inline __m128i extendHi8(__m128i v, std::true_type) { return _mm_srai_epi16(_mm_unpackhi_epi8(v, v), 8); }
-inline __m128i extendLo8(__m128i v, std::false_type) { return _mm_unpacklo_epi8(v, _mm_setzero_si128()); }
-inline __m128i extendHi8(__m128i v, std::false_type) { return _mm_unpackhi_epi8(v, _mm_setzero_si128()); }
-inline __m128i extendLo16(__m128i v, std::true_type) { return _mm_srai_epi32(_mm_unpacklo_epi16(v, v), 16); }
-inline __m128i extendHi16(__m128i v, std::true_type) { return _mm_srai_epi32(_mm_unpackhi_epi16(v, v), 16); }
-inline __m128i extendLo16(__m128i v, std::false_type) { return _mm_unpacklo_epi16(v, _mm_setzero_si128()); }
-inline __m128i extendHi16(__m128i v, std::false_type) { return _mm_unpackhi_epi16(v, _mm_setzero_si128()); }
-
-inline __m128i loadu(const void* p) { return _mm_loadu_si128(static_cast<const __m128i*>(p)); }
-inline void storeu(void* p, __m128i v) { _mm_storeu_si128(static_cast<__m128i*>(p), v); }
-
-// One SIMD step of each widening conversion; returns the elements done.
+// One step of each widening conversion from a 16-byte register of sources
+// (the widened halves are stored in order); returns the elements done.
 template <class S, class D>
 inline int widenBlock(const S* s, D* d) {
-    using Signed = std::integral_constant<bool, std::is_signed_v<S>>;
+    using namespace simd;
+    using V = Vec<S, 16>;
     if constexpr (sizeof(S) == 1) {  // 8u/8s to 16s or 32f: 16 elements
-        const __m128i v = loadu(s);
-        const __m128i lo = extendLo8(v, Signed()), hi = extendHi8(v, Signed());
+        const V v = load<V>(s);
+        const auto lo = bitcast<int16_t>(widenLo(v)), hi = bitcast<int16_t>(widenHi(v));
         if constexpr (sizeof(D) == 2) {
-            storeu(d, lo);
-            storeu(d + 8, hi);
+            store(d, lo);
+            store(d + 8, hi);
         } else {
-            const __m128i sign = _mm_srai_epi16(lo, 15), signH = _mm_srai_epi16(hi, 15);
-            _mm_storeu_ps(d, _mm_cvtepi32_ps(_mm_unpacklo_epi16(lo, sign)));
-            _mm_storeu_ps(d + 4, _mm_cvtepi32_ps(_mm_unpackhi_epi16(lo, sign)));
-            _mm_storeu_ps(d + 8, _mm_cvtepi32_ps(_mm_unpacklo_epi16(hi, signH)));
-            _mm_storeu_ps(d + 12, _mm_cvtepi32_ps(_mm_unpackhi_epi16(hi, signH)));
+            store(d, toFloat(widenLo(lo)));
+            store(d + 4, toFloat(widenHi(lo)));
+            store(d + 8, toFloat(widenLo(hi)));
+            store(d + 12, toFloat(widenHi(hi)));
         }
         return 16;
     } else if constexpr (sizeof(S) == 2 && std::is_same_v<D, float>) {
         // 16s/16u to 32f, 16 elements: the 16 bits (made unsigned) become
         // the low mantissa of 2^23, and subtracting 2^23 (plus the bias)
         // leaves the value exactly; fewer steps than extend-and-convert.
-        const __m128i flip = _mm_set1_epi16(std::is_signed_v<S> ? -32768 : 0);
-        const __m128i high = _mm_set1_epi16(0x4B00);
-        const __m128 base = _mm_set1_ps(std::is_signed_v<S> ? 8388608.0f + 32768.0f : 8388608.0f);
-        const __m128i v0 = _mm_xor_si128(loadu(s), flip), v1 = _mm_xor_si128(loadu(s + 8), flip);
-        _mm_storeu_ps(d, _mm_sub_ps(_mm_castsi128_ps(_mm_unpacklo_epi16(v0, high)), base));
-        _mm_storeu_ps(d + 4, _mm_sub_ps(_mm_castsi128_ps(_mm_unpackhi_epi16(v0, high)), base));
-        _mm_storeu_ps(d + 8, _mm_sub_ps(_mm_castsi128_ps(_mm_unpacklo_epi16(v1, high)), base));
-        _mm_storeu_ps(d + 12, _mm_sub_ps(_mm_castsi128_ps(_mm_unpackhi_epi16(v1, high)), base));
+        using W = Vec<uint16_t, 16>;
+        using F = Vec<float, 16>;
+        const W flip = set1<W>(std::is_signed_v<S> ? 0x8000 : 0), high = set1<W>(0x4B00);
+        const F base = set1<F>(std::is_signed_v<S> ? 8388608.0f + 32768.0f : 8388608.0f);
+        const W v0 = bitcast<uint16_t>(load<V>(s)) ^ flip, v1 = bitcast<uint16_t>(load<V>(s + 8)) ^ flip;
+        store(d, bitcast<float>(zipLo(v0, high)) - base);
+        store(d + 4, bitcast<float>(zipHi(v0, high)) - base);
+        store(d + 8, bitcast<float>(zipLo(v1, high)) - base);
+        store(d + 12, bitcast<float>(zipHi(v1, high)) - base);
         return 16;
     } else if constexpr (sizeof(S) == 2) {  // 16s/16u to 32s: 16 elements
-        const __m128i v0 = loadu(s), v1 = loadu(s + 8);
-        __m128i w[4] = {extendLo16(v0, Signed()), extendHi16(v0, Signed()),
-                        extendLo16(v1, Signed()), extendHi16(v1, Signed())};
-        for (int k = 0; k < 4; ++k) {
-            if constexpr (std::is_same_v<D, float>) _mm_storeu_ps(d + 4 * k, _mm_cvtepi32_ps(w[k]));
-            else storeu(d + 4 * k, w[k]);
-        }
+        const V v0 = load<V>(s), v1 = load<V>(s + 8);
+        store(d, bitcast<D>(widenLo(v0)));
+        store(d + 4, bitcast<D>(widenHi(v0)));
+        store(d + 8, bitcast<D>(widenLo(v1)));
+        store(d + 12, bitcast<D>(widenHi(v1)));
         return 16;
     } else if constexpr (std::is_same_v<D, float>) {  // 32s to 32f
-        _mm_storeu_ps(d, _mm_cvtepi32_ps(loadu(s)));
-        _mm_storeu_ps(d + 4, _mm_cvtepi32_ps(loadu(s + 4)));
+        store(d, toFloat(load<V>(s)));
+        store(d + 4, toFloat(load<V>(s + 4)));
         return 8;
     } else if constexpr (std::is_same_v<D, double>) {  // 32s to 64f
-        const __m128i v = loadu(s);
-        _mm_storeu_pd(d, _mm_cvtepi32_pd(v));
-        _mm_storeu_pd(d + 2, _mm_cvtepi32_pd(_mm_unpackhi_epi64(v, v)));
+        const V v = load<V>(s);
+        store(d, toDoubleLo(v));
+        store(d + 2, toDoubleHi(v));
         return 4;
     } else {  // 32s to 16s, saturating
-        storeu(d, _mm_packs_epi32(loadu(s), loadu(s + 4)));
+        store(d, narrowSat<int16_t>(load<V>(s), load<V>(s + 4)));
         return 8;
     }
 }
@@ -210,6 +195,24 @@ inline D convertOne(double x, bool nearest, double cmpLo, double cmpHi) {
     return static_cast<D>(t);
 }
 
+// 2^-scaleFactor, as halving 1.0 scaleFactor times (or doubling it
+// -scaleFactor times) gives it: exact, subnormal down to 2^-1074, 0 beyond
+// that (the last halving is a tie that rounds to even), infinite beyond
+// 2^1023.  Built from the bits, so a huge factor costs no loop and no x87
+// register can keep an exponent that a double cannot hold.
+inline double scaleMultiplier(int scaleFactor) {
+    const int64_t e = -static_cast<int64_t>(scaleFactor);
+    uint64_t bits;
+    if (e > 1023) bits = uint64_t(0x7ff) << 52;                      // +infinity
+    else if (e >= -1022) bits = uint64_t(e + 1023) << 52;            // normal
+    else if (e >= -1074) bits = uint64_t(1) << (e + 1074);           // subnormal
+    else bits = 0;
+    double d;
+    std::memcpy(&d, &bits, sizeof d);
+    return d;
+}
+
+
 template <class S, class D>
 struct Narrowing {
     double mult;         // 2^-scaleFactor, unused when scaled is false
@@ -234,139 +237,129 @@ struct Narrowing {
 };
 
 #  if ZOR_SIMD >= 2
-// Packs four registers of 32-bit integers, already inside D's range or
-// saturating as D demands, into D elements at d.
+// The blocks below hold 16 elements as four 16-byte registers of 32-bit
+// integers, packed in order.
+using F4 = simd::Vec<float, 16>;
+using I4 = simd::Vec<int32_t, 16>;
+using D2 = simd::Vec<double, 16>;
+
+// Stores four registers of 32-bit integers as D elements at d, saturating
+// to D's range.
 template <class D>
-inline void packStore(D* d, __m128i a, __m128i b, __m128i c, __m128i e) {
+inline void packStore(D* d, const I4 (&r)[4]) {
+    using namespace simd;
     if constexpr (sizeof(D) == 4) {
-        storeu(d, a);
-        storeu(d + 4, b);
-        storeu(d + 8, c);
-        storeu(d + 12, e);
-    } else if constexpr (std::is_same_v<D, int16_t>) {
-        storeu(d, _mm_packs_epi32(a, b));
-        storeu(d + 8, _mm_packs_epi32(c, e));
-    } else if constexpr (std::is_same_v<D, uint16_t>) {
-        // No unsigned 32-to-16 pack before SSE4.1: bias into the signed range.
-        const __m128i bias = _mm_set1_epi32(32768), back = _mm_set1_epi16(-32768);
-        storeu(d, _mm_xor_si128(_mm_packs_epi32(_mm_sub_epi32(a, bias), _mm_sub_epi32(b, bias)), back));
-        storeu(d + 8, _mm_xor_si128(_mm_packs_epi32(_mm_sub_epi32(c, bias), _mm_sub_epi32(e, bias)), back));
-    } else if constexpr (std::is_same_v<D, int8_t>) {
-        storeu(d, _mm_packs_epi16(_mm_packs_epi32(a, b), _mm_packs_epi32(c, e)));
+        for (int k = 0; k < 4; ++k) store(d + 4 * k, r[k]);
+    } else if constexpr (sizeof(D) == 2) {
+        store(d, narrowSat<D>(r[0], r[1]));
+        store(d + 8, narrowSat<D>(r[2], r[3]));
     } else {
-        storeu(d, _mm_packus_epi16(_mm_packs_epi32(a, b), _mm_packs_epi32(c, e)));
+        store(d, narrowSat<D>(narrowSat<int16_t>(r[0], r[1]), narrowSat<int16_t>(r[2], r[3])));
     }
 }
 
 // Float sources, unscaled, 16 elements.  Ties to even come from the
 // conversion itself (round to nearest, as float sources are exact).
 //
-// Unclamped, cvtps2dq (or cvttps2dq) is right for every input it can
-// represent, and the packs saturate to D's range; negative values reach 0
-// for 8u through the unsigned pack and for 16u through the biased one.  The
-// inputs it cannot represent (NaN, values outside the int32 range) raise
-// the invalid flag, and their elements are converted again clamped.
-//
-// The clamps: min(hi, x) keeps a NaN (the second operand wins), which the
+// cvtps2dq (or cvttps2dq) is right for every input it can represent, and
+// the packs saturate to D's range; the clamps before it take care of the
+// rest (NaN, values outside the int32 range): min(hi, x) keeps a NaN (the second operand wins), which the
 // conversion turns into INT_MIN and the signed packs into the lowest value;
 // max(x, 0) turns a NaN into 0 for unsigned destinations.  For 32s the
 // conversion's INT_MIN at and above 2^31 is flipped to INT_MAX.
-template <class D, bool Nearest, bool Clamp>
+template <class D, bool Nearest>
 inline void narrowFloatBlock(const float* s, D* d) {
+    using namespace simd;
     using L = std::numeric_limits<D>;
-    __m128i r[4];
+    I4 r[4];
     for (int k = 0; k < 4; ++k) {
-        __m128 x = _mm_loadu_ps(s + 4 * k);
-        __m128 over = _mm_setzero_ps();
-        if constexpr (Clamp && sizeof(D) == 4) {
-            over = _mm_cmpge_ps(x, _mm_set1_ps(2147483648.0f));
-        } else if constexpr (Clamp) {
-            if constexpr (!std::is_signed_v<D>) x = _mm_max_ps(x, _mm_setzero_ps());
-            x = _mm_min_ps(_mm_set1_ps(float(L::max())), x);
+        F4 x = load<F4>(s + 4 * k);
+        I4 over = zero<I4>();
+        if constexpr (sizeof(D) == 4) {
+            over = bitcast<int32_t>(ge(x, set1<F4>(2147483648.0f)));
+        } else {
+            if constexpr (!std::is_signed_v<D>) x = max(x, zero<F4>());
+            x = min(set1<F4>(float(L::max())), x);
         }
-        r[k] = Nearest ? _mm_cvtps_epi32(x) : _mm_cvttps_epi32(x);
-        if constexpr (Clamp && sizeof(D) == 4) r[k] = _mm_xor_si128(r[k], _mm_castps_si128(over));
+        r[k] = Nearest ? toInt32(x) : toInt32Trunc(x);
+        if constexpr (sizeof(D) == 4) r[k] = r[k] ^ over;
     }
-    packStore(d, r[0], r[1], r[2], r[3]);
+    packStore(d, r);
 }
 
-template <class D, bool Nearest, bool Clamp>
-[[gnu::noinline]] void narrowFloatRun(const float* s, D* d, int n) {
-    for (int i = 0; i + 16 <= n; i += 16) narrowFloatBlock<D, Nearest, Clamp>(s + i, d + i);
+template <class D, bool Nearest>
+void narrowFloatRun(const float* s, D* d, int n) {
+    for (int i = 0; i + 16 <= n; i += 16) narrowFloatBlock<D, Nearest>(s + i, d + i);
 }
 
-// The first n elements (a multiple of 16), in runs of 1024: each run fast,
-// and again clamped if it met an input the fast form cannot take.  With the
-// invalid exception unmasked, where a SIMD conversion of such an input would
-// trap, nothing is done here and the caller's element loop does it all.
+// The first n elements (a multiple of 16), clamped on the way: the clamps
+// cost a compare or two per register, far less than the memory traffic, and
+// give every input its value without consulting the processor's status
+// flags (which tools such as valgrind do not model).  With the invalid
+// exception unmasked, where a SIMD conversion of a NaN would trap, nothing
+// is done here and the caller's element loop does it all.
 template <class D, bool Nearest>
 int narrowFloats(const float* s, D* d, int n) {
-    ConversionScope csr;
-    if (!csr.armed()) return 0;
-    for (int i = 0; i < n; i += 1024) {
-        const int m = std::min(1024, n - i);
-        csr.run([&](bool clamp) {
-            if (clamp) narrowFloatRun<D, Nearest, true>(s + i, d + i, m);
-            else narrowFloatRun<D, Nearest, false>(s + i, d + i, m);
-        });
-    }
+    ConversionScope nearestEven;
+    if (!nearestEven.armed()) return 0;
+    narrowFloatRun<D, Nearest>(s, d, n);
     return n;
 }
 
-// Two doubles to two 32-bit integers (low half) by convertOne's rule.  x is
+// Four doubles to 32-bit integers by convertOne's rule.  x0, x1 are
 // already clamped from above (a NaN kept).  Round-to-zero is the truncating
 // conversion; round-to-nearest replays the half-away-and-back-if-odd steps,
 // which for double sources differs from plain ties-to-even at 0.5 + 2^-53.
-inline __m128i narrowPairDouble(__m128d x, bool nearest) {
-    if (!nearest) return _mm_cvttpd_epi32(x);
-    const __m128d signBit = _mm_set1_pd(-0.0);
-    const __m128d half = _mm_or_pd(_mm_and_pd(x, signBit), _mm_set1_pd(0.5));
-    const __m128d sum = _mm_add_pd(x, half);
-    __m128i t = _mm_cvttpd_epi32(sum);
-    const __m128i tie = _mm_shuffle_epi32(_mm_castpd_si128(_mm_cmpeq_pd(_mm_cvtepi32_pd(t), sum)),
-                                          _MM_SHUFFLE(3, 3, 2, 0));
-    const __m128i neg = _mm_shuffle_epi32(_mm_castpd_si128(_mm_cmplt_pd(x, _mm_setzero_pd())),
-                                          _MM_SHUFFLE(3, 3, 2, 0));
-    const __m128i step = _mm_and_si128(_mm_and_si128(tie, t), _mm_set1_epi32(1));
+inline I4 narrowPairsOfDoubles(D2 x0, D2 x1, bool nearest) {
+    using namespace simd;
+    if (!nearest) return toInt32Trunc(x0, x1);
+    const D2 signBit = set1<D2>(-0.0), half = set1<D2>(0.5), z = zero<D2>();
+    const D2 sum0 = x0 + ((x0 & signBit) | half), sum1 = x1 + ((x1 & signBit) | half);
+    const I4 t = toInt32Trunc(sum0, sum1);
+    // the double masks as 32-bit lanes, one per element
+    const auto perElement = [](D2 m0, D2 m1) { return concatEven(bitcast<int32_t>(m0), bitcast<int32_t>(m1)); };
+    const I4 tie = perElement(eq(toDoubleLo(t), sum0), eq(toDoubleHi(t), sum1));
+    const I4 neg = perElement(lt(x0, z), lt(x1, z));
+    const I4 step = tie & t & set1<I4>(1);
     // toward zero: -1 for non-negative x, +1 for negative x
-    return _mm_sub_epi32(t, _mm_sub_epi32(_mm_xor_si128(step, neg), neg));
+    return t - ((step ^ neg) - neg);
 }
 
 // Double values (scaled float sources or double sources) to 32-bit
 // integers clamped into D's range, NaN kept where D is signed.
 template <class D>
-inline __m128i narrowDoubles(__m128d x0, __m128d x1, bool nearest) {
+inline I4 narrowDoubles(D2 x0, D2 x1, bool nearest) {
+    using namespace simd;
     using L = std::numeric_limits<D>;
     if constexpr (!std::is_signed_v<D>) {
-        x0 = _mm_max_pd(x0, _mm_setzero_pd());
-        x1 = _mm_max_pd(x1, _mm_setzero_pd());
+        x0 = max(x0, zero<D2>());
+        x1 = max(x1, zero<D2>());
     }
-    const __m128d hi = _mm_set1_pd(double(L::max()));
-    x0 = _mm_min_pd(hi, x0);
-    x1 = _mm_min_pd(hi, x1);
-    return _mm_unpacklo_epi64(narrowPairDouble(x0, nearest), narrowPairDouble(x1, nearest));
+    const D2 hi = set1<D2>(double(L::max()));
+    return narrowPairsOfDoubles(min(hi, x0), min(hi, x1), nearest);
 }
 
 template <class S, class D>
-inline void narrowScaledBlock(const S* s, D* d, __m128d mult, bool scaled, bool nearest) {
-    __m128i r[4];
+inline void narrowScaledBlock(const S* s, D* d, D2 mult, bool scaled, bool nearest) {
+    using namespace simd;
+    I4 r[4];
     for (int k = 0; k < 4; ++k) {
-        __m128d x0, x1;
+        D2 x0, x1;
         if constexpr (std::is_same_v<S, float>) {
-            const __m128 v = _mm_loadu_ps(s + 4 * k);
-            x0 = _mm_cvtps_pd(v);
-            x1 = _mm_cvtps_pd(_mm_movehl_ps(v, v));
+            const F4 v = load<F4>(s + 4 * k);
+            x0 = widenLo(v);
+            x1 = widenHi(v);
         } else {
-            x0 = _mm_loadu_pd(s + 4 * k);
-            x1 = _mm_loadu_pd(s + 4 * k + 2);
+            x0 = load<D2>(s + 4 * k);
+            x1 = load<D2>(s + 4 * k + 2);
         }
         if (scaled) {
-            x0 = _mm_mul_pd(x0, mult);
-            x1 = _mm_mul_pd(x1, mult);
+            x0 = x0 * mult;
+            x1 = x1 * mult;
         }
         r[k] = narrowDoubles<D>(x0, x1, nearest);
     }
-    packStore(d, r[0], r[1], r[2], r[3]);
+    packStore(d, r);
 }
 #  endif
 
@@ -386,7 +379,7 @@ Status narrowVector(const S* pSrc, D* pDst, int len, int rndMode, int scaleFacto
         }
     }
     if (!done) {
-        const __m128d mult = _mm_set1_pd(one.mult);
+        const D2 mult = simd::set1<D2>(one.mult);
         for (; i + 16 <= len; i += 16)
             narrowScaledBlock(pSrc + i, pDst + i, mult, one.scaled, one.nearest);
     }
@@ -394,13 +387,13 @@ Status narrowVector(const S* pSrc, D* pDst, int len, int rndMode, int scaleFacto
     for (; i < len; ++i) pDst[i] = one(pSrc[i]);
     return StatusOk;
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 }  // namespace
 
 // ---- exports --------------------------------------------------------------------
 
-#if ZOR_VARIANT == 0
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
 Status ZOR_CALL zorsZero_8u(uint8_t* pDst, int len) { return zeroVector(pDst, len); }
 Status ZOR_CALL zorsZero_16s(int16_t* pDst, int len) { return zeroVector(pDst, len); }
 Status ZOR_CALL zorsZero_16sc(Complex16s* pDst, int len) { return zeroVector(pDst, len); }
@@ -430,7 +423,7 @@ Status ZOR_CALL zorsSet_32fc(Complex32f val, Complex32f* pDst, int len) { return
 Status ZOR_CALL zorsSet_64sc(Complex64s val, Complex64s* pDst, int len) { return setVector(val, pDst, len); }
 Status ZOR_CALL zorsSet_64fc(Complex64f val, Complex64f* pDst, int len) { return setVector(val, pDst, len); }
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 Status ZOR_CALL zorsConvert_8s16s(const int8_t* pSrc, int16_t* pDst, int len) { return widenVector(pSrc, pDst, len); }
 Status ZOR_CALL zorsConvert_16s32s(const int16_t* pSrc, int32_t* pDst, int len) { return widenVector(pSrc, pDst, len); }
 Status ZOR_CALL zorsConvert_8u32f(const uint8_t* pSrc, float* pDst, int len) { return widenVector(pSrc, pDst, len); }

@@ -13,6 +13,7 @@
 #include "frame/variant.h"
 #include "frame/fpu.h"
 #include "frame/status.h"
+#include "frame/simd.h"
 
 #include <cmath>
 #include <cstdlib>
@@ -33,15 +34,19 @@ SumAndSquares pairSums(const float* s, int n) {
     int i = 0;
     double t, q = 0.0;
 #if ZOR_SIMD >= 2
-    __m128d acc = _mm_setzero_pd(), accq = _mm_setzero_pd();
+    // the even and odd sums are the two lanes of a 16-byte register
+    using namespace simd;
+    using F4 = Vec<float, 16>;
+    using D2 = Vec<double, 16>;
+    D2 acc = zero<D2>(), accq = zero<D2>();
     for (; i + 4 <= n; i += 4) {
-        const __m128 x = _mm_loadu_ps(s + i);
-        const __m128d a = _mm_cvtps_pd(x), b = _mm_cvtps_pd(_mm_movehl_ps(x, x));
-        acc = _mm_add_pd(_mm_add_pd(acc, a), b);
-        if (Squares) accq = _mm_add_pd(_mm_add_pd(accq, _mm_mul_pd(a, a)), _mm_mul_pd(b, b));
+        const F4 x = load<F4>(s + i);
+        const D2 a = widenLo(x), b = widenHi(x);
+        acc = acc + a + b;
+        if (Squares) accq = accq + a * a + b * b;
     }
-    t = _mm_cvtsd_f64(_mm_add_sd(acc, _mm_unpackhi_pd(acc, acc)));
-    if (Squares) q = _mm_cvtsd_f64(_mm_add_sd(accq, _mm_unpackhi_pd(accq, accq)));
+    t = reduceAdd(acc);
+    if (Squares) q = reduceAdd(accq);
 #else
     double s0 = 0.0, s1 = 0.0, q0 = 0.0, q1 = 0.0;
     for (; i + 4 <= n; i += 4) {
@@ -69,55 +74,45 @@ SumAndSquares pairSums(const float* s, int n) {
 // Term kinds: a * b, a * a, (a - b)^2, each formed in double.
 enum class Term { Product, Square, DiffSquare };
 
-template <Term K>
-inline double term(float a, float b) {
-    const double x = a, y = b;
-    if (K == Term::Product) return x * y;
-    if (K == Term::Square) return x * x;
-    const double d = toDouble(x - y);
-    return d * d;
+// On doubles or registers of doubles.
+template <Term K, class T>
+inline T term(T x, T y) {
+    if constexpr (K == Term::Product) return x * y;
+    else if constexpr (K == Term::Square) return x * x;
+    else {
+        T d = x - y;
+        if constexpr (std::is_same_v<T, double>) d = toDouble(d);
+        return d * d;
+    }
 }
-
-#if ZOR_SIMD >= 2
-template <Term K>
-inline __m128d vterm(__m128d x, __m128d y) {
-    if (K == Term::Product) return _mm_mul_pd(x, y);
-    if (K == Term::Square) return _mm_mul_pd(x, x);
-    const __m128d d = _mm_sub_pd(x, y);
-    return _mm_mul_pd(d, d);
-}
-#endif
-
-#if ZOR_SIMD >= 2
-// Two floats widened to double straight from memory.
-inline __m128d load2(const float* p) {
-    return _mm_cvtps_pd(_mm_castsi128_ps(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p))));
-}
-#endif
 
 template <Term K>
 double eightSums(const float* a, const float* b, int n) {
     int i = 0;
     double t;
 #if ZOR_SIMD >= 2
-    __m128d c0 = _mm_setzero_pd(), c1 = c0, c2 = c0, c3 = c0;
+    // sum i mod 8 is lane i mod 2 of register (i mod 8) / 2: 16-byte registers
+    using namespace simd;
+    using D2 = Vec<double, 16>;
+    const auto at = [&](const float* p) { return loadWidened<D2>(p + i); };
+    D2 c0 = zero<D2>(), c1 = c0, c2 = c0, c3 = c0;
     for (; i + 8 <= n; i += 8) {
-        c0 = _mm_add_pd(c0, vterm<K>(load2(a + i), load2(b + i)));
-        c1 = _mm_add_pd(c1, vterm<K>(load2(a + i + 2), load2(b + i + 2)));
-        c2 = _mm_add_pd(c2, vterm<K>(load2(a + i + 4), load2(b + i + 4)));
-        c3 = _mm_add_pd(c3, vterm<K>(load2(a + i + 6), load2(b + i + 6)));
+        c0 = c0 + term<K>(at(a), at(b));
+        c1 = c1 + term<K>(at(a + 2), at(b + 2));
+        c2 = c2 + term<K>(at(a + 4), at(b + 4));
+        c3 = c3 + term<K>(at(a + 6), at(b + 6));
     }
-    const __m128d s = _mm_add_pd(_mm_add_pd(c0, c1), _mm_add_pd(c2, c3));
-    t = _mm_cvtsd_f64(_mm_add_sd(s, _mm_unpackhi_pd(s, s)));
+    const D2 s = (c0 + c1) + (c2 + c3);
+    t = reduceAdd(s);
 #else
     double s[8] = {0, 0, 0, 0, 0, 0, 0, 0};
     for (; i + 8 <= n; i += 8)
-        for (int j = 0; j < 8; ++j) s[j] = toDouble(s[j] + term<K>(a[i + j], b[i + j]));
+        for (int j = 0; j < 8; ++j) s[j] = toDouble(s[j] + term<K>(double(a[i + j]), double(b[i + j])));
     const double even = toDouble(toDouble(s[0] + s[2]) + toDouble(s[4] + s[6]));
     const double odd = toDouble(toDouble(s[1] + s[3]) + toDouble(s[5] + s[7]));
     t = toDouble(even + odd);
 #endif
-    for (; i < n; ++i) t = toDouble(t + term<K>(a[i], b[i]));
+    for (; i < n; ++i) t = toDouble(t + term<K>(double(a[i]), double(b[i])));
     return t;
 }
 
@@ -145,79 +140,45 @@ int extremeIndexScalar(const T* s, int n) {
 }
 
 #if ZOR_SIMD >= 1
-// Lane operations per element type: broadcast, load, strict max/min step
-// (x replaces m where strictly better), equality mask, horizontal fold.
-struct F32Lanes {
-    using T = float;
-    using V = __m128;
-    static constexpr int W = 4;
-    static V set(T v) { return _mm_set1_ps(v); }
-    static V load(const T* p) { return _mm_loadu_ps(p); }
-    template <bool Max> static V step(V x, V m) { return Max ? _mm_max_ps(x, m) : _mm_min_ps(x, m); }
-    static int eqMask(V a, V b) { return _mm_movemask_ps(_mm_cmpeq_ps(a, b)); }
-    static void store(T* p, V v) { _mm_storeu_ps(p, v); }
-};
-#endif
-#if ZOR_SIMD >= 2
-struct F64Lanes {
-    using T = double;
-    using V = __m128d;
-    static constexpr int W = 2;
-    static V set(T v) { return _mm_set1_pd(v); }
-    static V load(const T* p) { return _mm_loadu_pd(p); }
-    template <bool Max> static V step(V x, V m) { return Max ? _mm_max_pd(x, m) : _mm_min_pd(x, m); }
-    static int eqMask(V a, V b) { return _mm_movemask_pd(_mm_cmpeq_pd(a, b)); }
-    static void store(T* p, V v) { _mm_storeu_pd(p, v); }
-};
-struct S16Lanes {
-    using T = int16_t;
-    using V = __m128i;
-    static constexpr int W = 8;
-    static V set(T v) { return _mm_set1_epi16(v); }
-    static V load(const T* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
-    template <bool Max> static V step(V x, V m) { return Max ? _mm_max_epi16(x, m) : _mm_min_epi16(x, m); }
-    static int eqMask(V a, V b) { return _mm_movemask_epi8(_mm_cmpeq_epi16(a, b)); }
-    static void store(T* p, V v) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), v); }
-};
-
-#endif
-
-#if ZOR_SIMD >= 1
-// Index of the first set lane in an eqMask result.
-template <class L>
-inline int firstLane(int mask) {
-    int k = __builtin_ctz(static_cast<unsigned>(mask));
-    return L::W == 8 ? k / 2 : k;
-}
-
-template <class L, bool Max>
-int extremeIndexSimd(const typename L::T* s, int n) {
-    using T = typename L::T;
+template <class T, bool Max>
+int extremeIndexSimd(const T* s, int n) {
+    using namespace simd;
+    using V = Vec<T>;
+    constexpr int W = V::kLanes;
     if (!(s[0] == s[0])) return 0;  // a leading NaN is kept
-    // Four independent accumulators, each updated with the strict rule.
-    typename L::V m0 = L::set(s[0]), m1 = m0, m2 = m0, m3 = m0;
+    // Four independent accumulators, each updated with the strict rule (x
+    // replaces m where strictly better: max/min keep their second operand
+    // on ties and NaNs).
+    const auto step = [](V x, V m) { return Max ? max(x, m) : min(x, m); };
+    V m0 = set1<V>(s[0]), m1 = m0, m2 = m0, m3 = m0;
     int i = 0;
-    for (; i + 4 * L::W <= n; i += 4 * L::W) {
-        m0 = L::template step<Max>(L::load(s + i), m0);
-        m1 = L::template step<Max>(L::load(s + i + L::W), m1);
-        m2 = L::template step<Max>(L::load(s + i + 2 * L::W), m2);
-        m3 = L::template step<Max>(L::load(s + i + 3 * L::W), m3);
+    for (; i + 4 * W <= n; i += 4 * W) {
+        m0 = step(load<V>(s + i), m0);
+        m1 = step(load<V>(s + i + W), m1);
+        m2 = step(load<V>(s + i + 2 * W), m2);
+        m3 = step(load<V>(s + i + 3 * W), m3);
     }
-    T lanes[4 * L::W];
-    L::store(lanes, m0);
-    L::store(lanes + L::W, m1);
-    L::store(lanes + 2 * L::W, m2);
-    L::store(lanes + 3 * L::W, m3);
+    alignas(64) T lanes[4 * W];
+    storeAligned(lanes, m0);
+    storeAligned(lanes + W, m1);
+    storeAligned(lanes + 2 * W, m2);
+    storeAligned(lanes + 3 * W, m3);
     T m = s[0];
-    for (int k = 0; k < 4 * L::W; ++k)
+    for (int k = 0; k < 4 * W; ++k)
         if (better<T, Max>(lanes[k], m)) m = lanes[k];
     for (; i < n; ++i)
         if (better<T, Max>(s[i], m)) m = s[i];
-    // The first element equal to the extreme value.
-    const typename L::V vm = L::set(m);
+    // The first element equal to the extreme value: blocks of four
+    // registers up to the one that holds it, then register by register.
+    const V vm = set1<V>(m);
+    const auto same = [&](int at) { return eq(load<V>(s + at), vm); };
     int j = 0;
-    for (; j + L::W <= n; j += L::W)
-        if (int mask = L::eqMask(L::load(s + j), vm)) return j + firstLane<L>(mask);
+    for (; j + 4 * W <= n; j += 4 * W)
+        if (anyTrue((same(j) | same(j + W)) | (same(j + 2 * W) | same(j + 3 * W)))) break;
+    for (; j + W <= n; j += W) {
+        const V hit = same(j);
+        if (anyTrue(hit)) return j + firstTrue(hit);
+    }
     for (; j < n; ++j)
         if (s[j] == m) return j;
     return 0;  // not reached: m is one of the elements
@@ -227,12 +188,8 @@ int extremeIndexSimd(const typename L::T* s, int n) {
 // The index of the element kept by the sequential strict scan.
 template <class T, bool Max>
 int extremeIndex(const T* s, int n) {
-#if ZOR_SIMD >= 2
-    if constexpr (std::is_same_v<T, double>) return extremeIndexSimd<F64Lanes, Max>(s, n);
-    if constexpr (std::is_same_v<T, int16_t>) return extremeIndexSimd<S16Lanes, Max>(s, n);
-#endif
 #if ZOR_SIMD >= 1
-    if constexpr (std::is_same_v<T, float>) return extremeIndexSimd<F32Lanes, Max>(s, n);
+    if constexpr (simd::kHas<T>) return extremeIndexSimd<T, Max>(s, n);
 #endif
     return extremeIndexScalar<T, Max>(s, n);
 }
@@ -251,13 +208,21 @@ Status extremeOf(const T* pSrc, int len, T* pValue, int* pIndx = nullptr) {
 // ---- exact integer sums ------------------------------------------------------------
 
 #if ZOR_SIMD >= 2
-inline __m128i load8(const int16_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
-// The four int64 lanes of two accumulators, added.
-inline int64_t laneTotal(__m128i a, __m128i b) {
-    alignas(16) int64_t l[4];
-    _mm_store_si128(reinterpret_cast<__m128i*>(l), a);
-    _mm_store_si128(reinterpret_cast<__m128i*>(l + 2), b);
-    return l[0] + l[1] + l[2] + l[3];
+// The 32-bit lanes pairs(x) gives for the registers of 16-bit elements x =
+// 0, L, 2L ... below n, summed exactly in 64 bits (Lane: int32_t or
+// uint32_t, how the lanes extend); x ends where the registers ended.
+template <class Lane, class Pairs>
+int64_t sumOfPairs(int n, int& x, Pairs pairs) {
+    using namespace simd;
+    using Q = Vec<std::conditional_t<std::is_signed_v<Lane>, int64_t, uint64_t>>;
+    constexpr int L = Vec<int16_t>::kLanes;
+    Q lo = zero<Q>(), hi = lo;
+    for (; x + L <= n; x += L) {
+        const auto t = bitcast<Lane>(pairs(x));
+        lo = lo + widenLo(t);
+        hi = hi + widenHi(t);
+    }
+    return int64_t(reduceAdd(lo + hi));
 }
 #endif
 
@@ -268,15 +233,12 @@ inline int64_t laneTotal(__m128i a, __m128i b) {
     int64_t total = 0;
     int i = 0;
 #if ZOR_SIMD >= 2
-    const __m128i bias = _mm_set1_epi32(65536);
-    __m128i lo = _mm_setzero_si128(), hi = lo;
-    for (; i + 8 <= n; i += 8) {
-        const __m128i w = _mm_sub_epi32(_mm_madd_epi16(load8(a + i), load8(b + i)), bias);
-        const __m128i sign = _mm_srai_epi32(w, 31);
-        lo = _mm_add_epi64(lo, _mm_unpacklo_epi32(w, sign));
-        hi = _mm_add_epi64(hi, _mm_unpackhi_epi32(w, sign));
-    }
-    total = laneTotal(lo, hi) + int64_t(i / 2) * 65536;
+    using namespace simd;
+    using V = Vec<int16_t>;
+    using W = Vec<int32_t>;
+    const W bias = set1<W>(65536);
+    total = sumOfPairs<int32_t>(n, i, [&](int x) { return mulAddPairs(load<V>(a + x), load<V>(b + x)) - bias; });
+    total += int64_t(i / 2) * 65536;
 #endif
     for (; i < n; ++i) total += int32_t(a[i]) * int32_t(b[i]);
     return total;
@@ -287,14 +249,12 @@ inline int64_t laneTotal(__m128i a, __m128i b) {
     int64_t total = 0;
     int i = 0;
 #if ZOR_SIMD >= 2
-    const __m128i z = _mm_setzero_si128();
-    __m128i lo = z, hi = z;
-    for (; i + 8 <= n; i += 8) {
-        const __m128i x = load8(a + i), q = _mm_madd_epi16(x, x);
-        lo = _mm_add_epi64(lo, _mm_unpacklo_epi32(q, z));
-        hi = _mm_add_epi64(hi, _mm_unpackhi_epi32(q, z));
-    }
-    total = laneTotal(lo, hi);
+    using namespace simd;
+    using V = Vec<int16_t>;
+    total = sumOfPairs<uint32_t>(n, i, [&](int x) {
+        const V v = load<V>(a + x);
+        return mulAddPairs(v, v);
+    });
 #endif
     for (; i < n; ++i) total += int32_t(a[i]) * int32_t(a[i]);
     return total;
@@ -306,15 +266,13 @@ inline int64_t laneTotal(__m128i a, __m128i b) {
     int64_t total = 0;
     int i = 0;
 #if ZOR_SIMD >= 2
-    const __m128i z = _mm_setzero_si128(), ones = _mm_set1_epi16(1);
-    __m128i lo = z, hi = z;
-    for (; i + 8 <= n; i += 8) {
-        const __m128i x = load8(a + i), s = _mm_srai_epi16(x, 15);
-        const __m128i t = _mm_sub_epi32(_mm_madd_epi16(_mm_xor_si128(x, s), ones), _mm_madd_epi16(s, ones));
-        lo = _mm_add_epi64(lo, _mm_unpacklo_epi32(t, z));
-        hi = _mm_add_epi64(hi, _mm_unpackhi_epi32(t, z));
-    }
-    total = laneTotal(lo, hi);
+    using namespace simd;
+    using V = Vec<int16_t>;
+    const V one = set1<V>(1);
+    total = sumOfPairs<uint32_t>(n, i, [&](int x) {
+        const V v = load<V>(a + x), sign = shr<15>(v);
+        return mulAddPairs(v ^ sign, one) - mulAddPairs(sign, one);
+    });
 #endif
     for (; i < n; ++i) total += std::abs(int32_t(a[i]));
     return total;
@@ -343,7 +301,7 @@ inline int64_t laneTotal(__m128i a, __m128i b) {
 
 // ---- exports ---------------------------------------------------------------------
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 // The hint is accepted and has no effect.
 Status ZOR_CALL zorsSum_32f(const float* pSrc, int len, float* pSum, int hint) {
     (void)hint;
@@ -403,7 +361,7 @@ Status ZOR_CALL zorsDotProd_32f(const float* pSrc1, const float* pSrc2, int len,
     *pDp = toFloat(eightSums<Term::Product>(pSrc1, pSrc2, len));
     return StatusOk;
 }
-#endif  // ZOR_VARIANT != 1
+#endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 Status ZOR_CALL zorsMax_32f(const float* pSrc, int len, float* pMax) {
     return extremeOf<float, true>(pSrc, len, pMax);
@@ -415,7 +373,7 @@ Status ZOR_CALL zorsMaxIndx_32f(const float* pSrc, int len, float* pMax, int* pI
     return extremeOf<float, true>(pSrc, len, pMax, pIndx);
 }
 
-#if ZOR_VARIANT != 1
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 // The integer reductions are exact sums in 64 bits: any order gives the same.
 Status ZOR_CALL zorsNorm_L2_16s32f(const int16_t* pSrc, int len, float* pNorm) {
     if (Status s = checkFirst(anyNull(pSrc, pNorm), badLength(len))) return s;

@@ -73,37 +73,24 @@ void recordReport(const char* text, const char* caption) {
 
 }  // namespace
 
-TEST(SelectVariant, CodeTable) {
+// Codes of the processor-type table decide alone, whatever the flags say;
+// only the second of two answers counts; unlisted codes fall back to the
+// cpuid flags (the x87 flag, not SSE3, gives variant 3).
+TEST(SelectVariant, CodeTableThenCpuidFlags) {
     const std::vector<std::pair<std::vector<int>, int>> rows = {
         {{1, 2, 3, 4}, 0}, {{5, 16, 17, 64}, 1}, {{6, 7, 9, 65}, 2}, {{8, 10, 32, 66}, 3}, {{33}, 4}};
     for (const auto& row : rows)
         for (int code : row.first) {
             EXPECT_EQ(variantForCode(code), row.second) << "code " << code;
-            // A listed code decides alone, whatever the processor's flags say.
             EXPECT_EQ(select(0, code, kX87 | kSse | kSse2, kSse3 | kSsse3), row.second);
         }
-    for (int code : {0, 11, 12, 15, 18, 31, 34, 63, 67, 68, -1})
-        EXPECT_EQ(variantForCode(code), -1) << "code " << code;
-}
-
-TEST(SelectVariant, OnlyTheSecondAnswerCounts) {
     EXPECT_EQ(select(33, 1), 0);
     EXPECT_EQ(gCalls, 2);
-    EXPECT_EQ(select(1, 33), 4);
-}
-
-TEST(SelectVariant, FamilyCodesWinOverFeatures) {
-    // Codes 1..4 select the generic variant even on a processor with SSE2.
-    for (int code : {1, 2, 3, 4}) EXPECT_EQ(select(code, code, kX87 | kSse | kSse2), 0);
-}
-
-TEST(SelectVariant, CpuidFallbackForUnlistedCodes) {
-    for (int code : {0, 11, 34, 67}) {
+    for (int code : {0, 11, 12, 15, 18, 31, 34, 63, 67, 68, -1}) {
         SCOPED_TRACE(code);
+        EXPECT_EQ(variantForCode(code), -1);
         EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, kSse3 | kSsse3), 4);
-        // The x87 flag, not SSE3, gives variant 3: with or without SSE3.
         EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, kSse3), 3);
-        EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, 0), 3);
         EXPECT_EQ(select(code, code, kX87, 0), 3);
         EXPECT_EQ(select(code, code, kSse | kSse2, kSse3), 2);
         EXPECT_EQ(select(code, code, kSse, 0), 1);
@@ -111,92 +98,60 @@ TEST(SelectVariant, CpuidFallbackForUnlistedCodes) {
     }
 }
 
-TEST(Waterfall, PreferenceRows) {
-    const int32_t expected[5][6] = {{0, 5}, {1, 0, 5}, {2, 1, 0, 5}, {3, 2, 1, 0, 5}, {4, 3, 2, 1, 0, 5}};
-    for (int v = 0; v < 5; ++v)
-        for (int i = 0; i < 6; ++i) EXPECT_EQ(kPreference[v][i], expected[v][i]) << v << "," << i;
+namespace {
+// Binds t for a processor answering code; returns initDispatch's result.
+int bind(const FakeTable& t, int code, int* bound, char (&msg)[256], int count = FakeTable::kRowsN) {
+    gReports.clear();
+    select(code, code);
+    gCalls = 0;
+    std::memset(msg, 'x', 256);
+    return initDispatch(t.table(count), Selector{fakeType, fakeLeaf1}, recordReport, msg, bound);
 }
+}  // namespace
 
-TEST(Waterfall, BindsTheSelectedColumn) {
+// Each variant tries its own column, then the ones below it, the generic
+// one last; a gap in a column moves every export to the next column.
+TEST(Waterfall, BindsTheFirstCompleteColumn) {
+    const int32_t preference[5][6] = {{0, 5}, {1, 0, 5}, {2, 1, 0, 5}, {3, 2, 1, 0, 5}, {4, 3, 2, 1, 0, 5}};
+    for (int v = 0; v < 5; ++v)
+        for (int i = 0; i < 6; ++i) EXPECT_EQ(kPreference[v][i], preference[v][i]) << v << "," << i;
+    char msg[256];
+    int bound = -1;
     for (int code : {1, 5, 6, 8, 33}) {
         FakeTable t;
-        char msg[256];
-        int bound = -1;
-        gReports.clear();
-        select(code, code);
-        gCalls = 0;
-        ASSERT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 1);
-        EXPECT_EQ(bound, variantForCode(code));
-        EXPECT_EQ(t.boundColumn(), bound);
-        EXPECT_TRUE(gReports.empty());
-        EXPECT_EQ(msg[0], '\0');
+        ASSERT_EQ(bind(t, code, &bound, msg), 1);
+        EXPECT_TRUE(bound == variantForCode(code) && t.boundColumn() == bound && gReports.empty() && msg[0] == 0);
     }
-}
-
-TEST(Waterfall, MissingEntryFallsBackForEveryExport) {
-    FakeTable t;
-    t.rows[1].entry[4] = nullptr;  // a gap in the middle of column 4
-    char msg[256];
-    int bound = -1;
-    select(33, 33);
-    gCalls = 0;
-    ASSERT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 1);
-    EXPECT_EQ(bound, 3);
-    // Row 0 was written from column 4 before the gap, then overwritten.
-    EXPECT_EQ(t.boundColumn(), 3);
-}
-
-TEST(Waterfall, FillSlotsKeepsWhatItWroteBeforeAGap) {
+    FakeTable gap, last;
+    gap.rows[1].entry[4] = nullptr;  // row 0 is written from column 4 first, then overwritten
+    ASSERT_EQ(bind(gap, 33, &bound, msg), 1);
+    EXPECT_TRUE(bound == 3 && gap.boundColumn() == 3);
+    for (int k = 1; k < 5; ++k) last.rows[0].entry[k] = nullptr;
+    ASSERT_EQ(bind(last, 33, &bound, msg), 1);
+    EXPECT_TRUE(bound == 0 && last.boundColumn() == 0);
     FakeTable t;
     t.rows[2].entry[2] = nullptr;
-    EXPECT_FALSE(fillSlots(t.table(), 2));
-    EXPECT_EQ(t.slots[0], t.rows[0].entry[2]);
-    EXPECT_EQ(t.slots[1], t.rows[1].entry[2]);
-    EXPECT_EQ(t.slots[2], nullptr);
-    EXPECT_TRUE(fillSlots(t.table(0), 2));  // no rows: nothing to do, success
+    EXPECT_FALSE(fillSlots(t.table(), 2));  // what it wrote before the gap stays
+    EXPECT_TRUE(t.slots[0] == t.rows[0].entry[2] && t.slots[1] == t.rows[1].entry[2] && t.slots[2] == nullptr);
+    EXPECT_TRUE(fillSlots(t.table(0), 2));
 }
 
-TEST(Waterfall, GenericColumnIsTheLastResort) {
-    FakeTable t;
-    for (int k = 1; k < 5; ++k) t.rows[0].entry[k] = nullptr;
-    char msg[256];
-    int bound = -1;
-    select(33, 33);
-    gCalls = 0;
-    ASSERT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 1);
-    EXPECT_EQ(bound, 0);
-    EXPECT_EQ(t.boundColumn(), 0);
-}
-
+// No complete column (or no table at all): the message, once, the rest of
+// the buffer cleared, nothing bound.
 TEST(Waterfall, NoCandidateShowsTheMessage) {
-    FakeTable t;
+    FakeTable t, empty;
     t.rows[0].entry[0] = nullptr;
     t.rows[2].entry[1] = nullptr;
     char msg[256];
-    std::memset(msg, 'x', sizeof msg);
-    gReports.clear();
-    select(5, 5);  // variant 1: tries 1, then 0
-    gCalls = 0;
     int bound = -1;
-    EXPECT_EQ(initDispatch(t.table(), Selector{fakeType, fakeLeaf1}, recordReport, msg, &bound), 0);
+    EXPECT_EQ(bind(t, 5, &bound, msg), 0);  // variant 1: tries 1, then 0
     EXPECT_EQ(bound, -1);
     ASSERT_EQ(gReports.size(), 1u);
-    EXPECT_EQ(gReports[0],
-              "Set zor library error| No zor matching to CPU was found during the Waterfall");
+    EXPECT_EQ(gReports[0], "Set zor library error| No zor matching to CPU was found during the Waterfall");
     EXPECT_STREQ(msg, " No zor matching to CPU was found during the Waterfall");
-    // The rest of the buffer was cleared before selection.
     for (size_t i = std::strlen(msg); i < sizeof msg; ++i) ASSERT_EQ(msg[i], '\0');
-}
-
-TEST(Waterfall, EmptyTableTakesTheFailurePath) {
-    FakeTable t;
-    char msg[256];
-    gReports.clear();
-    select(33, 33);
-    gCalls = 0;
-    EXPECT_EQ(initDispatch(t.table(0), Selector{fakeType, fakeLeaf1}, recordReport, msg, nullptr), 0);
-    EXPECT_EQ(gReports.size(), 1u);
-    EXPECT_EQ(t.boundColumn(), -1);  // nothing written
+    EXPECT_EQ(bind(empty, 33, nullptr, msg, 0), 0);
+    EXPECT_TRUE(gReports.size() == 1u && empty.boundColumn() == -1);
 }
 
 TEST(LibraryTable, EveryRowHasFiveEntries) {

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstring>
 #include <random>
 #include <vector>
@@ -69,6 +70,7 @@ TEST(SimdLanes, IntegerOperationsMatchTheirScalarTwins) {
     agreesLaneByLane<uint8_t>([](auto a, auto b) { return avg(a, b); }, "avg");
     agreesLaneByLane<uint16_t>([](auto a, auto b) { return absDiff(a, b); }, "absDiff");
     agreesLaneByLane<uint32_t>([](auto a, auto b) { return a * b; }, "mul");
+    agreesLaneByLane<int16_t>([](auto a, auto b) { return mulHiRound(a, b); }, "mulHiRound");  // emulated
 }
 
 TEST(SimdLanes, WidenThenNarrowRestoresOrderAndSaturates) {
@@ -132,6 +134,90 @@ TEST(SimdLanes, DeinterleaveInterleaveAndTransposeKeepLaneOrder) {
         store(even, rows[i]);
         for (int j = 0; j < n; ++j) EXPECT_EQ(even[j], sq[j * n + i]) << i << " " << j;
     }
+}
+
+TEST(SimdLanes, InterleavedThreeChannelsAndPairSums) {
+    uint8_t block[48], back[48];
+    for (int i = 0; i < 48; ++i) block[i] = uint8_t(7 * i + 3);
+    Vec<uint8_t> a, b, c;
+    loadInterleaved3(block, a, b, c);
+    uint8_t planes[3][16];
+    store(planes[0], a), store(planes[1], b), store(planes[2], c);
+    for (int i = 0; i < 48; ++i) ASSERT_EQ(planes[i % 3][i / 3], block[i]) << i;
+    storeInterleaved3(back, a, b, c);
+    EXPECT_EQ(0, std::memcmp(back, block, 48));
+    const int32_t x[4] = {1, -2, 1 << 30, 5}, y[4] = {7, 8, -9, 10};
+    int32_t got[4];
+    store(got, addPairs(load<Vec<int32_t>>(x), load<Vec<int32_t>>(y)));
+    EXPECT_EQ(std::vector<int32_t>(got, got + 4), (std::vector<int32_t>{-1, (1 << 30) + 5, 15, 1}));
+}
+
+// Lane order operations against the lane indices they promise.
+template <class T>
+void reversesLanes() {
+    using V = Vec<T>;
+    T in[V::kLanes], out[V::kLanes];
+    for (int i = 0; i < V::kLanes; ++i) in[i] = T(i + 1);
+    store(out, reverseLanes(load<V>(in)));
+    for (int i = 0; i < V::kLanes; ++i) EXPECT_EQ(out[i], in[V::kLanes - 1 - i]) << sizeof(T) << "-byte lane " << i;
+    if constexpr (sizeof(T) < 8 || std::is_floating_point_v<T>) {
+        EXPECT_EQ(getLane<1>(load<V>(in)), in[1]);
+    }
+}
+
+TEST(SimdLanes, LaneOrderAndAccess) {
+    reversesLanes<uint8_t>();
+    reversesLanes<int16_t>();
+    reversesLanes<uint32_t>();
+    reversesLanes<uint64_t>();
+    reversesLanes<float>();
+    reversesLanes<double>();
+    const int32_t a[4] = {0, 1, 2, 3}, b[4] = {4, 5, 6, 7};
+    using V = Vec<int32_t>;
+    int32_t got[4];
+    store(got, concatEven(load<V>(a), load<V>(b)));
+    EXPECT_EQ(got[0] + 10 * got[1] + 100 * got[2] + 1000 * got[3], 0 + 20 + 400 + 6000);
+    store(got, concatOdd(load<V>(a), load<V>(b)));
+    EXPECT_EQ(got[0] + 10 * got[1] + 100 * got[2] + 1000 * got[3], 1 + 30 + 500 + 7000);
+    V r[4];
+    for (int k = 0; k < 4; ++k) r[k] = set1<V>(k) + load<V>(a) * set1<V>(4);  // r[k][l] = 4 l + k
+    transpose4(r[0], r[1], r[2], r[3]);
+    for (int k = 0; k < 4; ++k) {
+        store(got, r[k]);
+        for (int l = 0; l < 4; ++l) EXPECT_EQ(got[l], 4 * k + l);
+    }
+    const int16_t m[8] = {0, 0, 0, -1, 0, -1, 0, 0};
+    const auto mask = load<Vec<int16_t>>(m);
+    EXPECT_EQ(firstTrue(mask), 3);
+    EXPECT_EQ(firstTrue(zero<Vec<int16_t>>()), 8);
+    EXPECT_TRUE(anyTrue(mask) && !allTrue(mask) && allTrue(eq(mask, mask)));
+    const double p[2] = {1.5, -2.0}, q[2] = {0.25, 8.0};
+    EXPECT_EQ(getLane<1>(addPairs(load<Vec<double>>(p), load<Vec<double>>(q))), 8.25);
+    EXPECT_EQ(getLane<0>(alignBytes<8>(load<Vec<double>>(q), load<Vec<double>>(p))), -2.0);
+    uint8_t bytes[32], shifted[16];
+    for (int i = 0; i < 32; ++i) bytes[i] = uint8_t(i);
+    using B = Vec<uint8_t>;
+    store(shifted, alignBytes<5>(load<B>(bytes + 16), load<B>(bytes)));
+    for (int i = 0; i < 16; ++i) EXPECT_EQ(shifted[i], 5 + i);
+}
+
+TEST(SimdLanes, LoadWidenedExtendsInOrder) {
+    const int8_t s[8] = {-128, -1, 0, 1, 127, -2, 5, -7};
+    int16_t w[8];
+    store(w, loadWidened<Vec<int16_t>>(s));
+    for (int i = 0; i < 8; ++i) EXPECT_EQ(w[i], s[i]);
+    const uint8_t u[8] = {255, 128, 0, 1, 2, 3, 4, 200};
+    store(w, loadWidened<Vec<int16_t>>(u));
+    for (int i = 0; i < 8; ++i) EXPECT_EQ(w[i], u[i]);
+    const float f[2] = {0.1f, -3e38f};
+    double d[2];
+    store(d, loadWidened<Vec<double>>(f));
+    EXPECT_EQ(d[0], double(f[0]));
+    EXPECT_EQ(d[1], double(f[1]));
+    // the scalar twin of abs clears the sign bit like the register form
+    const float negZero = abs(-0.0f);
+    EXPECT_FALSE(std::signbit(negZero));
+    EXPECT_FALSE(std::signbit(abs(-std::numeric_limits<float>::quiet_NaN())));
 }
 
 }  // namespace

@@ -37,16 +37,18 @@ struct ImageBuf {
     int step;  // bytes
 };
 
-// Random lanes: integers over their whole range, floats over [-1000, 1000].
+// Random lanes: floats over [-1000, 1000], anything else (integers,
+// complex integers) random bits.
 template <class T>
 void fillRandom(T* p, size_t n, std::mt19937& rng) {
     if constexpr (std::is_floating_point_v<T>) {
         std::uniform_real_distribution<double> d(-1000.0, 1000.0);
         for (size_t i = 0; i < n; ++i) p[i] = static_cast<T>(d(rng));
     } else {
-        for (size_t i = 0; i < n; ++i) {
-            const uint64_t bits = (uint64_t(rng()) << 32) | rng();
-            std::memcpy(p + i, &bits, sizeof(T));
+        auto* b = reinterpret_cast<uint8_t*>(p);
+        for (size_t i = 0; i < n * sizeof(T); i += 4) {
+            const uint32_t bits = rng();
+            std::memcpy(b + i, &bits, n * sizeof(T) - i < 4 ? n * sizeof(T) - i : 4);
         }
     }
 }
@@ -71,11 +73,7 @@ public:
 
     // count random elements (fillRandom), or uniform over [lo, hi].
     template <class T>
-    T* in(size_t count) {
-        T* p = alloc<T>(count, false);
-        fillRandom(p, count, rng_);
-        return p;
-    }
+    T* in(size_t count) { return randomIn<T>(count, false); }
     template <class T>
     T* in(size_t count, double lo, double hi) {
         T* p = alloc<T>(count, false);
@@ -88,9 +86,23 @@ public:
         }
         return p;
     }
+    // A copy of v (built from rng(), say zt::randomFloats(n, c.rng()())).
+    template <class T>
+    T* in(const std::vector<T>& v) { return copyOf(v, false); }
     // count elements compared after the call (pre-filled with a pattern).
     template <class T>
     T* out(size_t count) { return alloc<T>(count, true); }
+    // Inputs compared after the call too: in-place exports.
+    template <class T>
+    T* inOut(size_t count) { return randomIn<T>(count, true); }
+    template <class T>
+    T* inOut(const std::vector<T>& v) { return copyOf(v, true); }
+    // Floats over [-scale, scale], NaN, infinities, signed zeros and
+    // denormals mixed in (one NaN pattern: which operand's NaN an operation
+    // keeps is the processor's business).
+    std::vector<float> floats(size_t count, float scale = 1000.0f) {
+        return randomFloats(count, rng_(), scale, true);
+    }
 
     // Images of `elems` elements a row (pixels times channels), rows padded
     // to a step that is no multiple of 16 bytes.
@@ -119,6 +131,18 @@ private:
         return static_cast<size_t>(step) * (rows - 1) + rowBytes;
     }
     template <class T>
+    T* randomIn(size_t count, bool output) {
+        T* p = alloc<T>(count, output);
+        fillRandom(p, count, rng_);
+        return p;
+    }
+    template <class T>
+    T* copyOf(const std::vector<T>& v, bool output) {
+        T* p = alloc<T>(v.size(), output);
+        if (!v.empty()) std::memcpy(p, v.data(), v.size() * sizeof(T));
+        return p;
+    }
+    template <class T>
     T* alloc(size_t count, bool output) {
         const size_t bytes = (count + shift_) * sizeof(T);
         buffers_.push_back(std::make_unique<GuardedBuffer>(bytes));
@@ -144,13 +168,14 @@ int caseCount();
 Case makeCase(int index);
 
 // run(const Api&, Case&) -> Status (or any integer) for every case: the
-// variant's outputs and status must equal the generic entries' bit for bit.
+// variant's outputs and status must equal the generic entries' bit for bit
+// (or another reference variant's, where the generic one cannot serve).
 template <class Run>
-void agreesWithGeneric(int variant, Run run) {
-    if (variant == 0) return;
+void agreesWithGeneric(int variant, Run run, int reference = 0) {
+    if (variant == reference) return;
     for (int k = 0; k < caseCount(); ++k) {
         Case g = makeCase(k), v = makeCase(k);
-        const auto sg = run(api(0), g);
+        const auto sg = run(api(reference), g);
         const auto sv = run(api(variant), v);
         const ImageSize r = g.roi();
         const std::string what = "case " + std::to_string(k) + ": len " + std::to_string(g.len()) + ", roi " +

@@ -12,6 +12,11 @@
 //                      zt::bad(StatusBadSize, zt::arg<4>(ImageSize{0, 1})),
 //                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr),   // order: null first
 //                              zt::arg<4>(ImageSize{0, 0})));
+//
+// Vector exports: zt::badLength<I>() stands for the two rows that set the
+// length, argument I, to 0 and to -1 (StatusBadSize); image exports:
+// zt::badRoi<I>() for the rows that set the ImageSize argument I to a width
+// and to a height of 0 (StatusBadSize).
 #pragma once
 
 #include <gtest/gtest.h>
@@ -64,6 +69,18 @@ struct EachNull {
 inline EachNull eachNull(Status expected = StatusNullPointer, std::vector<size_t> allowed = {}) {
     return {expected, std::move(allowed)};
 }
+
+// Rows setting length argument I to 0 and to -1: StatusBadSize.
+template <size_t I>
+struct BadLength {};
+template <size_t I>
+BadLength<I> badLength() { return {}; }
+
+// Rows setting ImageSize argument I to {0, 1} and to {1, 0}: StatusBadSize.
+template <size_t I>
+struct BadRoi {};
+template <size_t I>
+BadRoi<I> badRoi() { return {}; }
 
 template <class T>
 struct Same { using type = T; };
@@ -128,6 +145,26 @@ void nullRows(Fn fn, const Tuple& good, const std::vector<Watch>& outs, const Ea
 template <class Fn, class Tuple>
 void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, const EachNull& e, int index) {
     nullRows(fn, good, outs, e, index, std::make_index_sequence<std::tuple_size_v<Tuple>>{});
+}
+
+template <class Fn, class Tuple, size_t I>
+void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, BadRoi<I>, int index) {
+    for (ImageSize roi : {ImageSize{0, 1}, ImageSize{1, 0}}) {
+        Tuple call = good;
+        std::get<I>(call) = roi;
+        expectRow(fn, outs, StatusBadSize, call,
+                  "row " + std::to_string(index) + " (roi " + std::to_string(roi.width) + "x" +
+                      std::to_string(roi.height) + ")");
+    }
+}
+
+template <class Fn, class Tuple, size_t I>
+void run(Fn fn, const Tuple& good, const std::vector<Watch>& outs, BadLength<I>, int index) {
+    for (int len : {0, -1}) {
+        Tuple call = good;
+        std::get<I>(call) = len;
+        expectRow(fn, outs, StatusBadSize, call, "row " + std::to_string(index) + " (length " + std::to_string(len) + ")");
+    }
 }
 
 }  // namespace detail

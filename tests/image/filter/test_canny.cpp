@@ -7,6 +7,7 @@
 #include <random>
 #include <vector>
 
+#include "tests/support/checks.h"
 #include "tests/support/guarded.h"
 #include "tests/support/variants.h"
 
@@ -146,34 +147,6 @@ TEST_P(Canny, TallPicturesMatchReference) {
     }
 }
 
-// A weak path that winds down and up over many rows, one strong pixel at
-// its far end: the whole path becomes an edge (the growth must climb back
-// into rows settled long before).
-TEST_P(Canny, WindingPathGrowsBackUpwards) {
-    const int w = 24, h = 80;
-    Grad g(w, h);
-    // columns 2, 6, 10, ... go down or up alternately, joined at the ends
-    // (vertical runs of class 1, horizontal joins of class 3: each pixel is
-    // alone along its own gradient, so all are candidates)
-    std::vector<std::pair<int, int>> path;
-    for (int c = 0; c < 5; ++c) {
-        const int x = 2 + 4 * c;
-        for (int i = 1; i < h - 1; ++i) {
-            path.push_back({x, c % 2 ? h - 1 - i : i});
-            g.set(x, path.back().second, 40, 0);
-        }
-        const int yEnd = c % 2 ? 1 : h - 2;
-        for (int dx = 1; dx < 4 && c < 4; ++dx) {
-            path.push_back({x + dx, yEnd});
-            g.set(x + dx, yEnd, 0, -30);  // below the runs: no plateau with them
-        }
-    }
-    g.set(path.back().first, path.back().second, 400, 0);  // the only strong pixel
-    const auto e = run(z(), g, 10, 100);
-    EXPECT_EQ(e, reference(g, 10, 100));
-    for (const auto& p : path) ASSERT_EQ(e[size_t(p.second) * w + p.first], 255) << p.first << "," << p.second;
-}
-
 // Extreme derivatives: magnitudes up to 65536 side by side with 65535, and
 // threshold edge values (low 0, low and high near and above 65535).
 TEST_P(Canny, ExtremeMagnitudesAndThresholds) {
@@ -199,60 +172,6 @@ TEST_P(Canny, ExtremeMagnitudesAndThresholds) {
     g.set(17, 49, -32768, -32768);
     for (const float low : {0.0f, 30.0f})
         ASSERT_EQ(run(z(), g, low, 200), reference(g, low, 200)) << low;
-}
-
-TEST_P(Canny, SinglePixelsAndTies) {
-    const auto& z = this->z();
-    Grad zero(8, 6);
-    for (uint8_t v : run(z, zero, 10, 50)) EXPECT_EQ(v, 0);
-    Grad one(8, 6);
-    one.set(3, 2, 100, 0);
-    auto e = run(z, one, 10, 50);
-    for (int i = 0; i < 48; ++i) EXPECT_EQ(e[size_t(i)], i == 2 * 8 + 3 ? 255 : 0);
-    // horizontal plateau: the left one survives
-    Grad pair(8, 6);
-    pair.set(3, 2, 100, 0);
-    pair.set(4, 2, 100, 0);
-    e = run(z, pair, 10, 50);
-    EXPECT_EQ(e[2 * 8 + 3], 255);
-    EXPECT_EQ(e[2 * 8 + 4], 0);
-    // vertical plateau: the upper one survives
-    Grad vpair(8, 6);
-    vpair.set(3, 2, 0, -100);
-    vpair.set(3, 3, 0, -100);
-    e = run(z, vpair, 10, 50);
-    EXPECT_EQ(e[2 * 8 + 3], 255);
-    EXPECT_EQ(e[3 * 8 + 3], 0);
-    // diagonal (class 4, same signs) neighbours of equal magnitude: both suppressed
-    Grad diag(8, 6);
-    diag.set(3, 2, 50, 50);
-    diag.set(4, 3, 50, 50);
-    e = run(z, diag, 10, 50);
-    EXPECT_EQ(e[2 * 8 + 3], 0);
-    EXPECT_EQ(e[3 * 8 + 4], 0);
-    // class 2 (signs differ) compares upper right and lower left, not upper left
-    Grad d2(8, 6);
-    d2.set(3, 2, 50, -50);
-    d2.set(4, 3, 60, -60);  // lower right: not compared
-    e = run(z, d2, 10, 50);
-    EXPECT_EQ(e[2 * 8 + 3], 255);
-    // the largest magnitude, 65536, from the most negative derivatives
-    Grad big(16, 3);
-    big.set(9, 1, -32768, -32768);
-    e = run(z, big, 65535, 65535.5f);
-    EXPECT_EQ(e[1 * 16 + 9], 255);
-    // high threshold equal to the magnitude is not strong
-    e = run(z, one, 10, 100);
-    EXPECT_EQ(e[2 * 8 + 3], 0);
-    // the low threshold truncates: 10.9 acts as 10
-    Grad ten(8, 6);
-    ten.set(1, 1, 200, 0);
-    ten.set(2, 2, 10, 0);
-    ten.set(0, 2, 11, 0);
-    e = run(z, ten, 10.9f, 50);
-    EXPECT_EQ(e[1 * 8 + 1], 255);
-    EXPECT_EQ(e[2 * 8 + 2], 0);   // 10: cleared
-    EXPECT_EQ(e[2 * 8 + 0], 255); // 11: kept, touches the edge
 }
 
 // Gradients on both sides of the direction class borders, ay < tan 22.5 ax
@@ -283,63 +202,36 @@ TEST_P(Canny, DirectionClassBorders) {
     }
 }
 
-TEST_P(Canny, HysteresisFollowsEightNeighbours) {
-    const auto& z = this->z();
-    // a weak chain touching a strong pixel becomes an edge, in every direction
-    for (int k = 0; k < 8; ++k) {
-        static const int ox[8] = {-1, 0, 1, -1, 1, -1, 0, 1}, oy[8] = {-1, -1, -1, 0, 0, 1, 1, 1};
-        Grad g(9, 9);
-        g.set(4, 4, 0, 0);
-        // isolated pixels of class 1 keep their own magnitude as maxima
-        g.set(4, 4, 300, 0);
-        g.set(4 + 2 * ox[k], 4 + 2 * oy[k], 30, 0);   // weak, touching only another weak one
-        g.set(4 + ox[k], 4 + oy[k], 0, 0);
-        const auto e = run(z, g, 10, 100);
-        EXPECT_EQ(e[4 * 9 + 4], 255);
-        EXPECT_EQ(e[size_t(4 + 2 * oy[k]) * 9 + size_t(4 + 2 * ox[k])], 0) << k;
-        Grad g2(9, 9);
-        g2.set(4, 4, 300, 0);
-        if (ox[k] != 0) g2.set(4 + ox[k], 4 + oy[k], 0, 30);  // class 3 beside a class 1 pixel
-        else g2.set(4 + ox[k], 4 + oy[k], 30, 0);
-        const auto e2 = run(z, g2, 10, 100);
-        EXPECT_EQ(e2[size_t(4 + oy[k]) * 9 + size_t(4 + ox[k])], 255) << k;
-    }
-}
-
+// Pointers, size, steps (the derivatives' at least a row and even), then
+// thresholds (0 <= low <= high, no NaN); on failure nothing is written.
 TEST_P(Canny, ChecksAndSizes) {
     const auto& z = this->z();
+    const struct { ImageSize roi; int size; } sizes[] = {{{3, 2}, 5 * 5 * 4 + 16 * 3 + 160},
+                                                          {{65532, 1}, 5 * 65534 * 3 + 16 * 65532 + 160},
+                                                          {{65533, 1}, 9 * 65535 * 3 + 16 * 65533 + 160},
+                                                          {{1, 65533}, 9 * 65535 * 3 + 16 + 160}};
     int n = 0;
-    EXPECT_EQ(z.zoriCannyGetSize({3, 2}, &n), StatusOk);
-    EXPECT_EQ(n, 5 * 5 * 4 + 16 * 3 + 160);
-    EXPECT_EQ(z.zoriCannyGetSize({65532, 1}, &n), StatusOk);
-    EXPECT_EQ(n, 5 * 65534 * 3 + 16 * 65532 + 160);
-    EXPECT_EQ(z.zoriCannyGetSize({65533, 1}, &n), StatusOk);
-    EXPECT_EQ(n, 9 * 65535 * 3 + 16 * 65533 + 160);
-    EXPECT_EQ(z.zoriCannyGetSize({1, 65533}, &n), StatusOk);
-    EXPECT_EQ(n, 9 * 65535 * 3 + 16 + 160);
-    EXPECT_EQ(z.zoriCannyGetSize({0, 1}, nullptr), StatusNullPointer);
-    EXPECT_EQ(z.zoriCannyGetSize({0, 1}, &n), StatusBadSize);
-
+    for (const auto& c : sizes) {
+        ASSERT_EQ(z.zoriCannyGetSize(c.roi, &n), StatusOk);
+        EXPECT_EQ(n, c.size);
+    }
+    zt::expectChecks(z.zoriCannyGetSize, {ImageSize{3, 2}, &n}, {zt::watch(&n, sizeof n)}, zt::eachNull(), zt::badRoi<0>(),
+                     zt::bad(StatusNullPointer, zt::arg<0>(ImageSize{0, 1}), zt::arg<1>(nullptr)));
     int16_t dx[64] = {}, dy[64] = {};
     uint8_t d[64], buf[2048];
     std::memset(d, 7, sizeof d);
-    const ImageSize roi{4, 2};
-    auto c = z.zoriCanny_16s8u_C1R;
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, {0, 0}, 1, 2, nullptr), StatusNullPointer);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, {0, 2}, -1, 2, buf), StatusBadSize);
-    EXPECT_EQ(c(dx, 7, dy, 0, d, 0, roi, -1, 2, buf), StatusBadStep);
-    EXPECT_EQ(c(dx, 8, dy, 7, d, 4, roi, -1, 2, buf), StatusBadStep);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 3, roi, -1, 2, buf), StatusBadStep);
-    EXPECT_EQ(c(dx, 9, dy, 8, d, 4, roi, -1, 2, buf), StatusNotEvenStep);
-    EXPECT_EQ(c(dx, 8, dy, 11, d, 4, roi, -1, 2, buf), StatusNotEvenStep);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, -1, 2, buf), StatusBadArgument);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, 5, 4, buf), StatusBadArgument);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, std::numeric_limits<float>::quiet_NaN(), 4, buf), StatusBadArgument);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, 1, std::numeric_limits<float>::quiet_NaN(), buf), StatusBadArgument);
-    for (uint8_t v : d) EXPECT_EQ(v, 7);
-    EXPECT_EQ(c(dx, 8, dy, 8, d, 4, roi, 5, 5, buf), StatusOk);
-    for (int i = 0; i < 8; ++i) EXPECT_EQ(d[i], 0);
-    EXPECT_EQ(d[8], 7);
+    const float nan = std::numeric_limits<float>::quiet_NaN();
+    zt::expectChecks(z.zoriCanny_16s8u_C1R, {dx, 8, dy, 8, d, 4, ImageSize{4, 2}, 5.0f, 5.0f, buf}, {zt::watch(d, sizeof d)},
+                     zt::eachNull(), zt::badRoi<6>(), zt::bad(StatusBadStep, zt::arg<1>(7)), zt::bad(StatusBadStep, zt::arg<3>(7)),
+                     zt::bad(StatusBadStep, zt::arg<5>(3)), zt::bad(StatusNotEvenStep, zt::arg<1>(9)),
+                     zt::bad(StatusNotEvenStep, zt::arg<3>(11)), zt::bad(StatusBadArgument, zt::arg<7>(-1.0f)),
+                     zt::bad(StatusBadArgument, zt::arg<7>(6.0f)), zt::bad(StatusBadArgument, zt::arg<7>(nan)),
+                     zt::bad(StatusBadArgument, zt::arg<8>(nan)),
+                     zt::bad(StatusNullPointer, zt::arg<9>(nullptr), zt::arg<6>(ImageSize{0, 0})),
+                     zt::bad(StatusBadSize, zt::arg<6>(ImageSize{0, 2}), zt::arg<7>(-1.0f)),
+                     zt::bad(StatusBadStep, zt::arg<1>(7), zt::arg<3>(0), zt::arg<5>(0), zt::arg<7>(-1.0f)),
+                     zt::bad(StatusNotEvenStep, zt::arg<1>(9), zt::arg<7>(-1.0f)));
+    for (int i = 0; i < 64; ++i) EXPECT_EQ(d[i], i < 8 ? 0 : 7);
 }
 
 TEST_P(Canny, WideCoordinates) {

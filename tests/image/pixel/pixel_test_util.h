@@ -9,6 +9,7 @@
 #include <cstring>
 #include <memory>
 #include <random>
+#include <type_traits>
 #include <vector>
 
 #include "tests/support/guarded.h"
@@ -57,13 +58,37 @@ std::vector<T> contents(const zt::GuardedImage<T>& g) {
     return v;
 }
 
-// Bitwise equality (floats included).
-template <class T>
-::testing::AssertionResult sameBits(const std::vector<T>& a, const std::vector<T>& b) {
-    if (a.size() != b.size()) return ::testing::AssertionFailure() << "sizes differ";
-    for (size_t i = 0; i < a.size(); ++i)
-        if (std::memcmp(&a[i], &b[i], sizeof(T)) != 0)
-            return ::testing::AssertionFailure() << "element " << i << " differs: " << +a[i] << " vs " << +b[i];
+// For every size and pair of layouts (packed or not on either side): a
+// random source of sc-element pixels and a random destination of
+// dc-element ones; run(src, dst, roi) calls the export (it may first put
+// other values into the source) and expect(s, d) turns the source's and
+// the destination's contents into what the destination must hold (given
+// the ROI size too, if it takes a third argument); nothing outside its ROI
+// may change.
+template <class S, class D, class Run, class Expect>
+::testing::AssertionResult movesAsExpected(int sc, int dc, uint32_t seed, Run run, Expect expect,
+                                           const std::vector<ImageSize>& sizes = shapes()) {
+    const Layout pairs[][2] = {{{0, false}, {0, false}}, {{0, false}, {2, true}}, {{3, false}, {0, false}},
+                               {{0, true}, {1, true}},   {{1, true}, {3, false}}};
+    std::mt19937 rng(seed);
+    for (ImageSize roi : sizes)
+        for (const auto& pair : pairs) {
+            const Layout l = pair[0];
+            auto src = image<S>(roi, sc, l, rng);
+            auto dst = image<D>(roi, dc, pair[1], rng);
+            std::vector<D> want = contents(*dst);
+            if (run(*src, *dst, roi) != StatusOk) return ::testing::AssertionFailure() << "status";
+            if constexpr (std::is_invocable_v<Expect, const std::vector<S>&, std::vector<D>&, ImageSize>)
+                expect(contents(*src), want, roi);
+            else
+                expect(contents(*src), want);
+            const std::vector<D> got = contents(*dst);
+            for (size_t i = 0; i < got.size(); ++i)
+                if (std::memcmp(&got[i], &want[i], sizeof(D)) != 0)
+                    return ::testing::AssertionFailure() << roi.width << "x" << roi.height << ", pad " << l.padElems
+                                                         << (l.bordered ? " bordered" : "") << ": element " << i;
+            if (!dst->outsideIntact()) return ::testing::AssertionFailure() << roi.width << ": wrote outside";
+        }
     return ::testing::AssertionSuccess();
 }
 

@@ -1,0 +1,381 @@
+// Row kernels of the pixel movers that keep values (image/pixel/copy.cpp):
+// element by element for every variant, and SIMD blocks beside them (fills
+// from SSE2; layout changes, masked copies and channel orders as byte
+// shuffles from SSSE3).  Each SIMD kernel returns the elements (or bytes)
+// it did; the generic kernel finishes the row.  Included by copy.cpp only,
+// after frame/variant.h.
+#pragma once
+
+#include "frame/simd.h"
+#include "image/pixel/pixel_rows.h"
+#include "image/pixel/shuffle48.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <type_traits>
+
+namespace zor { namespace ZOR_NS {
+namespace {
+
+// ---- generic row kernels ------------------------------------------------------
+
+// Takes N consecutive elements of every source pixel (stride SC) into every
+// destination pixel (stride DC); the destination's other elements stay.
+template <class E, int SC, int DC, int N>
+void pickRow(const E* s, E* d, ptrdiff_t n) {
+    for (ptrdiff_t x = 0; x < n; ++x, s += SC, d += DC)
+        for (int k = 0; k < N; ++k) d[k] = s[k];
+}
+
+template <class E, int C>
+void splitRow(const E* s, E* const* planes, ptrdiff_t n) {
+    for (int k = 0; k < C; ++k) {
+        E* d = planes[k];
+        const E* p = s + k;
+        for (ptrdiff_t x = 0; x < n; ++x, p += C) d[x] = *p;
+    }
+}
+
+template <class E, int C>
+void mergeRow(const E* const* planes, E* d, ptrdiff_t n) {
+    for (int k = 0; k < C; ++k) {
+        const E* s = planes[k];
+        E* p = d + k;
+        for (ptrdiff_t x = 0; x < n; ++x, p += C) *p = s[x];
+    }
+}
+
+template <class E>
+void fillRow(E* d, ptrdiff_t n, E v) {
+    for (ptrdiff_t x = 0; x < n; ++x) d[x] = v;
+}
+
+template <class E>
+void fill3Row(E* d, ptrdiff_t n, const E (&v)[3]) {
+    for (ptrdiff_t x = 0; x < n; ++x, d += 3) {
+        d[0] = v[0];
+        d[1] = v[1];
+        d[2] = v[2];
+    }
+}
+
+// Fills `bytes` bytes of a row with a pattern whose period divides
+// kRepeatBytes: head(d, n) writes the first n bytes, the rest of the row is
+// copies of them.  The copies come from the row's own start, still in the L1
+// cache, and memcpy writes them with the widest stores the processor has,
+// faster than the 16-byte stores of the pattern loops.
+constexpr ptrdiff_t kRepeatBytes = 3072;  // 64 blocks of 48 bytes; a multiple of every pixel size
+template <class Head>
+void repeatFill(uint8_t* d, ptrdiff_t bytes, Head&& head) {
+    const ptrdiff_t first = bytes < kRepeatBytes ? bytes : kRepeatBytes;
+    head(d, first);
+    for (ptrdiff_t i = first; i < bytes; i += first)
+        std::memcpy(d + i, d, static_cast<size_t>(bytes - i < first ? bytes - i : first));
+}
+
+template <class E>
+void swapRow(const E* s, E* d, ptrdiff_t n, int C, const int (&o)[3]) {
+    for (ptrdiff_t x = 0; x < n; ++x, s += C, d += C) {
+        // all three read before any is written: the in-place form relies on it
+        const E a = s[o[0]], b = s[o[1]], c = s[o[2]];
+        d[0] = a;
+        d[1] = b;
+        d[2] = c;
+    }
+}
+
+// ---- SIMD row kernels ---------------------------------------------------------
+
+#if ZOR_SIMD >= 2
+// Repeats the 48-byte pattern p (16 pixels of 8-bit or 8 of 16-bit
+// elements) over the first bytes of d; returns the bytes written (whole blocks).
+inline ptrdiff_t fill48(uint8_t* d, ptrdiff_t bytes, const Bytes16 (&p)[3]) {
+    return eachBlock<48>(bytes, [&](ptrdiff_t i) { simd::storeBlock(d + i, p); });
+}
+
+template <class E>
+ptrdiff_t fillRowSimd(E* d, ptrdiff_t n, E v) {
+    using V = simd::Vec<E>;
+    const V p = simd::set1<V>(v);
+    return eachBlock<V::kLanes>(n, [&](ptrdiff_t x) { simd::store(d + x, p); });
+}
+#endif
+
+#if ZOR_SIMD >= 4
+// Interleaved three channels <-> three planes, 48 bytes at a time.
+template <int E>
+struct SplitMap {  // output register k = plane k
+    static constexpr int src(int j) {
+        const int plane = j / 16, elem = (j % 16) / E, byte = j % E;
+        return (elem * 3 + plane) * E + byte;
+    }
+};
+
+template <class E>
+ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
+    E* p0 = planes[0];
+    E* p1 = planes[1];
+    E* p2 = planes[2];
+    return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) {
+        using namespace simd;
+        Bytes16 in[3], out[3];
+        loadBlock(s + 3 * x, in);
+        Shuffle48<SplitMap<sizeof(E)>>::apply(in, out);
+        storeTo(p0 + x, out[0]);
+        storeTo(p1 + x, out[1]);
+        storeTo(p2 + x, out[2]);
+    });
+}
+
+// Three planes into interleaved pixels: the first two planes are interleaved
+// into pairs by unpacking (lo: the first half of the pixels, hi: the second,
+// mid: the pairs from kMid on), so every output register is one shuffle of a
+// pair register ORed with one shuffle of the third plane: nine shuffle-unit
+// operations as with three shuffles per output, but half the ORs and fewer
+// register copies.
+template <int E>
+struct MergeShuffles {
+    static constexpr int kMid = E == 1 ? 5 : 3;  // first pixel with an element of plane 0 or 1 in output 1
+    static constexpr int kFirst[3] = {0, kMid, 8 / E};  // first pair of lo, mid, hi
+    alignas(16) uint8_t pairs[3][16];
+    alignas(16) uint8_t third[3][16];
+    constexpr MergeShuffles() : pairs{}, third{} {
+        for (int o = 0; o < 3; ++o)
+            for (int l = 0; l < 16; ++l) {
+                const int elem = (o * 16 + l) / E, byte = l % E, pixel = elem / 3, k = elem % 3;
+                pairs[o][l] = k < 2 ? static_cast<uint8_t>(((pixel - kFirst[o]) * 2 + k) * E + byte) : uint8_t(0x80);
+                third[o][l] = k == 2 ? static_cast<uint8_t>(pixel * E + byte) : uint8_t(0x80);
+            }
+    }
+};
+
+template <class E>
+ptrdiff_t merge3Simd(const E* const* planes, E* d, ptrdiff_t n) {
+    using namespace simd;
+    using V = Vec<E, 16>;
+    constexpr int e = sizeof(E);
+    alignas(16) static constexpr MergeShuffles<e> t{};
+    const E* p0 = planes[0];
+    const E* p1 = planes[1];
+    const E* p2 = planes[2];
+    return eachBlock<V::kLanes>(n, [&](ptrdiff_t x) {
+        const V a = load<V>(p0 + x), b = load<V>(p1 + x);
+        const Bytes16 c = loadFrom<Bytes16>(p2 + x);
+        const Bytes16 lo = bitcast<uint8_t>(zipLo(a, b)), hi = bitcast<uint8_t>(zipHi(a, b));
+        const Bytes16 mid = alignBytes<MergeShuffles<e>::kMid * 2 * e>(hi, lo);
+        const Bytes16 pairs[3] = {lo, mid, hi};
+        E* out = d + 3 * x;
+        for (int o = 0; o < 3; ++o)
+            storeTo(out + o * V::kLanes, shuffleBytes(pairs[o], loadAligned<Bytes16>(t.pairs[o])) |
+                                             shuffleBytes(c, loadAligned<Bytes16>(t.third[o])));
+    });
+}
+
+// Four channels <-> four planes, 64 bytes at a time: one shuffle per
+// register groups each channel's elements into one 32-bit lane, then a 4 x 4
+// transpose of those lanes across the registers (its own inverse).
+// Lane k of the result holds channel k of the register's pixels.
+template <int E>
+inline Bytes16 groupChannels() {
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15});
+    else return simd::fromLanes<Bytes16>({0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15});
+}
+template <int E>
+inline Bytes16 spreadChannels() {  // the inverse of groupChannels
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15});
+    else return simd::fromLanes<Bytes16>({0, 1, 4, 5, 8, 9, 12, 13, 2, 3, 6, 7, 10, 11, 14, 15});
+}
+
+using Words4 = simd::Vec<uint32_t, 16>;
+
+template <class E>
+ptrdiff_t split4Simd(const E* s, E* const* planes, ptrdiff_t n) {
+    using namespace simd;
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const Bytes16 g = groupChannels<sizeof(E)>();
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per) {
+        Words4 v[4];
+        for (int k = 0; k < 4; ++k) v[k] = bitcast<uint32_t>(shuffleBytes(loadFrom<Bytes16>(s + 4 * x + k * per), g));
+        transpose4(v[0], v[1], v[2], v[3]);
+        for (int k = 0; k < 4; ++k) storeTo(planes[k] + x, v[k]);
+    }
+    return x;
+}
+
+template <class E>
+ptrdiff_t merge4Simd(const E* const* planes, E* d, ptrdiff_t n) {
+    using namespace simd;
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const Bytes16 sp = spreadChannels<sizeof(E)>();
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per) {
+        Words4 v[4];
+        for (int k = 0; k < 4; ++k) v[k] = loadFrom<Words4>(planes[k] + x);
+        transpose4(v[0], v[1], v[2], v[3]);
+        for (int k = 0; k < 4; ++k) storeTo(d + 4 * x + k * per, shuffleBytes(bitcast<uint8_t>(v[k]), sp));
+    }
+    return x;
+}
+
+// One element of every SC-element pixel (SC = 3 or 4) into a plain row.
+// The loads never reach past the last chosen element: the pointer may
+// address the pixel's last channel, with nothing of the row after it.
+template <class E, int SC>
+struct PickMap {
+    static constexpr int src(int j) { return (j / static_cast<int>(sizeof(E))) * SC * sizeof(E) + j % sizeof(E); }
+};
+template <class E, int SC>
+ptrdiff_t pickOneSimd(const E* s, E* d, ptrdiff_t n) {
+    using namespace simd;
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    // masks for register r of the SC-register block: output lane j takes
+    // byte src(j) - 16 r when it falls into register r
+    alignas(16) static constexpr auto masks = [] {
+        struct { uint8_t m[SC][16]; } t{};
+        for (int r = 0; r < SC; ++r)
+            for (int j = 0; j < 16; ++j) {
+                const int b = PickMap<E, SC>::src(j);
+                t.m[r][j] = b / 16 == r ? static_cast<uint8_t>(b % 16) : uint8_t(0x80);
+            }
+        return t;
+    }();
+    ptrdiff_t x = 0;
+    // last chosen element at (n-1)*SC: the block [x*SC, x*SC + per*SC) must end by it
+    for (; (x + per) * SC <= (n - 1) * SC + 1; x += per) {
+        const uint8_t* b = reinterpret_cast<const uint8_t*>(s + x * SC);
+        Bytes16 acc = shuffleBytes(load<Bytes16>(b), loadAligned<Bytes16>(masks.m[0]));
+        for (int r = 1; r < SC; ++r) acc = acc | shuffleBytes(load<Bytes16>(b + 16 * r), loadAligned<Bytes16>(masks.m[r]));
+        storeTo(d + x, acc);
+    }
+    return x;
+}
+
+// Four-element pixels with alpha <-> three-element pixels, 64 <-> 48 bytes:
+// within a register the colour elements are packed into its first 12 bytes
+// (or spread from them), and byte shifts move the 12-byte groups between
+// registers.  E is the element size; the masks only differ by it.
+template <int E>
+inline Bytes16 packColour() {  // 16 bytes of 4-element pixels -> 12 bytes of colour, 4 zero
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 255, 255, 255, 255});
+    else return simd::fromLanes<Bytes16>({0, 1, 2, 3, 4, 5, 8, 9, 10, 11, 12, 13, 255, 255, 255, 255});
+}
+template <int E>
+inline Bytes16 spreadColour() {  // 12 bytes of colour -> 16 bytes of pixels, alpha zero
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 1, 2, 255, 3, 4, 5, 255, 6, 7, 8, 255, 9, 10, 11, 255});
+    else return simd::fromLanes<Bytes16>({0, 1, 2, 3, 4, 5, 255, 255, 6, 7, 8, 9, 10, 11, 255, 255});
+}
+
+template <class E>
+ptrdiff_t dropAlphaSimd(const E* s, E* d, ptrdiff_t n) {
+    using namespace simd;
+    constexpr ptrdiff_t per = 16 / sizeof(E);  // pixels per 64 source bytes
+    const Bytes16 m = packColour<sizeof(E)>();
+    const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
+    uint8_t* db = reinterpret_cast<uint8_t*>(d);
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per, sb += 64, db += 48) {
+        const auto colour = [&](int k) { return shuffleBytes(load<Bytes16>(sb + 16 * k), m); };
+        const Bytes16 a = colour(0), b = colour(1), c = colour(2), e = colour(3);
+        store(db, a | shiftBytesUp<12>(b));
+        store(db + 16, shiftBytesDown<4>(b) | shiftBytesUp<8>(c));
+        store(db + 32, shiftBytesDown<8>(c) | shiftBytesUp<4>(e));
+    }
+    return x;
+}
+
+template <class E>
+ptrdiff_t keepAlphaSimd(const E* s, E* d, ptrdiff_t n) {
+    using namespace simd;
+    constexpr ptrdiff_t per = 16 / sizeof(E);
+    const Bytes16 m = spreadColour<sizeof(E)>(), alpha = alphaBytes<sizeof(E), 16>();
+    const uint8_t* sb = reinterpret_cast<const uint8_t*>(s);
+    uint8_t* db = reinterpret_cast<uint8_t*>(d);
+    ptrdiff_t x = 0;
+    for (; x + per <= n; x += per, sb += 48, db += 64) {
+        Bytes16 i[3];
+        loadBlock(sb, i);
+        const Bytes16 g[4] = {i[0], alignBytes<12>(i[1], i[0]), alignBytes<8>(i[2], i[1]), shiftBytesDown<4>(i[2])};
+        for (int k = 0; k < 4; ++k)  // the destination's alpha is carried over as it is
+            store(db + 16 * k, select(alpha, load<Bytes16>(db + 16 * k), shuffleBytes(g[k], m)));
+    }
+    return x;
+}
+
+struct DupMap {  // one plane into all three channels
+    static constexpr int src(int j) { return j / 3; }
+};
+
+// Sixteen three-channel 8-bit pixels under a mask: where the mask byte is
+// non-zero the pixel takes `fresh`, elsewhere it keeps what it holds.
+inline void maskedStore48(uint8_t* d, const uint8_t* m, const Bytes16 (&fresh)[3]) {
+    using namespace simd;
+    const Bytes16 stays = eq(load<Bytes16>(m), zero<Bytes16>());
+    const Bytes16 in[3] = {stays, stays, stays};
+    Bytes16 keep[3];
+    Shuffle48<DupMap>::apply(in, keep);
+    for (int k = 0; k < 3; ++k) store(d + 16 * k, select(keep[k], load<Bytes16>(d + 16 * k), fresh[k]));
+}
+
+// Channel order applied to 48-byte blocks of three-element pixels: output
+// register k draws on input registers k-1..k+1 only (a pixel never moves
+// further than its own bytes).
+struct SwapShuffle {
+    Bytes16 m[3][3];
+    SwapShuffle(const int (&o)[3], int elemBytes) {
+        alignas(16) uint8_t t[3][3][16];
+        for (int j = 0; j < 48; ++j) {
+            const int elem = j / elemBytes, byte = j % elemBytes;
+            const int s = ((elem / 3) * 3 + o[elem % 3]) * elemBytes + byte;
+            for (int r = 0; r < 3; ++r)
+                t[j / 16][r][j % 16] = s / 16 == r ? static_cast<uint8_t>(s % 16) : uint8_t(0x80);
+        }
+        for (int a = 0; a < 3; ++a)
+            for (int r = 0; r < 3; ++r) m[a][r] = simd::loadAligned<Bytes16>(t[a][r]);
+    }
+    void apply(const Bytes16 (&in)[3], Bytes16 (&out)[3]) const {
+        using simd::shuffleBytes;
+        out[0] = shuffleBytes(in[0], m[0][0]) | shuffleBytes(in[1], m[0][1]);
+        out[1] = (shuffleBytes(in[0], m[1][0]) | shuffleBytes(in[1], m[1][1])) | shuffleBytes(in[2], m[1][2]);
+        out[2] = shuffleBytes(in[1], m[2][1]) | shuffleBytes(in[2], m[2][2]);
+    }
+};
+
+// Returns the bytes done (whole 48-byte blocks).
+ptrdiff_t swap3Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle& sh) {
+    return eachBlock<48>(bytes, [&](ptrdiff_t i) {
+        Bytes16 in[3], out[3];
+        simd::loadBlock(s + i, in);
+        sh.apply(in, out);
+        simd::storeBlock(d + i, out);
+    });
+}
+
+// Four-element pixels: the order picks colour elements inside 16 bytes; the
+// destination's alpha is carried over unchanged.
+struct SwapShuffle4 {
+    Bytes16 m, alpha;
+    SwapShuffle4(const int (&o)[3], int elemBytes) {
+        alignas(16) uint8_t t[16], a[16];
+        for (int j = 0; j < 16; ++j) {
+            const int elem = j / elemBytes, byte = j % elemBytes, pixel = elem / 4, k = elem % 4;
+            t[j] = k == 3 ? uint8_t(0x80) : static_cast<uint8_t>((pixel * 4 + o[k]) * elemBytes + byte);
+            a[j] = k == 3 ? 0xFF : 0;
+        }
+        m = simd::loadAligned<Bytes16>(t);
+        alpha = simd::loadAligned<Bytes16>(a);
+    }
+};
+
+ptrdiff_t swap4Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle4& sh) {
+    using namespace simd;
+    ptrdiff_t i = 0;
+    for (; i + 16 <= bytes; i += 16)
+        store(d + i, select(sh.alpha, load<Bytes16>(d + i), shuffleBytes(load<Bytes16>(s + i), sh.m)));
+    return i;
+}
+#endif
+
+}  // namespace
+}}  // namespace zor::ZOR_NS
