@@ -239,7 +239,7 @@ Layouts layoutsOf(const std::string& name) {
     std::string seg;
     std::vector<std::string> segs;
     while (std::getline(in, seg, '_')) segs.push_back(seg);
-    static const char* const tokens[] = {"AC4", "C1", "C3", "C4", "P3", "P4"};
+    static const char* const tokens[] = {"AC4", "C1", "C2", "C3", "C4", "P3", "P4"};
     for (size_t k = 1; k < segs.size(); ++k) {
         std::string s = segs[k];
         std::vector<std::string> found;
@@ -619,6 +619,14 @@ size_t integerBytes(Kind k) {
     }
 }
 
+// Entries of a small input array: its element type, and how many of them
+// one row holds (an array of arrays is a record of doubles: the
+// coefficient matrices and quads of the geometry families).
+Kind valueKind(const Type& t) { return t.pointee == Kind::Record ? Kind::F64 : t.pointee; }
+int64_t valuesPerRow(const Type& t) {
+    return t.pointee == Kind::Record && t.pointeeBytes >= 8 ? t.pointeeBytes / 8 : 1;
+}
+
 // ---- contents of buffers --------------------------------------------------------------------------------------
 
 struct Rng {
@@ -763,6 +771,7 @@ public:
     double real(const char*) const override { return 0; }
     ImageSize size(const char*) const override { return {0, 0}; }
     ImagePoint point(const char*) const override { return {0, 0}; }
+    ImageRect rect(const char*) const override { return {0, 0, 0, 0}; }
     int64_t value(const char*, int) const override { return 0; }
     const CallView* object(const char*) const override { return nullptr; }
     const void* objectMemory(const char*) const override { return nullptr; }
@@ -817,6 +826,10 @@ struct CallState final : CallView {
         const int k = at(name);
         return k < 0 ? ImagePoint{0, 0} : args[k].point;
     }
+    ImageRect rect(const char* name) const override {
+        const int k = at(name);
+        return k < 0 ? ImageRect{0, 0, 0, 0} : args[k].rect;
+    }
     int64_t value(const char* name, int index) const override {
         const int k = at(name);
         if (k < 0 || index < 0 || size_t(index) >= args[k].values.size()) return 0;
@@ -864,6 +877,10 @@ int64_t CallState::companion(const char* name) const {
             continue;
         }
         const int mine = findParam(ex, p.name);
+        if (mine < 0 && p.name == "channels" && layoutsOf(ex.name).src >= 1) {
+            put(slots[k], int32_t(layoutsOf(ex.name).src));  // the size for this call's pixels
+            continue;
+        }
         if (mine < 0) return -1;
         const_cast<CallState*>(this)->fillSlot(size_t(mine));  // its value is final: scalars only
         slots[k] = args[mine].slot;
@@ -950,7 +967,8 @@ void CallState::decode(Source& src) {
             break;
         case Role::Values: {
             pointerChoice();
-            const int n = p.extent > 0 ? p.extent : 1;
+            // double coeffs[2][3]: two rows of three doubles
+            const int n = (p.extent > 0 ? p.extent : 1) * int(valuesPerRow(p.type));
             for (int e = 0; e < n; ++e) {
                 const uint8_t s = src.select();
                 a.values.push_back(drawCode(s, src.u32(), hints, p.type.pointee));
@@ -992,6 +1010,16 @@ void CallState::decode(Source& src) {
             if (v > most) v = most - (v - most) % 64;
         };
         fold(args[k].v);
+        if (p.role == Role::Extent) {
+            int64_t w = args[k].size.width, h = args[k].size.height;
+            fold(w), fold(h);
+            args[k].size = {int32_t(w), int32_t(h)};
+        }
+        if (p.role == Role::Rect) {
+            int64_t w = args[k].rect.width, h = args[k].rect.height;
+            fold(w), fold(h);
+            args[k].rect.width = int32_t(w), args[k].rect.height = int32_t(h);
+        }
         if (p.role == Role::Values)
             for (int64_t& v : args[k].values) fold(v);
     }
@@ -1188,13 +1216,23 @@ void CallState::layOut() {
             break;
         case Role::Values: {
             if (a.null) break;
-            const size_t eb = integerBytes(p.type.pointee);
+            const Kind kind = valueKind(p.type);
+            const size_t eb = kind == Kind::F32 ? 4 : kind == Kind::F64 ? 8 : integerBytes(kind);
             bool over = false;
             a.buf = addBuffer(Shape::vector(int64_t(a.values.size()), int64_t(eb)), false, 5, p.type.pointee, true,
                               p.name, over);
             for (size_t e = 0; e < a.values.size(); ++e) {
                 const int64_t v = a.values[e];
-                std::memcpy(bufs[a.buf].ptr + e * eb, &v, eb);  // little-endian: the low bytes
+                uint8_t* at = bufs[a.buf].ptr + e * eb;
+                if (kind == Kind::F32) {
+                    const float f = float(v);
+                    std::memcpy(at, &f, 4);
+                } else if (kind == Kind::F64) {
+                    const double d = double(v);
+                    std::memcpy(at, &d, 8);
+                } else {
+                    std::memcpy(at, &v, eb);  // little-endian: the low bytes
+                }
             }
             break;
         }

@@ -29,6 +29,7 @@ public:
     virtual double real(const char* name) const = 0;
     virtual ImageSize size(const char* name) const = 0;
     virtual ImagePoint point(const char* name) const = 0;
+    virtual ImageRect rect(const char* name) const = 0;
     virtual int64_t value(const char* name, int index) const = 0;  // entry of a small input array
     // The call that made the object passed as `name`, when it is of the kind
     // the export expects (null for a null, foreign or wrong-kind object).
@@ -88,7 +89,8 @@ struct FamilyRule {
     std::vector<Status> statuses;       // besides the common ones
     std::vector<Status> partialWrites;  // errors after which outputs may have changed
     // When an allocation fails, the family may fall back to another path
-    // whose results differ in rounding (the same status, other bits).
+    // and succeed (its results may differ in rounding: the same status,
+    // other bits).
     bool fallbackDiffers = false;
     const char* resultFreer = nullptr;  // frees the pointers that these exports return:
     const char* freedResults = nullptr;
