@@ -999,8 +999,8 @@ void CallState::decode(Source& src) {
         case Role::Unknown: break;
         }
     }
-    resolveSteps();
-    // values outside the contract's range are folded back into it
+    // values outside the contract's range are folded back into it (before
+    // the steps, which follow the image sizes)
     for (size_t k = 0; k < ex.params.size(); ++k) {
         const Param& p = ex.params[k];
         if (p.rule < 0) continue;
@@ -1023,6 +1023,7 @@ void CallState::decode(Source& src) {
         if (p.role == Role::Values)
             for (int64_t& v : args[k].values) fold(v);
     }
+    resolveSteps();
 }
 
 void CallState::decodeObject(Source& src, size_t k) {
