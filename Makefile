@@ -1,12 +1,13 @@
-# Entry points: `make demo`, `make test`, `make bench`.
-# Three build trees: build/ (native), build-asan/ (native under the
+# Entry points: `make demo`, `make test`, `make bench`, `make fuzz`.
+# Build trees: build/ (native), build-asan/ (native under the
 # AddressSanitizer and UndefinedBehaviorSanitizer), build-win/ (32-bit
-# Windows, run under wine).
+# Windows, run under wine), build-tsan/ (the thread test under the
+# ThreadSanitizer), build-fuzz/ (clang: the libFuzzer target).
 
 JOBS ?= $(shell nproc 2>/dev/null || echo 2)
 CMAKE ?= cmake
 
-.PHONY: all setup native asan win demo test test-native test-asan test-win bench bench-win dist clean
+.PHONY: all setup native asan win demo test test-native test-asan test-win test-tsan bench bench-win dist fuzz fuzz-seeds clean
 
 all: native
 
@@ -17,6 +18,11 @@ build/CMakeCache.txt:
 	$(CMAKE) -S . -B build -DCMAKE_BUILD_TYPE=Release
 build-asan/CMakeCache.txt:
 	$(CMAKE) -S . -B build-asan -DCMAKE_BUILD_TYPE=RelWithDebInfo -DZOR_SANITIZE=ON
+build-tsan/CMakeCache.txt:
+	$(CMAKE) -S . -B build-tsan -DCMAKE_BUILD_TYPE=RelWithDebInfo -DZOR_SANITIZE_THREAD=ON
+build-fuzz/CMakeCache.txt:
+	CC=clang CXX=clang++ $(CMAKE) -S . -B build-fuzz -DCMAKE_BUILD_TYPE=RelWithDebInfo \
+	    -DZOR_SANITIZE=ON -DZOR_FUZZ=ON
 build-win/CMakeCache.txt:
 	$(CMAKE) -S . -B build-win -DCMAKE_BUILD_TYPE=Release \
 	    -DCMAKE_TOOLCHAIN_FILE=cmake/toolchain-mingw32.cmake
@@ -43,8 +49,13 @@ test-asan: asan
 test-win: win
 	cd build-win && ctest --output-on-failure
 
-test: test-native test-asan test-win
-	@echo "all suites passed: native, sanitizers, wine"
+# Only the thread test runs under the ThreadSanitizer.
+test-tsan: setup build-tsan/CMakeCache.txt
+	$(CMAKE) --build build-tsan -j $(JOBS) --target zor_threads
+	cd build-tsan && TSAN_OPTIONS=halt_on_error=1 ctest --output-on-failure -R '^threads$$'
+
+test: test-native test-asan test-win test-tsan
+	@echo "all suites passed: native, sanitizers, wine, threads"
 
 # Three repetitions of each workload, zor and peer in alternation: the table
 # pairs their medians, which shared machines need.  BENCH_ARGS adds to these
@@ -66,5 +77,19 @@ bench-win: setup build/CMakeCache.txt build-win/CMakeCache.txt
 	$(CMAKE) --build build-win -j $(JOBS) --target zor_variant_bench
 	bash scripts/bench-win.sh
 
+# The libFuzzer target for FUZZ_SECONDS, growing build-fuzz/corpus from the
+# seeds (`make fuzz-seeds`: the argument sets of the unit tests).  Calls made
+# and anything found are printed at the end; a finding leaves crash-* files.
+FUZZ_SECONDS ?= 300
+fuzz: setup build-fuzz/CMakeCache.txt
+	$(CMAKE) --build build-fuzz -j $(JOBS) --target zor_fuzz
+	mkdir -p build-fuzz/corpus build-fuzz/seeds
+	cd build-fuzz && ZOR_FUZZ_QUIET=1 ./tests/fuzz/zor_fuzz -max_total_time=$(FUZZ_SECONDS) \
+	    -rss_limit_mb=4096 -timeout=30 -print_final_stats=1 $(FUZZ_ARGS) corpus seeds
+fuzz-seeds: native build-fuzz/CMakeCache.txt
+	ZT_RECORD_CALLS=$(CURDIR)/build/recorded-calls.txt ./build/tests/zor_unit --gtest_brief=1 >/dev/null
+	mkdir -p build-fuzz/seeds
+	./build/tests/fuzz/zor_calls --encode build/recorded-calls.txt build-fuzz/seeds
+
 clean:
-	rm -rf build build-asan build-win dist
+	rm -rf build build-asan build-win build-tsan build-fuzz dist

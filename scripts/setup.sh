@@ -7,7 +7,8 @@ set -euo pipefail
 # valgrind: the conversions run under it.  chromium renders the demo
 # gallery in one test, which is skipped where chromium cannot be installed.
 native_pkgs=(cmake make g++ ccache libgtest-dev googletest libbenchmark-dev
-             libopencv-dev libfftw3-dev valgrind libpng-dev pkgconf)
+             libopencv-dev libfftw3-dev valgrind libpng-dev pkgconf
+             clang libclang-rt-dev)  # libFuzzer (make fuzz)
 optional_pkgs=(chromium)
 cross_pkgs=(g++-mingw-w64-i686)
 wine_pkgs=(wine wine32:i386)

@@ -1,7 +1,10 @@
 #include "tests/support/variants.h"
 
+#include <cstdlib>
+
 #include "frame/cpu.h"
 #include "frame/dispatch.h"
+#include "tests/support/record.h"
 
 #include <cstdio>
 
@@ -19,9 +22,13 @@ Api buildApi(int k) {
 }
 }  // namespace
 
+// With ZT_RECORD_CALLS=<file> the generic variant's calls are recorded
+// there (every test body runs on it): the fuzzer's seeds.
 const Api& api(int variant) {
-    static const Api apis[7] = {buildApi(0), buildApi(1), buildApi(2), buildApi(3), buildApi(4),
-                                buildApi(kColumns > 5 ? 5 : 4), buildApi(kColumns > 6 ? 6 : 4)};
+    static const Api apis[7] = {
+        std::getenv("ZT_RECORD_CALLS") ? recordingApi(buildApi(0), std::getenv("ZT_RECORD_CALLS")) : buildApi(0),
+        buildApi(1), buildApi(2), buildApi(3), buildApi(4),
+        buildApi(kColumns > 5 ? 5 : 4), buildApi(kColumns > 6 ? 6 : 4)};
     return apis[variant];
 }
 
