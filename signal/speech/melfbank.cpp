@@ -7,6 +7,7 @@
 #include "signal/transform/fft_internal.h"
 
 #include <cmath>
+#include <cstdint>
 #include <cstring>
 
 // The vector conversions and magnitudes have no SSE-only entry: that
@@ -113,6 +114,12 @@ Status build(FBank* b, float sampFreq, float lowFreq, float highFreq) {
         b->highStart[k - 1] = static_cast<int32_t>(highTotal);
         lowTotal += bins[k] - bins[k - 1] + 1;
         highTotal += bins[k + 1] - bins[k];
+    }
+    // Weight tables past 2 GiB (windows near 2^30 samples) could never be
+    // held by a 32-bit process; refuse them at once rather than fill them.
+    if ((lowTotal + highTotal) * int64_t(sizeof(float)) > INT32_MAX) {
+        mem::alignedFree(centre);
+        return StatusNoMemory;
     }
     b->lowWeights = allocArray<float>(lowTotal);
     b->highWeights = allocArray<float>(highTotal > 0 ? highTotal : 1);
