@@ -172,31 +172,31 @@ template <Dir D, class Out>
         else return bitcast<int16_t>(widenLo(v));
     };
     const int w = roi.width;
-    // Rows above and below as offsets from the middle row: one pointer
-    // serves all three (registers are scarce in the 32-bit build).
-    const ptrdiff_t up = -ptrdiff_t(srcStep), down = srcStep;
     for (int y = 0; y < roi.height; ++y) {
-        const uint8_t* p1 = rowAt(src, srcStep, y);
+        // Three row pointers indexed by the one column counter: the loads
+        // address base + index + displacement, which leaves the 32-bit build
+        // enough general registers to keep the loop out of its stack.
+        const uint8_t* top = rowAt(src, srcStep, y - 1);
+        const uint8_t* mid = rowAt(src, srcStep, y);
+        const uint8_t* bot = rowAt(src, srcStep, y + 1);
         Out* d = rowAt(dst, dstStep, y);
         // One half of the 16 results at column x.
         const auto sobel = [&](int x, auto half) -> V {
-            const uint8_t* c = p1 + x;
             if constexpr (D == Dir::Vert) {
                 // smooth down the columns x - 1 and x + 1, then left minus right
-                const auto smooth = [&](int off) {
-                    const V b = widened(c + off, half);
-                    return (widened(c + up + off, half) + widened(c + down + off, half)) + (b + b);
+                const auto smooth = [&](int c) {
+                    const V b = widened(mid + c, half);
+                    return (widened(top + c, half) + widened(bot + c, half)) + (b + b);
                 };
-                return smooth(-1) - smooth(1);
+                return smooth(x - 1) - smooth(x + 1);
             } else {
                 // bottom minus top in columns x - 1, x, x + 1, then smoothed along the row
-                const auto dv = [&](int off) { return widened(c + down + off, half) - widened(c + up + off, half); };
-                const V mid = dv(0);
-                return (dv(-1) + dv(1)) + (mid + mid);
+                const auto dv = [&](int c) { return widened(bot + c, half) - widened(top + c, half); };
+                const V centre = dv(x);
+                return (dv(x - 1) + dv(x + 1)) + (centre + centre);
             }
         };
-        for (int x0 = 0; x0 < w; x0 += 16) {
-            const int x = x0 + 16 <= w ? x0 : w - 16;  // the last block overlaps
+        const auto block = [&](int x) {
             if constexpr (sizeof(Out) == 1) {
                 const V lo = sobel(x, Lo{});
                 store(d + x, narrowSat<uint8_t>(lo, sobel(x, Hi{})));
@@ -204,7 +204,10 @@ template <Dir D, class Out>
                 store(d + x, sobel(x, Lo{}));
                 store(d + x + 8, sobel(x, Hi{}));
             }
-        }
+        };
+        int x = 0;
+        for (; x + 16 <= w; x += 16) block(x);
+        if (x < w) block(w - 16);  // the last block overlaps the one before
     }
 }
 #endif
