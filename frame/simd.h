@@ -331,6 +331,12 @@ struct Isa<16> {
         else return _mm_load_si128(reinterpret_cast<const __m128i*>(p));
 #  endif
     }
+    template <class T>
+    static R<T> loadBlocks(const T* p, ptrdiff_t) { return load<T>(p); }
+    template <class T>
+    static void storeBlocks(T* p, ptrdiff_t, R<T> v) { store<T>(p, v); }
+    template <class T, class F>
+    static void eachBlock(R<T> v, int first, F&& f) { f(first, v); }
     // The lower half of a register from memory, the upper half zero.
     template <class T>
     static R<T> loadHalf(const T* p) {
@@ -1153,6 +1159,21 @@ struct Halves {
     template <class T>
     static R<T> loadHalf(const T* p) { return join<T>(H::template load<T>(p), H::template zero<T>()); }
     template <class T>
+    static R<T> loadBlocks(const T* p, ptrdiff_t blockStride) {
+        return join<T>(H::template loadBlocks<T>(p, blockStride),
+                       H::template loadBlocks<T>(p + blockStride * (kHalf / 16), blockStride));
+    }
+    template <class T>
+    static void storeBlocks(T* p, ptrdiff_t blockStride, R<T> v) {
+        H::template storeBlocks<T>(p, blockStride, lo<T>(v));
+        H::template storeBlocks<T>(p + blockStride * (kHalf / 16), blockStride, hi<T>(v));
+    }
+    template <class T, class F>
+    static void eachBlock(R<T> v, int first, F&& f) {
+        H::template eachBlock<T>(lo<T>(v), first, f);
+        H::template eachBlock<T>(hi<T>(v), first + kHalf / 16, f);
+    }
+    template <class T>
     static void store(T* p, R<T> v) {
         H::template store<T>(p, lo<T>(v));
         H::template store<T>(p + kHalfLanes<T>, hi<T>(v));
@@ -1381,6 +1402,23 @@ struct Isa<32> : Halves<32> {
     template <class T>
     static constexpr bool isD = std::is_same_v<T, double>;
 
+    // Per 16-byte block, as the instructions work: one instruction per step.
+    template <class T>
+    static void transpose4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        static_assert(sizeof(T) == 4, "transpose4 of 32-bit lanes");
+        if constexpr (isF<T>) {
+            const __m256 t0 = _mm256_unpacklo_ps(a, b), t1 = _mm256_unpackhi_ps(a, b);
+            const __m256 t2 = _mm256_unpacklo_ps(c, d), t3 = _mm256_unpackhi_ps(c, d);
+            a = _mm256_shuffle_ps(t0, t2, 0x44), b = _mm256_shuffle_ps(t0, t2, 0xEE);
+            c = _mm256_shuffle_ps(t1, t3, 0x44), d = _mm256_shuffle_ps(t1, t3, 0xEE);
+        } else {
+            const __m256i t0 = _mm256_unpacklo_epi32(a, b), t1 = _mm256_unpackhi_epi32(a, b);
+            const __m256i t2 = _mm256_unpacklo_epi32(c, d), t3 = _mm256_unpackhi_epi32(c, d);
+            a = _mm256_unpacklo_epi64(t0, t2), b = _mm256_unpackhi_epi64(t0, t2);
+            c = _mm256_unpacklo_epi64(t1, t3), d = _mm256_unpackhi_epi64(t1, t3);
+        }
+    }
+
     template <class T>
     static R<T> zero() {
         if constexpr (isF<T>) return _mm256_setzero_ps();
@@ -1567,6 +1605,23 @@ struct Isa<64> : Halves<64> {
     template <class T>
     static constexpr bool isD = std::is_same_v<T, double>;
 
+    // Per 16-byte block, as the instructions work: one instruction per step.
+    template <class T>
+    static void transpose4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        static_assert(sizeof(T) == 4, "transpose4 of 32-bit lanes");
+        if constexpr (isF<T>) {
+            const __m512 t0 = _mm512_unpacklo_ps(a, b), t1 = _mm512_unpackhi_ps(a, b);
+            const __m512 t2 = _mm512_unpacklo_ps(c, d), t3 = _mm512_unpackhi_ps(c, d);
+            a = _mm512_shuffle_ps(t0, t2, 0x44), b = _mm512_shuffle_ps(t0, t2, 0xEE);
+            c = _mm512_shuffle_ps(t1, t3, 0x44), d = _mm512_shuffle_ps(t1, t3, 0xEE);
+        } else {
+            const __m512i t0 = _mm512_unpacklo_epi32(a, b), t1 = _mm512_unpackhi_epi32(a, b);
+            const __m512i t2 = _mm512_unpacklo_epi32(c, d), t3 = _mm512_unpackhi_epi32(c, d);
+            a = _mm512_unpacklo_epi64(t0, t2), b = _mm512_unpackhi_epi64(t0, t2);
+            c = _mm512_unpacklo_epi64(t1, t3), d = _mm512_unpackhi_epi64(t1, t3);
+        }
+    }
+
     template <class T>
     static R<T> zero() {
         if constexpr (isF<T>) return _mm512_setzero_ps();
@@ -1735,6 +1790,22 @@ inline V loadAligned(const typename V::Lane* p) {
 template <class V>
 inline V loadHalf(const typename V::Lane* p) {
     return {Isa<V::kBytes>::template loadHalf<typename V::Lane>(p)};
+}
+// Lane block b (16 bytes) from p + b * blockStride lanes: tables laid out
+// 16 bytes at a time, read at any width.  At 16 bytes this is load().
+template <class V>
+inline V loadBlocks(const typename V::Lane* p, ptrdiff_t blockStride) {
+    return {Isa<V::kBytes>::template loadBlocks<typename V::Lane>(p, blockStride)};
+}
+// Lane block b to p + b * blockStride lanes.
+template <class T, int B>
+inline void storeBlocks(T* p, ptrdiff_t blockStride, Vec<T, B> v) {
+    Isa<B>::template storeBlocks<T>(p, blockStride, v.raw);
+}
+// f(b, block b as a Vec<T, 16>) for every 16-byte block b, in order.
+template <class T, int B, class F>
+inline void eachBlock(Vec<T, B> v, F&& f) {
+    Isa<B>::template eachBlock<T>(v.raw, 0, [&](int b, typename RawOf<T, 16>::type r) { f(b, Vec<T, 16>{r}); });
 }
 template <class T, int B>
 inline void store(T* p, Vec<T, B> v) { Isa<B>::template store<T>(p, v.raw); }

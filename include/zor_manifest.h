@@ -370,13 +370,13 @@ ZOR_FN(ZOR_ALL, Status, zorsFFTInitAlloc_C_32f, (void** ppSpec, int order, int f
 ZOR_FN(ZOR_ALL, Status, zorsFFTInitAlloc_R_32f, (void** ppSpec, int order, int flag, int hint))
 ZOR_FN(ZOR_ALL, Status, zorsFFTFree_C_32f, (void* pSpec))
 ZOR_FN(ZOR_ALL, Status, zorsFFTFree_R_32f, (void* pSpec))
-ZOR_FN(ZOR_ALL, Status, zorsFFTFwd_CToC_32f,
+ZOR_FN(ZOR_WIDE, Status, zorsFFTFwd_CToC_32f,
        (const float* pSrcRe, const float* pSrcIm, float* pDstRe, float* pDstIm,
         const void* pSpec, uint8_t* pBuffer))
-ZOR_FN(ZOR_ALL, Status, zorsFFTInv_CToC_32f,
+ZOR_FN(ZOR_WIDE, Status, zorsFFTInv_CToC_32f,
        (const float* pSrcRe, const float* pSrcIm, float* pDstRe, float* pDstIm,
         const void* pSpec, uint8_t* pBuffer))
-ZOR_FN(ZOR_ALL, Status, zorsFFTFwd_RToCCS_32f,
+ZOR_FN(ZOR_WIDE, Status, zorsFFTFwd_RToCCS_32f,
        (const float* pSrc, float* pDst, const void* pSpec, uint8_t* pBuffer))
 
 /* ---- signal/transform/iir ---- */

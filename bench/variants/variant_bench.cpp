@@ -4,6 +4,7 @@
 // the two builds of the library can be compared workload by workload.
 //
 //   zor_variant_bench [--variants 4,1,0] [--reps 5] [--filter text]
+//       (on x86-64 columns 5 and 6 are the AVX2 and AVX-512 ones)
 //       prints one line per measurement: "workload<TAB>variant<TAB>ns".
 //   zor_variant_bench --table <x86-64 lines> <32-bit lines>
 //       pairs the medians of two such outputs into a table with the ratio
@@ -317,10 +318,11 @@ int runTimings(const std::vector<int>& variants, int reps, const std::string& fi
         long batch = 1;
     };
     std::vector<Case> cases;
+    Api apis[zor::dispatch::kColumns];
+    for (int k = 0; k < zor::dispatch::kColumns; ++k) apis[k] = variantApi(k);
     for (const Workload& w : workloads()) {
         if (!filter.empty() && std::string(w.name).find(filter) == std::string::npos) continue;
         for (int k : variants) {
-            static Api apis[5] = {variantApi(0), variantApi(1), variantApi(2), variantApi(3), variantApi(4)};
             if (!w.available(apis[k])) continue;
             cases.push_back({w.name, k, w.prepare(apis[k])});
         }
@@ -397,7 +399,8 @@ int main(int argc, char** argv) {
             std::stringstream s(argv[++i]);
             std::string item;
             while (std::getline(s, item, ','))
-                if (!item.empty() && item[0] >= '0' && item[0] <= '4') variants.push_back(item[0] - '0');
+                if (!item.empty() && item[0] >= '0' && item[0] < '0' + zor::dispatch::kColumns)
+                    variants.push_back(item[0] - '0');
         } else {
             std::fprintf(stderr, "usage: %s [--variants 4,1,0] [--reps n] [--filter text] | --table a b\n", argv[0]);
             return 2;

@@ -21,6 +21,7 @@
 
 #include <cmath>
 #include <cstring>
+#include <type_traits>
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -124,8 +125,15 @@ void unitRoot(int64_t num, int64_t den, float& c, float& s) {
 #if ZOR_SIMD >= 1
 using namespace simd;
 using V = Vec<float, 16>;
+// The radix-4 passes over long enough sub-transforms also run on the
+// column's widest registers (wider in the x86-64 wide columns): the same
+// operations lane for lane, so the same bits.
+using WideV = Vec<float>;
 #else
-struct V { float v[4]; };
+struct V {
+    static constexpr int kLanes = 4;
+    float v[4];
+};
 template <class>
 inline V load(const float* p) { return {{p[0], p[1], p[2], p[3]}}; }
 inline void store(float* p, V a) { for (int i = 0; i < 4; ++i) p[i] = a.v[i]; }
@@ -151,58 +159,80 @@ inline V zipHi(V a, V b) { return {{a.v[2], b.v[2], a.v[3], b.v[3]}}; }
 #endif
 
 // (ar + i ai)(wr + i wi)
-inline void cmul(V ar, V ai, V wr, V wi, V& rr, V& ri) {
+template <class U>
+inline void cmul(U ar, U ai, U wr, U wi, U& rr, U& ri) {
     rr = ar * wr - ai * wi;
     ri = ar * wi + ai * wr;
 }
 
 // ---- passes -----------------------------------------------------------------
 
-// Input quad c .. c+3 of four streams q apart: lane l is element c + l of
-// the subsequences x[b], x[b + q], x[b + 2q], x[b + 3q].
+// Input lanes c, c+1, ... of four streams q apart: lane l is element c + l
+// of the subsequences x[b], x[b + q], x[b + 2q], x[b + 3q].
 struct SplitInput {
     const float* r;
     const float* m;
-    V re(int i) const { return load<V>(r + i); }
-    V im(int i) const { return load<V>(m + i); }
+    template <class U = V>
+    U re(int i) const { return load<U>(r + i); }
+    template <class U = V>
+    U im(int i) const { return load<U>(m + i); }
 };
-// Complex values packed as re, im pairs (the real transform's input).
+// Complex values packed as re, im pairs (the real transform's input): four
+// lanes at a time.
 struct PairInput {
     const float* p;
-    V re(int i) const { return concatEven(load<V>(p + 2 * i), load<V>(p + 2 * i + 4)); }
-    V im(int i) const { return concatOdd(load<V>(p + 2 * i), load<V>(p + 2 * i + 4)); }
+    template <class U = V>
+    U re(int i) const { return concatEven(load<V>(p + 2 * i), load<V>(p + 2 * i + 4)); }
+    template <class U = V>
+    U im(int i) const { return concatOdd(load<V>(p + 2 * i), load<V>(p + 2 * i + 4)); }
 };
 
+// Block b (four lanes) of the transposed y holds the 4-point transform of
+// subsequence b4 + 4b: it goes to 4 * rev[b4 + 4b].
+template <class U>
+inline void storeTransforms(float* w, const int32_t* rev, int b4, U y) {
+#if ZOR_SIMD >= 1
+    if constexpr (U::kLanes > 4) {
+        eachBlock(y, [&](int b, V quad) { store(w + 4 * rev[b4 + 4 * b], quad); });
+        return;
+    }
+#endif
+    store(w + 4 * rev[b4], y);
+}
+
 // Bit-reversed gather fused with the 4-point transforms: the transform of
-// subsequence b lands at 4 * rev[b] of the work arrays.  The real parts are
-// done first, then the imaginary ones: each half needs only one difference
-// from the other, which keeps the working set within eight registers (the
-// 32-bit build has no more).
-template <class In>
+// subsequence b lands at 4 * rev[b] of the work arrays, U::kLanes
+// subsequences at a time.  The real parts are done first, then the
+// imaginary ones: each half needs only one difference from the other, which
+// keeps the working set within eight registers (the 32-bit build has no
+// more).
+template <class U, class In>
 void firstPass(const In& in, float* wr, float* wi, int n, const int32_t* rev) {
     const int q = n >> 2;
-    for (int c = 0; c < q; c += 4) {
+    for (int c = 0; c < q; c += U::kLanes) {
         {
-            const V d13i = in.im(c + q) - in.im(c + 3 * q);
-            const V g0 = in.re(c), g1 = in.re(c + q), g2 = in.re(c + 2 * q), g3 = in.re(c + 3 * q);
-            const V s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
-            V y0 = s02 + s13, y1 = d02 + d13i, y2 = s02 - s13, y3 = d02 - d13i;  // y1 = d02 - i d13
+            const U d13i = in.template im<U>(c + q) - in.template im<U>(c + 3 * q);
+            const U g0 = in.template re<U>(c), g1 = in.template re<U>(c + q);
+            const U g2 = in.template re<U>(c + 2 * q), g3 = in.template re<U>(c + 3 * q);
+            const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
+            U y0 = s02 + s13, y1 = d02 + d13i, y2 = s02 - s13, y3 = d02 - d13i;  // y1 = d02 - i d13
             transpose4(y0, y1, y2, y3);
-            store(wr + 4 * rev[c], y0);
-            store(wr + 4 * rev[c + 1], y1);
-            store(wr + 4 * rev[c + 2], y2);
-            store(wr + 4 * rev[c + 3], y3);
+            storeTransforms(wr, rev, c, y0);
+            storeTransforms(wr, rev, c + 1, y1);
+            storeTransforms(wr, rev, c + 2, y2);
+            storeTransforms(wr, rev, c + 3, y3);
         }
         {
-            const V d13r = in.re(c + q) - in.re(c + 3 * q);
-            const V g0 = in.im(c), g1 = in.im(c + q), g2 = in.im(c + 2 * q), g3 = in.im(c + 3 * q);
-            const V s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
-            V y0 = s02 + s13, y1 = d02 - d13r, y2 = s02 - s13, y3 = d02 + d13r;
+            const U d13r = in.template re<U>(c + q) - in.template re<U>(c + 3 * q);
+            const U g0 = in.template im<U>(c), g1 = in.template im<U>(c + q);
+            const U g2 = in.template im<U>(c + 2 * q), g3 = in.template im<U>(c + 3 * q);
+            const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
+            U y0 = s02 + s13, y1 = d02 - d13r, y2 = s02 - s13, y3 = d02 + d13r;
             transpose4(y0, y1, y2, y3);
-            store(wi + 4 * rev[c], y0);
-            store(wi + 4 * rev[c + 1], y1);
-            store(wi + 4 * rev[c + 2], y2);
-            store(wi + 4 * rev[c + 3], y3);
+            storeTransforms(wi, rev, c, y0);
+            storeTransforms(wi, rev, c + 1, y1);
+            storeTransforms(wi, rev, c + 2, y2);
+            storeTransforms(wi, rev, c + 3, y3);
         }
     }
 }
@@ -219,42 +249,100 @@ void radix2Pass(const float* ir, const float* ii, float* orr, float* oi, int n, 
     }
 }
 
-// One radix-4 butterfly on lanes p0 .. p0+3 of the four quarters L apart.
-// In bit-reversed order the sub-transform of the odd quarter (residue 1)
-// sits at offset 2L and that of residue 2 at offset L.  The order of the
-// steps keeps at most eight vectors live: t1 and t3 are combined at once,
-// then the real outputs leave before the imaginary inputs come in.
+// Memory lanes of a register: p on (Stride 4), or blocks of four lanes
+// Stride apart.
+template <class U, int Stride>
+struct LanesAt {
+    static U get(const float* p) {
+#if ZOR_SIMD >= 1
+        if constexpr (Stride != 4) return loadBlocks<U>(p, Stride);
+#endif
+        return load<U>(p);
+    }
+    static void put(float* p, U v) {
+#if ZOR_SIMD >= 1
+        if constexpr (Stride != 4) return storeBlocks(p, Stride, v);
+#endif
+        store(p, v);
+    }
+};
+
+// One radix-4 butterfly on the lanes of U from p0 on, of the four quarters
+// L apart.  In bit-reversed order the sub-transform of the odd quarter
+// (residue 1) sits at offset 2L and that of residue 2 at offset L.  The
+// order of the steps keeps at most eight vectors live: t1 and t3 are
+// combined at once, then the real outputs leave before the imaginary inputs
+// come in.
+template <class U, int Stride = 4>
 inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, int p0, int L,
-                       V w1r, V w1i, V w2r, V w2i, V w3r, V w3i) {
+                       U w1r, U w1i, U w2r, U w2i, U w3r, U w3i) {
+    using M = LanesAt<U, Stride>;
     const int p1 = p0 + L, p2 = p1 + L, p3 = p2 + L;
-    V t1r, t1i, t3r, t3i, t2r, t2i;
-    cmul(load<V>(ir + p2), load<V>(ii + p2), w1r, w1i, t1r, t1i);
-    cmul(load<V>(ir + p3), load<V>(ii + p3), w3r, w3i, t3r, t3i);
-    const V s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
-    cmul(load<V>(ir + p1), load<V>(ii + p1), w2r, w2i, t2r, t2i);
-    const V a0r = load<V>(ir + p0), a0i = load<V>(ii + p0);
-    const V s02r = a0r + t2r, d02r = a0r - t2r;
-    store(orr + p0, s02r + s13r);
-    store(orr + p2, s02r - s13r);
-    store(orr + p1, d02r + d13i);
-    store(orr + p3, d02r - d13i);
-    const V s02i = a0i + t2i, d02i = a0i - t2i;
-    store(oi + p0, s02i + s13i);
-    store(oi + p2, s02i - s13i);
-    store(oi + p1, d02i - d13r);
-    store(oi + p3, d02i + d13r);
+    U t1r, t1i, t3r, t3i, t2r, t2i;
+    cmul(M::get(ir + p2), M::get(ii + p2), w1r, w1i, t1r, t1i);
+    cmul(M::get(ir + p3), M::get(ii + p3), w3r, w3i, t3r, t3i);
+    const U s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
+    cmul(M::get(ir + p1), M::get(ii + p1), w2r, w2i, t2r, t2i);
+    const U a0r = M::get(ir + p0), a0i = M::get(ii + p0);
+    const U s02r = a0r + t2r, d02r = a0r - t2r;
+    M::put(orr + p0, s02r + s13r);
+    M::put(orr + p2, s02r - s13r);
+    M::put(orr + p1, d02r + d13i);
+    M::put(orr + p3, d02r - d13i);
+    const U s02i = a0i + t2i, d02i = a0i - t2i;
+    M::put(oi + p0, s02i + s13i);
+    M::put(oi + p2, s02i - s13i);
+    M::put(oi + p1, d02i - d13r);
+    M::put(oi + p3, d02i + d13r);
 }
+
+// The radix-4 butterflies WideV::kLanes lanes at a time.  The twiddles of four
+// consecutive k fill one 24-float chunk, so a wide register takes its
+// 16-byte pieces from successive chunks.
+#if ZOR_SIMD >= 1
+void radix4Wide(const float* ir, const float* ii, float* orr, float* oi, int n, int L, const float* tw) {
+    using U = WideV;
+    for (int base = 0; base < n; base += 4 * L) {
+        const float* t = tw;
+        for (int k = 0; k < L; k += U::kLanes, t += 6 * U::kLanes)
+            butterfly4(ir, ii, orr, oi, base + k, L, loadBlocks<U>(t, 24), loadBlocks<U>(t + 4, 24),
+                       loadBlocks<U>(t + 8, 24), loadBlocks<U>(t + 12, 24), loadBlocks<U>(t + 16, 24),
+                       loadBlocks<U>(t + 20, 24));
+    }
+}
+
+// Sub-transforms of four points: one twiddle chunk serves every group of
+// sixteen points, and a wide register takes one group's four lanes per
+// 16-byte block from successive groups.
+void radix4FourWide(const float* ir, const float* ii, float* orr, float* oi, int n, const float* tw) {
+    using U = WideV;
+    const U w1r = loadBlocks<U>(tw, 0), w1i = loadBlocks<U>(tw + 4, 0), w2r = loadBlocks<U>(tw + 8, 0);
+    const U w2i = loadBlocks<U>(tw + 12, 0), w3r = loadBlocks<U>(tw + 16, 0), w3i = loadBlocks<U>(tw + 20, 0);
+    for (int p0 = 0; p0 < n; p0 += 4 * U::kLanes)
+        butterfly4<U, 16>(ir, ii, orr, oi, p0, 4, w1r, w1i, w2r, w2i, w3r, w3i);
+}
+#endif
 
 // Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds, per
 // four k, the lanes of w^k, w^2k, w^3k (re then im), w = exp(-2 pi i / 4L).
 void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, int L,
                 const float* tw) {
+#if ZOR_SIMD >= 1
+    if constexpr (WideV::kLanes > 4) {
+        if (L == 4 && n >= 4 * WideV::kLanes) return radix4FourWide(ir, ii, orr, oi, n, tw);
+    }
+#endif
     if (L == 4) {  // one twiddle chunk serves every block: keep it in registers
         const V w1r = load<V>(tw), w1i = load<V>(tw + 4), w2r = load<V>(tw + 8), w2i = load<V>(tw + 12);
         const V w3r = load<V>(tw + 16), w3i = load<V>(tw + 20);
         for (int p0 = 0; p0 < n; p0 += 16) butterfly4(ir, ii, orr, oi, p0, 4, w1r, w1i, w2r, w2i, w3r, w3i);
         return;
     }
+#if ZOR_SIMD >= 1
+    if constexpr (WideV::kLanes > V::kLanes) {
+        if (L >= WideV::kLanes) return radix4Wide(ir, ii, orr, oi, n, L, tw);
+    }
+#endif
     for (int base = 0; base < n; base += 4 * L) {
         const float* t = tw;
         for (int k = 0; k < L; k += 4, t += 24)
@@ -313,7 +401,13 @@ template <class In>
 void runComplex(const FftSpec* s, const In& in, float* wr, float* wi, float* dr, float* di) {
     const int m = s->cOrder;
     const int n = 1 << m;
-    firstPass(in, wr, wi, n, s->bitReverse);
+#if ZOR_SIMD >= 1
+    if constexpr (WideV::kLanes > 4 && std::is_same_v<In, SplitInput>) {
+        if (n >= 4 * WideV::kLanes) firstPass<WideV>(in, wr, wi, n, s->bitReverse);
+        else firstPass<V>(in, wr, wi, n, s->bitReverse);
+    } else
+#endif
+    firstPass<V>(in, wr, wi, n, s->bitReverse);
     const float* tw = s->passTw;
     int L = 4;
     if (m & 1) {
