@@ -257,10 +257,3 @@ TEST(WideColumns, OverlayTouchesOnlyRowsWithWideEntries) {
     EXPECT_TRUE((t.slots[0] == t.rows[0].entry[3] && t.slots[1] == dummy<1, 6> && t.slots[2] == dummy<2, 6>));
 #endif
 }
-
-TEST(WideColumns, BoundWidthFollowsProcessorAndCap) {
-    const char* env = std::getenv("ZOR_MAX_WIDTH");
-    const int cap = widthCap(env);
-    const int usable = kColumns > 5 && zor::frame::boundVariant == 4 ? zor::cpu::usableWidth() : 128;
-    EXPECT_EQ(zor::frame::boundWidth, usable < cap ? usable : cap);
-}

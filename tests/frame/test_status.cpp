@@ -1,4 +1,4 @@
-// The shared check, rounding and saturation helpers.
+// The shared rounding and saturation helpers.
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -80,19 +80,4 @@ TEST(SaturateRound, NanInfinityAndRange) {
     EXPECT_EQ(saturateRound<uint8_t>(-0.5), 0);
     EXPECT_EQ(saturateRound<int32_t>(2147483647.4), INT32_MAX);
     EXPECT_EQ(saturateRound<int32_t>(-2147483648.6), INT32_MIN);
-}
-
-TEST(Checks, FirstFailureWinsInOrder) {
-    const int x = 0;
-    // A null pointer and a zero width: the pointer is reported.
-    EXPECT_EQ(checkFirst(anyNull(&x, static_cast<const int*>(nullptr)), badRoi({0, 5}), badSteps(0)),
-              StatusNullPointer);
-    EXPECT_EQ(checkFirst(anyNull(&x, &x), badRoi({0, 5}), badSteps(0)), StatusBadSize);
-    EXPECT_EQ(checkFirst(anyNull(&x), badRoi({3, 5}), badSteps(4, 0)), StatusBadStep);
-    EXPECT_EQ(checkFirst(anyNull(&x), badRoi({3, 5}), badSteps(4, 1)), StatusOk);
-    EXPECT_EQ(checkFirst(badLength(0), anyNull(static_cast<const int*>(nullptr))), StatusBadSize);
-    EXPECT_EQ(badRoi({1, 0}), StatusBadSize);
-    EXPECT_EQ(badRoi({-3, 2}), StatusBadSize);
-    EXPECT_EQ(badLength(1), StatusOk);
-    EXPECT_EQ(badSteps(-1), StatusBadStep);
 }

@@ -1,5 +1,6 @@
 // Sobel filters: kernels and signs, 3x3 and 5x5, saturation of the 8u form,
 // the 32f row-pass rounding, border types, buffer sizes and check orders.
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
@@ -9,8 +10,6 @@
 
 #include "tests/support/agree.h"
 #include "tests/support/checks.h"
-#include "tests/support/guarded.h"
-#include "tests/support/variants.h"
 
 namespace {
 
@@ -22,13 +21,11 @@ class Sobel : public zt::VariantTest {};
 template <class Get>
 double sobelRef(bool vert, int size, int x, int y, Get get) {
     static const int s3[3] = {1, 2, 1}, d3[3] = {1, 0, -1}, s5[5] = {1, 4, 6, 4, 1}, d5[5] = {1, 2, 0, -2, -1};
-    const int r = size / 2;
-    const int* smooth = size == 3 ? s3 : s5;
-    const int* diff = size == 3 ? d3 : d5;
+    const int r = size / 2, *smooth = r == 1 ? s3 : s5, *diff = r == 1 ? d3 : d5;
     double s = 0;
-    for (int dy = -r; dy <= r; ++dy)
-        for (int dx = -r; dx <= r; ++dx)
-            s += (vert ? diff[dx + r] * smooth[dy + r] : -diff[dy + r] * smooth[dx + r]) * double(get(x + dx, y + dy));
+    for (int j = -r; j <= r; ++j)
+        for (int i = -r; i <= r; ++i)
+            s += (vert ? diff[i + r] * smooth[j + r] : -diff[j + r] * smooth[i + r]) * double(get(x + i, y + j));
     return s;
 }
 
@@ -84,16 +81,13 @@ TEST_P(Sobel, FormsMatchTheKernels) {
                     for (int y = 0; y < h; ++y)
                         for (int x = 0; x < w; ++x) ASSERT_EQ(*d.at(x, y), sobelRef(vert, size, x, y, get)) << size << vert << w;
                 }
-                if (size == 3) {
-                    zt::GuardedImage<uint8_t> d(w, h, 0, 1);
-                    ASSERT_EQ(z.zoriFilterSobelHoriz_8u_C1R(src.roi(), src.step(), d.roi(), d.step(), {w, h}), StatusOk);
-                    EXPECT_TRUE(d.outsideIntact());
-                    for (int y = 0; y < h; ++y)
-                        for (int x = 0; x < w; ++x) {
-                            const double e = sobelRef(false, 3, x, y, get);
-                            ASSERT_EQ(*d.at(x, y), e <= 0 ? 0 : e > 255 ? 255 : int(e));
-                        }
-                }
+                zt::GuardedImage<uint8_t> d(w, h, 0, 1);  // the one 8u form: 3x3, saturated
+                const auto f8 = size == 3 ? z.zoriFilterSobelHoriz_8u_C1R : nullptr;
+                ASSERT_TRUE(!f8 || f8(src.roi(), src.step(), d.roi(), d.step(), {w, h}) == StatusOk);
+                for (int y = 0; y < h && size == 3; ++y)
+                    for (int x = 0; x < w; ++x)
+                        ASSERT_EQ(*d.at(x, y), std::min(255.0, std::max(0.0, sobelRef(false, 3, x, y, get))));
+                EXPECT_TRUE(d.outsideIntact());
             }
 }
 
@@ -199,8 +193,7 @@ TEST_P(Sobel, ChecksAndBufferSizes) {
         {z.zoriFilterSobelHorizGetBufferSize_32f_C1R, {1, 1}, 55, 16 * 25 + 420},
         {z.zoriFilterSobelVertGetBufferSize_32f_C1R, {5, 9}, 33, 32 * 21 + 364}};
     for (const auto& c : sizes) {
-        ASSERT_EQ(c.fn(c.roi, c.mask, &n), StatusOk);
-        EXPECT_EQ(n, c.size);
+        EXPECT_TRUE(c.fn(c.roi, c.mask, &n) == StatusOk && n == c.size) << c.size;
         zt::expectChecks(c.fn, {c.roi, c.mask, &n}, {zt::watch(&n, sizeof n)}, zt::eachNull(), zt::badRoi<0>(),
                          zt::bad(StatusBadMaskSize, zt::arg<1>(44)), zt::bad(StatusBadSize, zt::arg<0>(ImageSize{0, 3}), zt::arg<1>(44)));
     }

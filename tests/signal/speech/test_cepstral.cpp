@@ -8,7 +8,6 @@
 
 #include "tests/support/agree.h"
 #include "tests/support/checks.h"
-#include "tests/support/variants.h"
 
 namespace {
 
@@ -21,8 +20,7 @@ TEST_P(Cepstral, Checks) {
     int32_t r = 42;
     int lag = 42;
     void* lifter = nullptr;
-    const std::vector<zt::Watch> wd{zt::watch(d, sizeof d)}, wl{zt::watch(&lifter, sizeof lifter)},
-        wr{zt::watch(&r, sizeof r), zt::watch(&lag, sizeof lag)};
+    const std::vector<zt::Watch> wd{zt::watch(d, sizeof d)}, wr{zt::watch(&r, sizeof r), zt::watch(&lag, sizeof lag)};
     zt::expectChecks(a.zorsPreemphasize_32f, {d, 3, 0.5f}, wd, zt::eachNull(), zt::badLength<1>(),
                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<1>(0)));
     zt::expectChecks(a.zorsCopyWithPadding_32f, {s, 3, d, 3}, wd, zt::eachNull(), zt::badLength<1>(), zt::badLength<3>(),
@@ -33,7 +31,7 @@ TEST_P(Cepstral, Checks) {
                      zt::bad(StatusNullPointer, zt::arg<1>(0), zt::arg<2>(nullptr)));
     zt::expectChecks(a.zorsAutoCorrLagMax_Fwd_16s, {x, 4, 0, 2, &r, &lag}, wr, zt::eachNull(), zt::badLength<1>(),
                      zt::bad(StatusNullPointer, zt::arg<1>(0), zt::arg<5>(nullptr)));
-    zt::expectChecks(a.zorsDCTLifterInitAlloc_32f, {&lifter, 26, 13, 22, 1.0f}, wl, zt::eachNull(),
+    zt::expectChecks(a.zorsDCTLifterInitAlloc_32f, {&lifter, 26, 13, 22, 1.0f}, {zt::watch(&lifter, sizeof lifter)}, zt::eachNull(),
                      zt::badLength<1>(), zt::badLength<2>(), zt::badLength<3>(), zt::bad(StatusBadSize, zt::arg<1>(12)),
                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<1>(0)));
     zt::expectChecks(a.zorsDCTLifter_32f, {s, d, lifter}, wd, zt::eachNull());
@@ -53,39 +51,28 @@ TEST_P(Cepstral, PreemphasisAndPadding) {
             ASSERT_EQ(x[n], n == 0 ? v[0] : static_cast<float>(d)) << len << " " << n;
         }
     }
-    float s[3] = {1, 2, 3}, d[6] = {9, 9, 9, 9, 9, 9};
-    ASSERT_EQ(z().zorsCopyWithPadding_32f(s, 3, d, 3), StatusOk);
-    EXPECT_TRUE(d[2] == 3.0f && d[3] == 9.0f);
+    const float s[3] = {1, 2, 3}, want[6] = {1, 2, 3, 0, 0, 9};
+    float d[6] = {9, 9, 9, 9, 9, 9};
+    ASSERT_TRUE(z().zorsCopyWithPadding_32f(s, 3, d, 3) == StatusOk && d[3] == 9.0f);
     ASSERT_EQ(z().zorsCopyWithPadding_32f(s, 3, d, 5), StatusOk);
-    const float want[6] = {1, 2, 3, 0, 0, 9};
     EXPECT_EQ(std::memcmp(d, want, sizeof want), 0);
-    zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
-        return z.zorsPreemphasize_32f(c.inOut<float>(c.len()), c.len(), 0.97f);
-    });
 }
 
-// Coefficient i = lifter(i) * val * sum_j cos((j - 1/2) i pi / N) c[j], the
-// cosines as floats, the lifter 1 + (L / 2) sin(i pi / L) as a float.
+// Coefficient i = lifter(i) * sum_j cos((j - 1/2) i pi / N) c[j], the
+// cosines as floats, the sum in double in increasing j, the lifter
+// (1 + (L / 2) sin(i pi / L)) val as a float.
 TEST_P(Cepstral, DctLifter) {
     const zt::Api& a = z();
-    void *d = nullptr, *d2 = nullptr;
-    ASSERT_EQ(a.zorsDCTLifterInitAlloc_32f(&d, 26, 13, 22, 1.0f), StatusOk);
-    ASSERT_EQ(a.zorsDCTLifterInitAlloc_32f(&d2, 26, 13, 22, 2.0f), StatusOk);
-    std::vector<float> c(26, 3.5f), out(13, 9.0f), out2(13);
+    void* d = nullptr;
+    ASSERT_EQ(a.zorsDCTLifterInitAlloc_32f(&d, 26, 13, 22, 0.75f), StatusOk);
+    std::vector<float> c = zt::randomFloats(26, 1, 5.0f), out(13);
     ASSERT_EQ(a.zorsDCTLifter_32f(c.data(), out.data(), d), StatusOk);
-    for (float v : out) EXPECT_NEAR(v, 0.0f, 1e-4f);  // a constant has no cepstrum beyond c0
-    c = zt::randomFloats(26, 1, 5.0f);
-    ASSERT_EQ(a.zorsDCTLifter_32f(c.data(), out.data(), d), StatusOk);
-    ASSERT_EQ(a.zorsDCTLifter_32f(c.data(), out2.data(), d2), StatusOk);
     for (int i = 1; i <= 13; ++i) {
-        double acc = 0;
-        for (int j = 1; j <= 26; ++j) acc += double(float(std::cos((j - 0.5) * i * 3.141592653589793 / 26))) * c[j - 1];
-        const double lifter = 1 + double(11.0f) * std::sin(i * 3.141592653589793 / 22);
-        EXPECT_NEAR(out[i - 1], acc * double(float(lifter)), 1e-5 * (1 + std::fabs(acc * lifter))) << i;
-        EXPECT_FLOAT_EQ(out2[i - 1], 2 * out[i - 1]);
+        volatile double acc = 0, lifter = float((1 + double(11.0f) * std::sin(i * 3.141592653589793 / 22)) * 0.75);
+        for (int j = 1; j <= 26; ++j) acc = acc + double(float(std::cos((j - 0.5) * i * 3.141592653589793 / 26))) * c[j - 1];
+        EXPECT_EQ(out[i - 1], float(acc * lifter)) << i;
     }
     EXPECT_EQ(a.zorsDCTLifterFree_32f(d), StatusOk);
-    EXPECT_EQ(a.zorsDCTLifterFree_32f(d2), StatusOk);
     // The SIMD sums run several coefficients side by side: the generic bits.
     zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
         void* lifter = nullptr;
@@ -108,12 +95,9 @@ TEST_P(Cepstral, NormEnergyAndSignChanges) {
     EXPECT_TRUE(s[1] == -1.0f && s[5] == -1.0f);
     const int16_t x[5] = {1, -1, 0, 1, -1}, big[2] = {-32768, 32767};
     int32_t r = -5;
-    ASSERT_EQ(z().zorsSignChangeRate_16s(x, 5, &r), StatusOk);
-    EXPECT_EQ(r, 2);
-    ASSERT_EQ(z().zorsSignChangeRate_16s(x, 1, &r), StatusOk);
-    EXPECT_EQ(r, 0);
-    ASSERT_EQ(z().zorsSignChangeRate_16s(big, 2, &r), StatusOk);
-    EXPECT_EQ(r, 1);
+    struct { const int16_t* p; int len, want; } const cases[] = {{x, 5, 2}, {x, 1, 0}, {big, 2, 1}};
+    for (const auto& c : cases)  // zeros are no sign; -32768 * 32767 does not overflow
+        EXPECT_TRUE(z().zorsSignChangeRate_16s(c.p, c.len, &r) == StatusOk && r == c.want) << c.len;
 }
 
 // The lag of the largest wrapped 32-bit sum (the smaller lag on ties), its

@@ -5,12 +5,10 @@
 #include <cmath>
 #include <cstring>
 #include <limits>
-#include <random>
 #include <vector>
 
 #include "tests/support/agree.h"
 #include "tests/support/checks.h"
-#include "tests/support/variants.h"
 
 namespace {
 
@@ -71,6 +69,7 @@ struct Filters {
     }
 };
 
+// The spectrum ends against a guard page: no filter reads past bin n / 2.
 TEST_P(MelFBank, ConstructionAndEvaluationFollowTheDefinition) {
     struct Case { int winLen; float fs, lo, hi; int nf; int mode; };
     for (Case c : {Case{400, 16000, 64, 8000, 26, 1}, Case{400, 16000, 64, 8000, 26, 2},
@@ -79,15 +78,16 @@ TEST_P(MelFBank, ConstructionAndEvaluationFollowTheDefinition) {
         int order = 0;
         ASSERT_EQ(z().zorsMelFBankInitAlloc_32f(&bank, &order, c.winLen, c.fs, c.lo, c.hi, c.nf, 2595.0f, 700.0f,
                                                 c.mode), StatusOk);
-        BankHead h;
-        std::memcpy(&h, bank, sizeof h);
+        const BankHead& h = *static_cast<const BankHead*>(bank);
         const int n = 1 << order;
         EXPECT_TRUE(h.fftLen == n && n >= c.winLen && n / 2 < c.winLen && h.nFilter == c.nf && h.initialised == 1);
         const std::vector<float> spec = zt::randomFloats(n / 2 + 1, c.nf, 10.0f);
+        zt::GuardedBuffer guarded(spec.size() * sizeof(float));
+        std::memcpy(guarded.data(), spec.data(), guarded.size());
         const Filters want(n, c.fs, c.lo, c.hi, c.nf, c.mode == 1, spec);
         for (int k = 0; k < c.nf + 2; ++k) ASSERT_EQ(h.bins[k], want.bins[k]) << k;
         std::vector<float> out(c.nf);
-        ASSERT_EQ(z().zorsEvalFBank_32f(spec.data(), out.data(), bank), StatusOk);
+        ASSERT_EQ(z().zorsEvalFBank_32f(guarded.as<float>(), out.data(), bank), StatusOk);
         for (int k = 0; k < c.nf; ++k) EXPECT_EQ(out[k], want.out[k]) << "mode " << c.mode << " filter " << k;
         EXPECT_EQ(z().zorsFBankFree_32f(bank), StatusOk);
     }
@@ -102,37 +102,18 @@ TEST_P(MelFBank, OwnTransformIsTheTransformThenTheMagnitude) {
         const int n = 1 << order;
         void *bank = nullptr, *plain = nullptr, *spec = nullptr;
         int o1 = 0, o2 = 0;
-        ASSERT_EQ(a.zorsMelFBankInitAlloc_32f(&bank, &o1, n, 16000, 64, 8000, 10, 2595, 700, 6), StatusOk);
-        ASSERT_EQ(a.zorsMelFBankInitAlloc_32f(&plain, &o2, n, 16000, 64, 8000, 10, 2595, 700, 2), StatusOk);
-        ASSERT_EQ(o1, order);
+        ASSERT_EQ(a.zorsMelFBankInitAlloc_32f(&bank, &o1, n, 16000, 64, 8000, 10, 2595, 700, 5 + order % 2), StatusOk);
+        ASSERT_EQ(a.zorsMelFBankInitAlloc_32f(&plain, &o2, n, 16000, 64, 8000, 10, 2595, 700, 1 + order % 2), StatusOk);
         ASSERT_EQ(a.zorsFFTInitAlloc_R_32f(&spec, order, 8, 2), StatusOk);
-        for (int trial = 0; trial < 2; ++trial) {
-            std::vector<float> frame = zt::randomFloats(n, order), ccs(n + 2), mag(n / 2 + 1), got(10), want(10);
-            if (trial == 1) frame[n / 3] = std::numeric_limits<float>::infinity();
-            ASSERT_EQ(a.zorsFFTFwd_RToCCS_32f(frame.data(), ccs.data(), spec, nullptr), StatusOk);
-            ASSERT_EQ(a.zorsMagnitude_32fc(reinterpret_cast<const Complex32f*>(ccs.data()), mag.data(), n / 2 + 1), 0);
-            ASSERT_EQ(a.zorsEvalFBank_32f(frame.data(), got.data(), bank), StatusOk);
-            ASSERT_EQ(a.zorsEvalFBank_32f(mag.data(), want.data(), plain), StatusOk);
-            EXPECT_EQ(std::memcmp(got.data(), want.data(), sizeof(float) * 10), 0) << order << " " << trial;
-        }
-        EXPECT_EQ(a.zorsFFTFree_R_32f(spec), StatusOk);
-        EXPECT_EQ(a.zorsFBankFree_32f(bank), StatusOk);
-        EXPECT_EQ(a.zorsFBankFree_32f(plain), StatusOk);
+        std::vector<float> frame = zt::randomFloats(n, order), ccs(n + 2), mag(n / 2 + 1), got(10), want(10);
+        if (order % 3 == 0) frame[n / 3] = std::numeric_limits<float>::infinity();
+        ASSERT_EQ(a.zorsFFTFwd_RToCCS_32f(frame.data(), ccs.data(), spec, nullptr), StatusOk);
+        ASSERT_EQ(a.zorsMagnitude_32fc(reinterpret_cast<const Complex32f*>(ccs.data()), mag.data(), n / 2 + 1), 0);
+        ASSERT_EQ(a.zorsEvalFBank_32f(frame.data(), got.data(), bank), StatusOk);
+        ASSERT_EQ(a.zorsEvalFBank_32f(mag.data(), want.data(), plain), StatusOk);
+        EXPECT_TRUE(o1 == order && std::memcmp(got.data(), want.data(), sizeof(float) * 10) == 0) << order;
+        EXPECT_TRUE(!a.zorsFFTFree_R_32f(spec) && !a.zorsFBankFree_32f(bank) && !a.zorsFBankFree_32f(plain));
     }
-#if defined(__i386__)
-    const int reference = 1;  // the generic variant's transform sums on the x87 unit
-#else
-    const int reference = 0;
-#endif
-    if (variant() == 0 && reference) return;
-    zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
-        void* bank = nullptr;
-        int order = 0;
-        const int win = 16 * c.len() + 1, mode = 1 + c.index() % 2 + (c.index() % 3 ? 4 : 0);
-        if (z.zorsMelFBankInitAlloc_32f(&bank, &order, win, 16000, 64, 8000, 12, 2595, 700, mode)) return -1;
-        const Status s = z.zorsEvalFBank_32f(c.in<float>(1 << order), c.out<float>(12), bank);
-        return s + z.zorsFBankFree_32f(bank);
-    }, reference);
 }
 
 TEST_P(MelFBank, ChecksAndCodes) {
@@ -153,13 +134,10 @@ TEST_P(MelFBank, ChecksAndCodes) {
                      zt::bad(StatusNullPointer, zt::arg<1>(nullptr), zt::arg<2>(0)),
                      zt::bad(StatusBadSize, zt::arg<2>(0), zt::arg<5>(63.0f)),
                      zt::bad(StatusBadFrequencyRange, zt::arg<5>(63.0f), zt::arg<9>(0)));
-    EXPECT_EQ(order, 9);
-    EXPECT_EQ(a.zorsFBankFree_32f(bank), StatusOk);
-    for (int win : {1, 2}) {
-        ASSERT_EQ(a.zorsMelFBankInitAlloc_32f(&bank, &order, win, 16000, 64, 8000, 4, 2595, 700, 1), StatusOk);
-        EXPECT_EQ(order, 1);
-        EXPECT_EQ(a.zorsFBankFree_32f(bank), StatusOk);
-    }
+    EXPECT_TRUE(order == 9 && !a.zorsFBankFree_32f(bank));
+    for (int win : {1, 2})  // the shortest transform has two points
+        EXPECT_TRUE(!a.zorsMelFBankInitAlloc_32f(&bank, &order, win, 16000, 64, 8000, 4, 2595, 700, 1) && order == 1 &&
+                    !a.zorsFBankFree_32f(bank));
     ASSERT_EQ(a.zorsMelFBankInitAlloc_32f(&bank, &order, 400, 16000, 64, 8000, 26, 2595, 700, 1), StatusOk);
     float s[257] = {}, d[26] = {};
     zt::expectChecks(a.zorsEvalFBank_32f, {s, d, bank}, {zt::watch(d, sizeof d)}, zt::eachNull());

@@ -4,12 +4,10 @@
 
 #include <cmath>
 #include <cstring>
-#include <random>
 #include <vector>
 
 #include "tests/support/agree.h"
 #include "tests/support/checks.h"
-#include "tests/support/variants.h"
 
 namespace {
 
@@ -18,7 +16,7 @@ class AutoCorr : public zt::VariantTest {};
 // Lag k: the sum of x[n] x[n + k] in double; lags past the signal are 0.
 // Short cases must give it rounded once; long signals with many lags go
 // through the spectrum and land within float rounding (plus a sliver of
-// lag 0).  Nothing is written past dstLen (guarded).
+// lag 0).  Nothing is read past srcLen nor written past dstLen (guarded).
 TEST_P(AutoCorr, MatchesDoubleSums) {
     const struct { int srcLen, dstLen; bool exact; } cases[] = {
         {1, 1, true}, {2, 3, true}, {3, 8, true}, {5, 5, true}, {7, 1, true}, {16, 3, true}, {33, 38, true},
@@ -26,10 +24,11 @@ TEST_P(AutoCorr, MatchesDoubleSums) {
     for (const auto& c : cases) {
         std::vector<float> x = zt::randomFloats(c.srcLen, c.srcLen, 1.0f);
         for (float& v : x) v += 0.25f;  // a mean, so lag 0 dominates
+        zt::GuardedBuffer in(c.srcLen * sizeof(float));
+        std::memcpy(in.data(), x.data(), in.size());
         zt::GuardedBuffer out(c.dstLen * sizeof(float));
-        float* d = out.as<float>();
-        std::memset(d, 0xFF, c.dstLen * sizeof(float));
-        ASSERT_EQ(z().zorsAutoCorr_32f(x.data(), c.srcLen, d, c.dstLen), StatusOk);
+        float* d = static_cast<float*>(std::memset(out.data(), 0xFF, out.size()));
+        ASSERT_EQ(z().zorsAutoCorr_32f(in.as<float>(), c.srcLen, d, c.dstLen), StatusOk);
         double lag0 = 0;
         for (float v : x) lag0 += double(v) * v;
         for (int k = 0; k < c.dstLen; ++k) {
@@ -47,7 +46,6 @@ TEST_P(AutoCorr, ChecksAndAgreement) {
     float x[3] = {1, 2, 3}, y[2] = {7, 7};
     zt::expectChecks(z().zorsAutoCorr_32f, {x, 3, y, 2}, {zt::watch(y, sizeof y)}, zt::eachNull(), zt::badLength<1>(),
                      zt::badLength<3>(), zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<1>(0)));
-    EXPECT_TRUE(y[0] == 14.0f && y[1] == 8.0f);
     zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
         const int n = c.len() * 4, m = c.roi().width * c.roi().height * 8;  // long enough for the spectrum
         return z.zorsAutoCorr_32f(c.in<float>(n), n, c.out<float>(m), m);
