@@ -402,7 +402,7 @@ ZOR_FN(ZOR_ALL, Status, zorsAutoCorr_32f, (const float* pSrc, int srcLen, float*
 ZOR_FN(ZOR_ALL, Status, zorsMelFBankInitAlloc_32f,
        (void** ppFBank, int* pFFTOrder, int winLen, float sampFreq, float lowFreq, float highFreq,
         int nFilter, float melMul, float melDiv, int mode))
-ZOR_FN(ZOR_ALL, Status, zorsEvalFBank_32f, (const float* pSrc, float* pDst, void* pFBank))
+ZOR_FN(ZOR_WIDE, Status, zorsEvalFBank_32f, (const float* pSrc, float* pDst, void* pFBank))
 ZOR_FN(ZOR_ALL, Status, zorsFBankFree_32f, (void* pFBank))
 
 /* ---- signal/speech/cepstral ---- */

@@ -11,9 +11,13 @@
 #include <cstring>
 
 // The vector conversions and magnitudes have no SSE-only entry: that
-// column runs their generic code.
+// column runs their generic code.  The wide columns call the SSSE3 ones
+// (same bits; only the bank's own transform is wide).
 #if !ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 #  define ZOR_ENTRY_NS v0
+#  include "frame/entries.h"
+#elif ZOR_VARIANT >= 5
+#  define ZOR_ENTRY_NS v4
 #  include "frame/entries.h"
 #endif
 
@@ -28,6 +32,8 @@ constexpr int kRoundNear = 1;
 
 #if !ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 namespace vec = zor::v0;
+#elif ZOR_VARIANT >= 5
+namespace vec = zor::v4;
 #else
 namespace vec = zor::ZOR_NS;
 #endif

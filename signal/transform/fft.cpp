@@ -491,24 +491,25 @@ Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const floa
 
 // The spectrum from the half-length transform Z (zr, zi; m = N/2 values):
 // X[k] = E + T, X[m-k] = conj(E - T) with E = (Z[k] + conj Z[m-k]) / 2,
-// T = w^k (Z[k] - conj Z[m-k]) / 2i.  The sink takes bins k .. k+3 in lane
-// order (up), bins m-k-3 .. m-k with lane l holding bin m-k-l (down), and
-// X[0], X[m], both real (ends).
-template <class Sink>
+// T = w^k (Z[k] - conj Z[m-k]) / 2i.  The sink takes bins k .. k+L-1 in
+// lane order (up), bins m-k-L+1 .. m-k with lane l holding bin m-k-l (down),
+// L = U::kLanes, and X[0], X[m], both real (ends).
+template <class U, class Sink>
 void recombine(const FftSpec* s, const float* zr, const float* zi, int m, Sink& out) {
+    constexpr int kLast = U::kLanes - 1;
     const float* rc = s->realTwiddles;
     const float* rs = s->realTwiddles2;
-    const V half = set1<V>(0.5f);
-    for (int k = 1; k <= m / 2; k += 4) {
-        const V ar = load<V>(zr + k), ai = load<V>(zi + k);
-        const V br = reverseLanes(load<V>(zr + m - k - 3)), bi = reverseLanes(load<V>(zi + m - k - 3));
+    const U half = set1<U>(0.5f);
+    for (int k = 1; k <= m / 2; k += U::kLanes) {
+        const U ar = load<U>(zr + k), ai = load<U>(zi + k);
+        const U br = reverseLanes(load<U>(zr + m - k - kLast)), bi = reverseLanes(load<U>(zi + m - k - kLast));
         // B = conj Z[m-k]: (br, -bi)
-        const V er = half * (ar + br), ei = half * (ai - bi);
-        const V dr = ar - br, di = ai + bi;
-        const V c = load<V>(rc + k), sn = load<V>(rs + k);
-        const V tr = c * di + sn * dr, ti = sn * di - c * dr;
+        const U er = half * (ar + br), ei = half * (ai - bi);
+        const U dr = ar - br, di = ai + bi;
+        const U c = load<U>(rc + k), sn = load<U>(rs + k);
+        const U tr = c * di + sn * dr, ti = sn * di - c * dr;
         out.up(k, er + tr, ei + ti);
-        out.down(m - k - 3, er - tr, ti - ei);
+        out.down(m - k - kLast, er - tr, ti - ei);
     }
     const float r0 = zr[0], i0 = zi[0];
     out.ends(r0 + i0, r0 - i0, m);
@@ -536,7 +537,8 @@ struct CcsSink {
 struct MagnitudeSink {
     float* mag;
 #if ZOR_SIMD >= 2
-    static V magnitudes(V re, V im) {
+    template <class U>
+    static U magnitudes(U re, U im) {
         const auto norm = [](auto r, auto i) { return sqrt(r * r + i * i); };  // on doubles
         return narrowSat<float>(norm(widenLo(re), widenLo(im)), norm(widenHi(re), widenHi(im)));
     }
@@ -556,8 +558,10 @@ struct MagnitudeSink {
         const double a = x;
         return toFloat(std::sqrt(toDouble(a * a + 0.0)));
     }
-    void up(int k, V re, V im) { store(mag + k, magnitudes(re, im)); }
-    void down(int k, V re, V im) { store(mag + k, reverseLanes(magnitudes(re, im))); }
+    template <class U>
+    void up(int k, U re, U im) { store(mag + k, magnitudes(re, im)); }
+    template <class U>
+    void down(int k, U re, U im) { store(mag + k, reverseLanes(magnitudes(re, im))); }
     void ends(float x0, float xm, int m) {
         mag[0] = magnitude(x0);
         mag[m] = magnitude(xm);
@@ -592,13 +596,13 @@ Status forwardReal(const FftSpec* s, const float* src, float* dst, uint8_t* pBuf
         float* w = reinterpret_cast<float*>((reinterpret_cast<uintptr_t>(pBuffer) + 31) & ~uintptr_t(31));
         runComplex(s, in, w, w + m, w, w + m);
         CcsSink out{dst};
-        recombine(s, w, w + m, m, out);
+        recombine<V>(s, w, w + m, m, out);
         mem::alignedFree(own);
     } else {
         alignas(16) float w[1 << kSmallOrder];
         runComplex(s, in, w, w + m, w, w + m);
         CcsSink out{dst};
-        recombine(s, w, w + m, m, out);
+        recombine<V>(s, w, w + m, m, out);
     }
     if (scaled) scaleArray(dst, n + 2, s->scale);
     return StatusOk;
@@ -623,7 +627,15 @@ bool realTransformMagnitudes(const void* pSpec, const float* src, float* mag) {
     alignas(16) float w[1 << kSmallOrder];
     runComplex(s, PairInput{src}, w, w + m, w, w + m);
     MagnitudeSink out{mag};
-    recombine(s, w, w + m, m, out);
+#if ZOR_SIMD >= 2
+    if constexpr (WideV::kLanes > 4) {
+        if (m / 2 >= WideV::kLanes) {
+            recombine<WideV>(s, w, w + m, m, out);
+            return true;
+        }
+    }
+#endif
+    recombine<V>(s, w, w + m, m, out);
     return true;
 #endif
 }
