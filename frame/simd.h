@@ -22,10 +22,10 @@
 // simd::kHas<T> tells a template whether Vec<T> exists in this column.
 //
 // Lane order.  Operations act lane by lane and keep lane order, except those
-// marked "per 16-byte block": widenLo/widenHi, narrow*, zipLo/zipHi,
-// concatEven/concatOdd, transpose4, addPairs, shuffleBytes, alignBytes and
-// shiftBytes* work within each 16-byte block of a wider register, as the
-// hardware does.  widenLo/widenHi followed by narrow* restores the original
+// marked "per 16-byte block": widenLo/widenHi, toDoubleLo/toDoubleHi,
+// gather*, narrow*, zipLo/zipHi, concatEven/concatOdd,
+// transpose4, addPairs, shuffleBytes, alignBytes and shiftBytes* work
+// within each 16-byte block of a wider register, as the hardware does.  widenLo/widenHi followed by narrow* restores the original
 // order at every width, so kernels that widen, compute and narrow back need
 // not care; loadWidened and reverseLanes keep (reverse) the order of the
 // whole register.
@@ -825,6 +825,32 @@ struct Isa<16> {
     }
     static __m128d int32ToDoubleLo(__m128i a) { return _mm_cvtepi32_pd(a); }
     static __m128d int32ToDoubleHi(__m128i a) { return _mm_cvtepi32_pd(_mm_shuffle_epi32(a, 0x0E)); }
+    // t[i0], t[i1] (t[i2], t[i3]): two loads addressed from general
+    // registers (the indices read as unsigned: no sign extension).
+    // Lanes 0 and 1 as unsigned integers, through memory (the compiler may
+    // turn this into register transfers).
+    static void twoIndices(__m128i i, uint32_t& i0, uint32_t& i1) {
+        alignas(16) uint32_t lanes[4];
+        _mm_store_si128(reinterpret_cast<__m128i*>(lanes), i);
+        i0 = lanes[0];
+        i1 = lanes[1];
+    }
+    static __m128d gatherDoubleLo(const double* t, __m128i i) {
+        uint32_t i0, i1;
+        twoIndices(i, i0, i1);
+        return _mm_loadh_pd(_mm_load_sd(t + i0), t + i1);
+    }
+    static __m128d gatherDoubleHi(const double* t, __m128i i) { return gatherDoubleLo(t, _mm_unpackhi_epi64(i, i)); }
+    // Rows of two doubles at t + i[0], t + i[1] (i[2], i[3]): their first
+    // and second doubles.
+    static void gatherRowsLo(const double* t, const int32_t* i, __m128d& first, __m128d& second) {
+        const __m128d r0 = _mm_loadu_pd(t + uint32_t(i[0])), r1 = _mm_loadu_pd(t + uint32_t(i[1]));
+        first = _mm_unpacklo_pd(r0, r1);
+        second = _mm_unpackhi_pd(r0, r1);
+    }
+    static void gatherRowsHi(const double* t, const int32_t* i, __m128d& first, __m128d& second) {
+        gatherRowsLo(t, i + 2, first, second);
+    }
     static __m128i doubleToInt32(__m128d lo, __m128d hi) {
         return _mm_unpacklo_epi64(_mm_cvtpd_epi32(lo), _mm_cvtpd_epi32(hi));
     }
@@ -1315,6 +1341,26 @@ struct Halves {
     }
     static R<double> int32ToDoubleLo(R<int32_t> a) { return each<double, int32_t>(a, [](auto x) { return H::int32ToDoubleLo(x); }); }
     static R<double> int32ToDoubleHi(R<int32_t> a) { return each<double, int32_t>(a, [](auto x) { return H::int32ToDoubleHi(x); }); }
+    static R<double> gatherDoubleLo(const double* t, R<int32_t> i) {
+        return each<double, int32_t>(i, [t](auto x) { return H::gatherDoubleLo(t, x); });
+    }
+    static R<double> gatherDoubleHi(const double* t, R<int32_t> i) {
+        return each<double, int32_t>(i, [t](auto x) { return H::gatherDoubleHi(t, x); });
+    }
+    static void gatherRowsLo(const double* t, const int32_t* i, R<double>& first, R<double>& second) {
+        typename RawOf<double, kHalf>::type f0, s0, f1, s1;
+        H::gatherRowsLo(t, i, f0, s0);
+        H::gatherRowsLo(t, i + kHalfLanes<int32_t>, f1, s1);
+        first = join<double>(f0, f1);
+        second = join<double>(s0, s1);
+    }
+    static void gatherRowsHi(const double* t, const int32_t* i, R<double>& first, R<double>& second) {
+        typename RawOf<double, kHalf>::type f0, s0, f1, s1;
+        H::gatherRowsHi(t, i, f0, s0);
+        H::gatherRowsHi(t, i + kHalfLanes<int32_t>, f1, s1);
+        first = join<double>(f0, f1);
+        second = join<double>(s0, s1);
+    }
     static R<int32_t> doubleToInt32(R<double> l, R<double> h) {
         return each<int32_t, double>(l, h, [](auto x, auto y) { return H::doubleToInt32(x, y); });
     }
@@ -1526,6 +1572,9 @@ struct Isa<32> : Halves<32> {
     static R<T> gt(R<T> a, R<T> b) {
         if constexpr (isF<T>) return _mm256_cmp_ps(b, a, _CMP_LT_OS);
         else if constexpr (isD<T>) return _mm256_cmp_pd(b, a, _CMP_LT_OS);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm256_cmpgt_epi8(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm256_cmpgt_epi16(a, b);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm256_cmpgt_epi32(a, b);
         else return Base::gt<T>(a, b);
     }
     template <class T>
@@ -1580,6 +1629,85 @@ struct Isa<32> : Halves<32> {
     }
 
     static __m256d blockPairsTogether(__m256d a) { return _mm256_permute4x64_pd(a, _MM_SHUFFLE(3, 1, 2, 0)); }
+    static __m256i blockPairsTogether(__m256i a) { return _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0)); }
+    static __m256d int32ToDoubleLo(__m256i a) { return _mm256_cvtepi32_pd(_mm256_castsi256_si128(blockPairsTogether(a))); }
+    static __m256d int32ToDoubleHi(__m256i a) { return _mm256_cvtepi32_pd(_mm256_extracti128_si256(blockPairsTogether(a), 1)); }
+    static __m256d gatherDoubleLo(const double* t, __m256i i) {
+        return _mm256_i32gather_pd(t, _mm256_castsi256_si128(blockPairsTogether(i)), 8);
+    }
+    static __m256d gatherDoubleHi(const double* t, __m256i i) {
+        return _mm256_i32gather_pd(t, _mm256_extracti128_si256(blockPairsTogether(i), 1), 8);
+    }
+    // Rows from general-register addresses, one 16-byte load each: faster
+    // than two gathers of their halves.
+    static __m256d rowsOf(const double* t, int32_t a, int32_t b) {
+        return _mm256_insertf128_pd(_mm256_castpd128_pd256(_mm_loadu_pd(t + uint32_t(a))), _mm_loadu_pd(t + uint32_t(b)), 1);
+    }
+    static void gatherRowsLo(const double* t, const int32_t* i, __m256d& first, __m256d& second) {
+        const __m256d a = rowsOf(t, i[0], i[4]), b = rowsOf(t, i[1], i[5]);
+        first = _mm256_unpacklo_pd(a, b);
+        second = _mm256_unpackhi_pd(a, b);
+    }
+    static void gatherRowsHi(const double* t, const int32_t* i, __m256d& first, __m256d& second) {
+        gatherRowsLo(t, i + 2, first, second);
+    }
+
+    // Reinterpretations: no instruction.
+    template <class To, class From>
+    static R<To> bitcast(R<From> a) {
+        if constexpr (isF<To> == isF<From> && isD<To> == isD<From>) return a;  // the same register type
+        else if constexpr (isF<To>) {
+            if constexpr (isD<From>) return _mm256_castpd_ps(a);
+            else return _mm256_castsi256_ps(a);
+        } else if constexpr (isD<To>) {
+            if constexpr (isF<From>) return _mm256_castps_pd(a);
+            else return _mm256_castsi256_pd(a);
+        } else {
+            if constexpr (isF<From>) return _mm256_castps_si256(a);
+            else return _mm256_castpd_si256(a);
+        }
+    }
+    using Base::shl;  // by a run-time count
+    using Base::shr;
+    template <class T, int N>
+    static R<T> shl(R<T> a) {
+        if constexpr (sizeof(T) == 2) return _mm256_slli_epi16(a, N);
+        else if constexpr (sizeof(T) == 4) return _mm256_slli_epi32(a, N);
+        else if constexpr (sizeof(T) == 8) return _mm256_slli_epi64(a, N);
+        else return Base::shl<T, N>(a);
+    }
+    template <class T, int N>
+    static R<T> shr(R<T> a) {
+        if constexpr (std::is_same_v<T, uint16_t>) return _mm256_srli_epi16(a, N);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm256_srai_epi16(a, N);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm256_srli_epi32(a, N);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm256_srai_epi32(a, N);
+        else if constexpr (std::is_same_v<T, uint64_t>) return _mm256_srli_epi64(a, N);
+        else return Base::shr<T, N>(a);
+    }
+    template <class T>
+    static R<T> concatEven(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatEven of 32-bit lanes");
+        if constexpr (isF<T>) return _mm256_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+        else return _mm256_castps_si256(_mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), _MM_SHUFFLE(2, 0, 2, 0)));
+    }
+    template <class T>
+    static R<T> concatOdd(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatOdd of 32-bit lanes");
+        if constexpr (isF<T>) return _mm256_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+        else return _mm256_castps_si256(_mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), _MM_SHUFFLE(3, 1, 3, 1)));
+    }
+    static __m256 recipApprox(__m256 a) { return _mm256_rcp_ps(a); }  // the same estimate as rcpps on each half
+    template <class T>
+    static int maskBits(R<T> m) {
+        if constexpr (isF<T>) return _mm256_movemask_ps(m);
+        else if constexpr (isD<T>) return _mm256_movemask_pd(m);
+        else return _mm256_movemask_epi8(m);
+    }
+    template <class T>
+    static bool anyTrue(R<T> m) { return maskBits<T>(m) != 0; }
+    template <class T>
+    static bool allTrue(R<T> m) { return maskBits<T>(m) == (isF<T> ? 0xFF : isD<T> ? 0xF : -1); }
     static __m256 int32ToFloat(__m256i a) { return _mm256_cvtepi32_ps(a); }
     static __m256i floatToInt32(__m256 a) { return _mm256_cvtps_epi32(a); }
     static __m256i floatToInt32Trunc(__m256 a) { return _mm256_cvttps_epi32(a); }
@@ -1727,6 +1855,8 @@ struct Isa<64> : Halves<64> {
     static R<T> gt(R<T> a, R<T> b) {
         if constexpr (isF<T>) return _mm512_castsi512_ps(_mm512_movm_epi32(_mm512_cmp_ps_mask(b, a, _CMP_LT_OS)));
         else if constexpr (isD<T>) return _mm512_castsi512_pd(_mm512_movm_epi64(_mm512_cmp_pd_mask(b, a, _CMP_LT_OS)));
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm512_movm_epi32(_mm512_cmpgt_epi32_mask(a, b));
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm512_movm_epi32(_mm512_cmpgt_epu32_mask(a, b));
         else return Base::gt<T>(a, b);
     }
     template <class T>
@@ -1755,6 +1885,91 @@ struct Isa<64> : Halves<64> {
     static __m512d blockPairsApart(__m512d a) {
         return _mm512_permutexvar_pd(_mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7), a);
     }
+    static __m512i blockPairsTogether(__m512i a) {
+        return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), a);
+    }
+    static __m512d int32ToDoubleLo(__m512i a) { return _mm512_cvtepi32_pd(_mm512_castsi512_si256(blockPairsTogether(a))); }
+    static __m512d int32ToDoubleHi(__m512i a) { return _mm512_cvtepi32_pd(_mm512_extracti64x4_epi64(blockPairsTogether(a), 1)); }
+    static __m512d gatherDoubleLo(const double* t, __m512i i) {
+        return _mm512_i32gather_pd(_mm512_castsi512_si256(blockPairsTogether(i)), t, 8);
+    }
+    static __m512d gatherDoubleHi(const double* t, __m512i i) {
+        return _mm512_i32gather_pd(_mm512_extracti64x4_epi64(blockPairsTogether(i), 1), t, 8);
+    }
+    // Rows from general-register addresses, one 16-byte load each: faster
+    // than two gathers of their halves.
+    static __m512d rowsOf(const double* t, int32_t a, int32_t b, int32_t c, int32_t d) {
+        __m512d r = _mm512_castpd128_pd512(_mm_loadu_pd(t + uint32_t(a)));
+        r = _mm512_insertf64x2(r, _mm_loadu_pd(t + uint32_t(b)), 1);
+        r = _mm512_insertf64x2(r, _mm_loadu_pd(t + uint32_t(c)), 2);
+        return _mm512_insertf64x2(r, _mm_loadu_pd(t + uint32_t(d)), 3);
+    }
+    static void gatherRowsLo(const double* t, const int32_t* i, __m512d& first, __m512d& second) {
+        const __m512d a = rowsOf(t, i[0], i[4], i[8], i[12]), b = rowsOf(t, i[1], i[5], i[9], i[13]);
+        first = _mm512_unpacklo_pd(a, b);
+        second = _mm512_unpackhi_pd(a, b);
+    }
+    static void gatherRowsHi(const double* t, const int32_t* i, __m512d& first, __m512d& second) {
+        gatherRowsLo(t, i + 2, first, second);
+    }
+
+    // Reinterpretations: no instruction.
+    template <class To, class From>
+    static R<To> bitcast(R<From> a) {
+        if constexpr (isF<To> == isF<From> && isD<To> == isD<From>) return a;  // the same register type
+        else if constexpr (isF<To>) {
+            if constexpr (isD<From>) return _mm512_castpd_ps(a);
+            else return _mm512_castsi512_ps(a);
+        } else if constexpr (isD<To>) {
+            if constexpr (isF<From>) return _mm512_castps_pd(a);
+            else return _mm512_castsi512_pd(a);
+        } else {
+            if constexpr (isF<From>) return _mm512_castps_si512(a);
+            else return _mm512_castpd_si512(a);
+        }
+    }
+    using Base::shl;  // by a run-time count
+    using Base::shr;
+    template <class T, int N>
+    static R<T> shl(R<T> a) {
+        if constexpr (sizeof(T) == 2) return _mm512_slli_epi16(a, N);
+        else if constexpr (sizeof(T) == 4) return _mm512_slli_epi32(a, N);
+        else if constexpr (sizeof(T) == 8) return _mm512_slli_epi64(a, N);
+        else return Base::shl<T, N>(a);
+    }
+    template <class T, int N>
+    static R<T> shr(R<T> a) {
+        if constexpr (std::is_same_v<T, uint16_t>) return _mm512_srli_epi16(a, N);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm512_srai_epi16(a, N);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm512_srli_epi32(a, N);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm512_srai_epi32(a, N);
+        else if constexpr (std::is_same_v<T, uint64_t>) return _mm512_srli_epi64(a, N);
+        else return Base::shr<T, N>(a);
+    }
+    template <class T>
+    static R<T> concatEven(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatEven of 32-bit lanes");
+        if constexpr (isF<T>) return _mm512_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+        else return _mm512_castps_si512(_mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), _MM_SHUFFLE(2, 0, 2, 0)));
+    }
+    template <class T>
+    static R<T> concatOdd(R<T> a, R<T> b) {
+        static_assert(sizeof(T) == 4, "concatOdd of 32-bit lanes");
+        if constexpr (isF<T>) return _mm512_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+        else return _mm512_castps_si512(_mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), _MM_SHUFFLE(3, 1, 3, 1)));
+    }
+    // The sign bits of the lanes (of the bytes for integer lanes), as the
+    // 16-byte movemasks read masks.
+    template <class T>
+    static uint64_t maskBits(R<T> m) {
+        if constexpr (isF<T>) return _mm512_movepi32_mask(_mm512_castps_si512(m));
+        else if constexpr (isD<T>) return _mm512_movepi64_mask(_mm512_castpd_si512(m));
+        else return _mm512_movepi8_mask(m);
+    }
+    template <class T>
+    static bool anyTrue(R<T> m) { return maskBits<T>(m) != 0; }
+    template <class T>
+    static bool allTrue(R<T> m) { return maskBits<T>(m) == (isF<T> ? 0xFFFFu : isD<T> ? 0xFFu : ~uint64_t(0)); }
     static __m512 int32ToFloat(__m512i a) { return _mm512_cvtepi32_ps(a); }
     static __m512i floatToInt32(__m512 a) { return _mm512_cvtps_epi32(a); }
     static __m512i floatToInt32Trunc(__m512 a) { return _mm512_cvttps_epi32(a); }
@@ -2009,11 +2224,36 @@ template <int B>
 inline Vec<int32_t, B> toInt32(Vec<float, B> a) { return {Isa<B>::floatToInt32(a.raw)}; }
 template <int B>
 inline Vec<int32_t, B> toInt32Trunc(Vec<float, B> a) { return {Isa<B>::floatToInt32Trunc(a.raw)}; }
-// Lanes 0 .. n/2-1 (Lo) or n/2 .. n-1 (Hi) of 32-bit integers as doubles.
+// Per 16-byte block, like widenLo/widenHi of floats: lanes 0, 1 (Lo) or
+// 2, 3 (Hi) of 32-bit integers as doubles.
 template <int B>
 inline Vec<double, B> toDoubleLo(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleLo(a.raw)}; }
 template <int B>
 inline Vec<double, B> toDoubleHi(Vec<int32_t, B> a) { return {Isa<B>::int32ToDoubleHi(a.raw)}; }
+// Table lookups, per 16-byte block like toDoubleLo/toDoubleHi: table[i] for
+// the 32-bit indices i in lanes 0, 1 (Lo) or 2, 3 (Hi).  Every index must
+// lie inside the table.  16-byte registers load lane by lane, wider ones
+// gather in one instruction.
+template <int B>
+inline Vec<double, B> gatherLo(const double* table, Vec<int32_t, B> idx) {
+    return {Isa<B>::gatherDoubleLo(table, idx.raw)};
+}
+template <int B>
+inline Vec<double, B> gatherHi(const double* table, Vec<int32_t, B> idx) {
+    return {Isa<B>::gatherDoubleHi(table, idx.raw)};
+}
+// Rows of two doubles at table + idx[l], for the register's lanes l held
+// in memory (loaded from general registers: indices computed there cost no
+// transfers out of the vector unit), per 16-byte block like gatherLo /
+// gatherHi: their first and second doubles.
+template <int B>
+inline void gatherRowsLo(const double* table, const int32_t* idx, Vec<double, B>& first, Vec<double, B>& second) {
+    Isa<B>::gatherRowsLo(table, idx, first.raw, second.raw);
+}
+template <int B>
+inline void gatherRowsHi(const double* table, const int32_t* idx, Vec<double, B>& first, Vec<double, B>& second) {
+    Isa<B>::gatherRowsHi(table, idx, first.raw, second.raw);
+}
 // Two registers of doubles into one of 32-bit integers (rounded by MXCSR,
 // or truncated); INT_MIN for NaN and out-of-range lanes.
 template <int B>

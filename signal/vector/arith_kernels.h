@@ -83,25 +83,28 @@ inline float lnElement(float x, Status& first) {
 // elements (about one in ten thousand) are recomputed with the library.
 
 #if ZOR_SIMD >= 2
-// Both kernels work on four elements as two pairs of doubles, with table
-// rows fetched per element: 16-byte registers.
-using F4 = simd::Vec<float, 16>;
-using I4 = simd::Vec<int32_t, 16>;
-using D2 = simd::Vec<double, 16>;
+// Both kernels work on a register of floats as two registers of doubles
+// (widenLo/widenHi and narrowSat, whose lane order is the same at every
+// width), with table rows looked up per element (gatherRowsLo/gatherRowsHi,
+// gatherLo/gatherHi).
+using F = simd::Vec<float>;
+using I = simd::Vec<int32_t>;
+using D = simd::Vec<double>;
 
-// Lanes (of the four doubles y0[0], y0[1], y1[0], y1[1], normal-range float
-// values) that lie within Margin double ulps of a float rounding midpoint.
-// A double rounds to float by its 29 low mantissa bits: the midpoints are
-// where those read 2^28, so the low 32 bits of each double decide.  The
-// midpoint below a power of two (whose float neighbour below is closer) lies
-// 2^27 ulps away, beyond any Margin used here.
+// Lanes (of the doubles lo and hi, as widenLo/widenHi of a float register
+// order them, normal-range float values) that lie within Margin double ulps
+// of a float rounding midpoint.  A double rounds to float by its 29 low
+// mantissa bits: the midpoints are where those read 2^28, so the low 32
+// bits of each double decide.  The midpoint below a power of two (whose
+// float neighbour below is closer) lies 2^27 ulps away, beyond any Margin
+// used here.
 template <int Margin>
-inline I4 nearMidpoint(D2 y0, D2 y1) {
+inline I nearMidpoint(D lo, D hi) {
     using namespace simd;
     static_assert(Margin > 0 && Margin < (1 << 26), "margin must stay inside one float ulp");
-    const I4 low = concatEven(bitcast<int32_t>(y0), bitcast<int32_t>(y1));
-    const I4 off = (low + set1<I4>(Margin - (1 << 28))) & set1<I4>(0x1FFFFFFF);
-    return lt(off, set1<I4>(2 * Margin));
+    const I low = concatEven(bitcast<int32_t>(lo), bitcast<int32_t>(hi));
+    const I off = (low + set1<I>(Margin - (1 << 28))) & set1<I>(0x1FFFFFFF);
+    return lt(off, set1<I>(2 * Margin));
 }
 
 // ---- logarithm ----
@@ -201,58 +204,60 @@ constexpr LnTable makeLnTable() {
 // 1/c rounds the same at compile time on every platform (IEEE division).
 constexpr LnTable kLnTable = makeLnTable();
 
-// Byte offset of the table row for the float with bits u (k * sizeof(LnRow)),
-// formed in general registers: it starts the longest dependency chain of
-// the loop, and that way it needs neither the vector unit nor a transfer
-// out of it.
-inline int lnRowOffset(const float* p) {
-    uint32_t u;
-    std::memcpy(&u, p, 4);
-    return static_cast<int>(((u + 0x4000u) >> (15 - 4)) & 0xFF0u);
-}
-
-// The table row at a byte offset from lnRowOffset.
-inline const double* lnRow(int byteOffset) {
-    return reinterpret_cast<const double*>(reinterpret_cast<const char*>(kLnTable.row) + byteOffset);
-}
-
-// log x for two lanes (0 and 1, or 2 and 3 with Upper): e as integers,
-// d = m - c (exact in float), table rows at the byte offsets o0, o1.  The
-// polynomial is evaluated in a split form for a shorter dependency chain.
+// log x for the lanes of d that widenLo (widenHi with Upper) takes: e as
+// integers, d = m - c (exact in float), the table rows (rows[l] = 2k, in
+// doubles) of the register's lanes.  The polynomial is evaluated in a split
+// form for a shorter dependency chain.
 template <bool Upper>
-inline D2 lnPair(I4 e, F4 d, int o0, int o1) {
+inline D lnHalf(I e, F d, const int32_t* rows) {
     using namespace simd;
-    const D2 row0 = loadAligned<D2>(lnRow(o0)), row1 = loadAligned<D2>(lnRow(o1));
-    const D2 r = (Upper ? widenHi(d) : widenLo(d)) * zipLo(row0, row1);
-    const D2 hi = (Upper ? toDoubleHi(e) : toDoubleLo(e)) * set1<D2>(kLn2) + zipHi(row0, row1);
-    const D2 r2 = r * r;
+    D inv, logc;
+    if constexpr (Upper) gatherRowsHi(&kLnTable.row[0].inv, rows, inv, logc);
+    else gatherRowsLo(&kLnTable.row[0].inv, rows, inv, logc);
+    const D r = (Upper ? widenHi(d) : widenLo(d)) * inv;
+    const D hi = (Upper ? toDoubleHi(e) : toDoubleLo(e)) * set1<D>(kLn2) + logc;
+    const D r2 = r * r;
     // r + r2 (a + b) with a = r/3 - 1/2 and b = -r2/4 computed side by side.
-    const D2 a = r * set1<D2>(1.0 / 3) + set1<D2>(-0.5);
-    const D2 b = r2 * set1<D2>(-0.25);
+    const D a = r * set1<D>(1.0 / 3) + set1<D>(-0.5);
+    const D b = r2 * set1<D>(-0.25);
     return (hi + r) + r2 * (a + b);
 }
 
-// The logarithms of q[0 .. 3] in place, unless one of them is not a
-// positive normal finite float or lies near a rounding midpoint: then false
-// and nothing is written.
+// The table rows of q[0 .. F::kLanes - 1] (2k: the index of the row's first
+// double), formed in general registers: they start the longest dependency
+// chain of the loop, and that way they need neither the vector unit nor a
+// transfer out of it.
+inline void lnRowsOf(const float* q, int32_t (&rows)[F::kLanes]) {
+    for (int l = 0; l < F::kLanes; ++l) {
+        uint32_t u;
+        std::memcpy(&u, q + l, 4);
+        rows[l] = static_cast<int32_t>(((u + 0x4000u) >> 14) & 0x1FEu);
+    }
+}
+
+// The logarithms of q[0 .. F::kLanes - 1] in place, unless one of them is
+// not a positive normal finite float or lies near a rounding midpoint: then
+// false and nothing is written.
 inline bool lnBlock(float* q) {
     using namespace simd;
-    const I4 one = set1<I4>(0x3F800000);
-    const I4 u = loadFrom<I4>(q);
+    const I one = set1<I>(0x3F800000);
+    const I u = loadFrom<I>(q);
     // Round the mantissa to 8 bits: a carry moves into the exponent.
     // Lanes other than positive normal finite floats compute garbage
-    // harmlessly and are redone element by element.
-    const I4 t = u + set1<I4>(0x4000);
-    const I4 expo = t & set1<I4>(0x7F800000);
-    const I4 kbits = t & set1<I4>(0x007F8000);
-    const F4 m = bitcast<float>(u - expo + one);
-    const F4 d = m - bitcast<float>(kbits | one);
-    const I4 e = shr<23>(expo) - set1<I4>(127);
-    const D2 y0 = lnPair<false>(e, d, lnRowOffset(q), lnRowOffset(q + 1));
-    const D2 y1 = lnPair<true>(e, d, lnRowOffset(q + 2), lnRowOffset(q + 3));
+    // harmlessly (inside the table) and are redone element by element.
+    const I t = u + set1<I>(0x4000);
+    const I expo = t & set1<I>(0x7F800000);
+    const I kbits = t & set1<I>(0x007F8000);
+    const F m = bitcast<float>(u - expo + one);
+    const F d = m - bitcast<float>(kbits | one);
+    const I e = shr<23>(expo) - set1<I>(127);
+    int32_t rows[F::kLanes];
+    lnRowsOf(q, rows);
+    const D y0 = lnHalf<false>(e, d, rows);
+    const D y1 = lnHalf<true>(e, d, rows);
     // Not a positive normal finite float: u outside [0x00800000,
     // 0x7F800000), tested as one signed compare.
-    const I4 special = gt(u + set1<I4>(0x7F800000), set1<I4>(-0x01000001));
+    const I special = gt(u + set1<I>(0x7F800000), set1<I>(-0x01000001));
     if (anyTrue(special | nearMidpoint<kLnMargin>(y0, y1))) return false;
     store(q, narrowSat<float>(y0, y1));
     return true;
@@ -263,13 +268,15 @@ inline bool lnBlock(float* q) {
     Status first = StatusOk;
     int i = 0;
 #if ZOR_SIMD >= 2
-    for (; i + 4 <= n; i += 4)
+    constexpr int kLanes = F::kLanes;
+    for (; i + kLanes <= n; i += kLanes)
         if (!lnBlock(p + i))
-            for (int j = i; j < i + 4; ++j) p[j] = lnElement(p[j], first);
-    // The last one to three elements as a block padded with ones, so that
-    // short vectors avoid the library too.
+            for (int j = i; j < i + kLanes; ++j) p[j] = lnElement(p[j], first);
+    // The last elements as a block padded with ones, so that short vectors
+    // avoid the library too.
     if (i < n) {
-        float q[4] = {1.0f, 1.0f, 1.0f, 1.0f};
+        float q[kLanes];
+        for (float& x : q) x = 1.0f;
         std::memcpy(q, p + i, sizeof(float) * size_t(n - i));
         if (lnBlock(q)) {
             std::memcpy(p + i, q, sizeof(float) * size_t(n - i));
@@ -344,18 +351,18 @@ constexpr PhaseTable makePhaseTable() {
 }
 constexpr PhaseTable kPhaseTable = makePhaseTable();
 
-// Two lanes (0 and 1, or 2 and 3 with Upper) of atan(z) with snum = sigma
-// num, den and sc = sigma c as floats (widened exactly), plus T from the
-// table rows row0, row1.
+// atan(z) plus T for the lanes that widenLo (widenHi with Upper) takes,
+// from snum = sigma num, den and sc = sigma c as floats (widened exactly)
+// and the table rows.
 template <bool Upper>
-inline D2 phasePair(F4 snum, F4 den, F4 sc, int row0, int row1) {
+inline D phaseHalf(F snum, F den, F sc, I row) {
     using namespace simd;
-    const auto widen = [](F4 v) { return Upper ? widenHi(v) : widenLo(v); };
-    const D2 c = widen(sc), nd = widen(snum), dd = widen(den);
-    const D2 z = (nd - c * dd) / (dd + c * nd);
-    const D2 z2 = z * z;
-    const D2 q = z2 * set1<D2>(1.0 / 5) + set1<D2>(-1.0 / 3);
-    const D2 t = zipLo(loadHalf<D2>(kPhaseTable.base + row0), loadHalf<D2>(kPhaseTable.base + row1));
+    const auto widen = [](F v) { return Upper ? widenHi(v) : widenLo(v); };
+    const D c = widen(sc), nd = widen(snum), dd = widen(den);
+    const D z = (nd - c * dd) / (dd + c * nd);
+    const D z2 = z * z;
+    const D q = z2 * set1<D>(1.0 / 5) + set1<D>(-1.0 / 3);
+    const D t = Upper ? gatherHi(kPhaseTable.base, row) : gatherLo(kPhaseTable.base, row);
     return (t + z) + (z * z2) * q;
 }
 #endif
@@ -365,37 +372,36 @@ inline D2 phasePair(F4 snum, F4 den, F4 sc, int row0, int row1) {
     int i = 0;
 #if ZOR_SIMD >= 2
     using namespace simd;
-    const I4 signBit = set1<I4>(INT32_MIN);
-    for (; i + 4 <= n; i += 4) {
-        const I4 yb = loadFrom<I4>(py + i), xb = loadFrom<I4>(px + i);
-        const I4 ya = andNot(signBit, yb), xa = andNot(signBit, xb);
+    const I signBit = set1<I>(INT32_MIN);
+    for (; i + F::kLanes <= n; i += F::kLanes) {
+        const I yb = loadFrom<I>(py + i), xb = loadFrom<I>(px + i);
+        const I ya = andNot(signBit, yb), xa = andNot(signBit, xb);
         // A NaN in either makes num (x's) or den (y's) NaN.
-        const F4 num = min(bitcast<float>(ya), bitcast<float>(xa));
-        const F4 den = max(bitcast<float>(xa), bitcast<float>(ya));
+        const F num = min(bitcast<float>(ya), bitcast<float>(xa));
+        const F den = max(bitcast<float>(xa), bitcast<float>(ya));
         // t + 2^17 rounds t to a multiple of 1/64: the low bits hold k, and
         // subtracting 2^17 again leaves c = k/64 exactly.  The reciprocal
         // estimate (12 bits) keeps |t - c| <= 2^-7 + 2^-11.4 and k <= 64.
-        const F4 tk = num * recipApprox(den) + set1<F4>(0x1p17f);
-        const I4 steep = gt(ya, xa);  // positive floats order as integers
-        const I4 left = shr<31>(xb);
-        const I4 row = (bitcast<int32_t>(tk) & set1<I4>(127)) |
-                       ((steep & set1<I4>(128)) | (left & set1<I4>(256)));
-        const F4 sigma = bitcast<float>(shl<31>(steep ^ left));
-        const F4 snum = num ^ sigma;
-        const F4 sc = (tk - set1<F4>(0x1p17f)) ^ sigma;
-        const auto rows = bitcast<uint16_t>(row);  // each row below 512: the low halves of the lanes
-        const D2 r0 = phasePair<false>(snum, den, sc, getLane<0>(rows), getLane<2>(rows));
-        const D2 r1 = phasePair<true>(snum, den, sc, getLane<4>(rows), getLane<6>(rows));
+        const F tk = num * recipApprox(den) + set1<F>(0x1p17f);
+        const I steep = gt(ya, xa);  // positive floats order as integers
+        const I left = shr<31>(xb);
+        const I row = (bitcast<int32_t>(tk) & set1<I>(127)) |
+                      ((steep & set1<I>(128)) | (left & set1<I>(256)));
+        const F sigma = bitcast<float>(shl<31>(steep ^ left));
+        const F snum = num ^ sigma;
+        const F sc = (tk - set1<F>(0x1p17f)) ^ sigma;
+        const D r0 = phaseHalf<false>(snum, den, sc, row);
+        const D r1 = phaseHalf<true>(snum, den, sc, row);
         // Both magnitudes must lie in [2^-60, 2^60): zeros, infinities, NaNs
         // and extreme ratios (a result below the normal floats, a reciprocal
         // estimate out of range) are left to the library, like results near
         // a rounding midpoint.
-        const F4 inRange = ge(num, set1<F4>(0x1p-60f)) & lt(den, set1<F4>(0x1p60f));
+        const F inRange = ge(num, set1<F>(0x1p-60f)) & lt(den, set1<F>(0x1p60f));
         if (allTrue(andNot(bitcast<float>(nearMidpoint<kPhaseMargin>(r0, r1)), inRange))) {
             storeTo(d + i, narrowSat<float>(r0, r1) | bitcast<float>(yb & signBit));
             continue;
         }
-        for (int j = i; j < i + 4; ++j) d[j] = atan2Element(py[j], px[j]);
+        for (int j = i; j < i + F::kLanes; ++j) d[j] = atan2Element(py[j], px[j]);
     }
 #else
     DoublePrecisionScope precision;

@@ -201,6 +201,36 @@ TEST(SimdLanes, LaneOrderAndAccess) {
     for (int i = 0; i < 16; ++i) EXPECT_EQ(shifted[i], 5 + i);
 }
 
+// Lookups take lanes 0, 1 (Lo) and 2, 3 (Hi) of each 16-byte block, like
+// toDoubleLo/toDoubleHi; rows give their first and second doubles.
+TEST(SimdLanes, TableLookupsFollowTheWideningOrder) {
+    double table[64];
+    for (int i = 0; i < 64; ++i) table[i] = 0.5 * i;
+    using I = Vec<int32_t>;
+    using D = Vec<double>;
+    const int32_t idx[4] = {9, 0, 63, 20};
+    const I v = load<I>(idx);
+    double got[4];
+    store(got, gatherLo(table, v));
+    store(got + 2, gatherHi(table, v));
+    for (int l = 0; l < 4; ++l) EXPECT_EQ(got[l], 0.5 * idx[l]) << l;
+    const int32_t rows[4] = {40, 2, 62, 11};
+    D first, second;
+    gatherRowsLo(table, rows, first, second);
+    store(got, first);
+    store(got + 2, second);
+    gatherRowsHi(table, rows, first, second);
+    double hi[4];
+    store(hi, first);
+    store(hi + 2, second);
+    for (int l = 0; l < 2; ++l) {
+        EXPECT_EQ(got[l], 0.5 * rows[l]) << l;
+        EXPECT_EQ(got[2 + l], 0.5 * (rows[l] + 1)) << l;
+        EXPECT_EQ(hi[l], 0.5 * rows[2 + l]) << l;
+        EXPECT_EQ(hi[2 + l], 0.5 * (rows[2 + l] + 1)) << l;
+    }
+}
+
 TEST(SimdLanes, LoadWidenedExtendsInOrder) {
     const int8_t s[8] = {-128, -1, 0, 1, 127, -2, 5, -7};
     int16_t w[8];
