@@ -1464,6 +1464,39 @@ struct Isa<32> : Halves<32> {
             c = _mm256_unpacklo_epi64(t1, t3), d = _mm256_unpackhi_epi64(t1, t3);
         }
     }
+    // Widening and saturating narrowing, per 16-byte block, as the
+    // instructions work.
+    template <class T>
+    static __m256i extension(__m256i a) {
+        if constexpr (std::is_unsigned_v<T>) return _mm256_setzero_si256();
+        else if constexpr (sizeof(T) == 1) return _mm256_cmpgt_epi8(_mm256_setzero_si256(), a);
+        else if constexpr (sizeof(T) == 2) return _mm256_srai_epi16(a, 15);
+        else return _mm256_srai_epi32(a, 31);
+    }
+    template <class T>
+    static __m256i widenLo(__m256i a) {
+        const __m256i e = extension<T>(a);
+        if constexpr (sizeof(T) == 1) return _mm256_unpacklo_epi8(a, e);
+        else if constexpr (sizeof(T) == 2) return _mm256_unpacklo_epi16(a, e);
+        else return _mm256_unpacklo_epi32(a, e);
+    }
+    template <class T>
+    static __m256i widenHi(__m256i a) {
+        const __m256i e = extension<T>(a);
+        if constexpr (sizeof(T) == 1) return _mm256_unpackhi_epi8(a, e);
+        else if constexpr (sizeof(T) == 2) return _mm256_unpackhi_epi16(a, e);
+        else return _mm256_unpackhi_epi32(a, e);
+    }
+    template <class To, class From>
+    static R<To> narrowSat(R<From> lo, R<From> hi) {
+        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>)
+            return _mm256_packus_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>)
+            return _mm256_packs_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>)
+            return _mm256_packs_epi32(lo, hi);
+        else return Base::template narrowSat<To, From>(lo, hi);
+    }
 
     template <class T>
     static R<T> zero() {
@@ -1748,6 +1781,39 @@ struct Isa<64> : Halves<64> {
             a = _mm512_unpacklo_epi64(t0, t2), b = _mm512_unpackhi_epi64(t0, t2);
             c = _mm512_unpacklo_epi64(t1, t3), d = _mm512_unpackhi_epi64(t1, t3);
         }
+    }
+    // Widening and saturating narrowing, per 16-byte block, as the
+    // instructions work.
+    template <class T>
+    static __m512i extension(__m512i a) {
+        if constexpr (std::is_unsigned_v<T>) return _mm512_setzero_si512();
+        else if constexpr (sizeof(T) == 1) return _mm512_movm_epi8(_mm512_movepi8_mask(a));
+        else if constexpr (sizeof(T) == 2) return _mm512_srai_epi16(a, 15);
+        else return _mm512_srai_epi32(a, 31);
+    }
+    template <class T>
+    static __m512i widenLo(__m512i a) {
+        const __m512i e = extension<T>(a);
+        if constexpr (sizeof(T) == 1) return _mm512_unpacklo_epi8(a, e);
+        else if constexpr (sizeof(T) == 2) return _mm512_unpacklo_epi16(a, e);
+        else return _mm512_unpacklo_epi32(a, e);
+    }
+    template <class T>
+    static __m512i widenHi(__m512i a) {
+        const __m512i e = extension<T>(a);
+        if constexpr (sizeof(T) == 1) return _mm512_unpackhi_epi8(a, e);
+        else if constexpr (sizeof(T) == 2) return _mm512_unpackhi_epi16(a, e);
+        else return _mm512_unpackhi_epi32(a, e);
+    }
+    template <class To, class From>
+    static R<To> narrowSat(R<From> lo, R<From> hi) {
+        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>)
+            return _mm512_packus_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>)
+            return _mm512_packs_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>)
+            return _mm512_packs_epi32(lo, hi);
+        else return Base::template narrowSat<To, From>(lo, hi);
     }
 
     template <class T>

@@ -56,7 +56,7 @@ void rowPass(const uint8_t* s, int16_t* out, int w, const SobelKernel& k) {
     int x = 0;
 #if ZOR_SIMD >= 2
     using namespace simd;
-    using V = Vec<int16_t, 16>;
+    using V = Vec<int16_t>;
     for (; x + V::kLanes <= w; x += V::kLanes) {
         V acc = zero<V>();
         for (int i = 0; i < k.size; ++i) {
@@ -89,9 +89,10 @@ template <class Out>
 void colPass(const int16_t* const* rows, Out* dst, int w, const SobelKernel& k) {
     int x = 0;
 #if ZOR_SIMD >= 2
-    // one 16-byte register of sums; 8-bit results are its lower half narrowed
+    // sums on the widest registers; 8-bit results are the lower half of a
+    // 16-byte register narrowed
     using namespace simd;
-    using V = Vec<int16_t, 16>;
+    using V = std::conditional_t<sizeof(Out) == 1, Vec<int16_t, 16>, Vec<int16_t>>;
     for (; x + V::kLanes <= w; x += V::kLanes) {
         V acc = zero<V>();
         for (int j = 0; j < k.size; ++j) {
@@ -153,17 +154,18 @@ template <class In>
 using AccOf = std::conditional_t<sizeof(In) == 1, int16_t, float>;
 
 #if ZOR_SIMD >= 2
-// 3x3 on 8u sources in a single pass over three source rows, 16 pixels (a
-// 16-byte register widened into two) at a time.  The sums are exact in 16
-// bits, so this equals the two passes.  The low eight pixels are finished
-// before the high eight are begun (the loads are repeated), which keeps the
-// working set within the eight registers of the 32-bit build; the direction
-// is fixed at compile time and the loop gets a register allocation of its own.
-template <Dir D, class Out>
+// 3x3 on 8u sources in a single pass over three source rows, one byte
+// register B of pixels (widened into two) at a time.  The sums are exact in
+// 16 bits, so this equals the two passes.  The low halves are finished
+// before the high halves are begun (the loads are repeated), which keeps
+// the working set within the eight registers of the 32-bit build; the
+// direction is fixed at compile time and the loop gets a register
+// allocation of its own.  Widening works per 16-byte block: the 16-bit
+// results of block b's low (high) half go to pixels 16b (16b + 8) on.
+template <Dir D, class Out, class B>
 [[gnu::noinline]] void sobel3Direct(const uint8_t* src, int srcStep, Out* dst, int dstStep, ImageSize roi) {
     using namespace simd;
-    using B = Vec<uint8_t, 16>;
-    using V = Vec<int16_t, 16>;
+    using V = Vec<int16_t, B::kBytes>;
     using Lo = std::false_type;
     using Hi = std::true_type;
     const auto widened = [](const uint8_t* p, auto half) -> V {
@@ -180,7 +182,7 @@ template <Dir D, class Out>
         const uint8_t* mid = rowAt(src, srcStep, y);
         const uint8_t* bot = rowAt(src, srcStep, y + 1);
         Out* d = rowAt(dst, dstStep, y);
-        // One half of the 16 results at column x.
+        // The low or high halves of every 16-byte block of results at column x.
         const auto sobel = [&](int x, auto half) -> V {
             if constexpr (D == Dir::Vert) {
                 // smooth down the columns x - 1 and x + 1, then left minus right
@@ -201,13 +203,13 @@ template <Dir D, class Out>
                 const V lo = sobel(x, Lo{});
                 store(d + x, narrowSat<uint8_t>(lo, sobel(x, Hi{})));
             } else {
-                store(d + x, sobel(x, Lo{}));
-                store(d + x + 8, sobel(x, Hi{}));
+                storeBlocks(d + x, 16, sobel(x, Lo{}));
+                storeBlocks(d + x + 8, 16, sobel(x, Hi{}));
             }
         };
         int x = 0;
-        for (; x + 16 <= w; x += 16) block(x);
-        if (x < w) block(w - 16);  // the last block overlaps the one before
+        for (; x + B::kLanes <= w; x += B::kLanes) block(x);
+        if (x < w) block(w - B::kLanes);  // the last block overlaps the one before
     }
 }
 #endif
@@ -220,8 +222,13 @@ Status sobelPlain(const In* src, int srcStep, Out* dst, int dstStep, ImageSize r
 #if ZOR_SIMD >= 2
     if constexpr (sizeof(In) == 1) {
         if (size == 3 && roi.width >= 16) {
-            if (dir == Dir::Vert) sobel3Direct<Dir::Vert>(src, srcStep, dst, dstStep, roi);
-            else sobel3Direct<Dir::Horiz>(src, srcStep, dst, dstStep, roi);
+            const auto direct = [&](auto bytes) {
+                using B = decltype(bytes);
+                if (dir == Dir::Vert) sobel3Direct<Dir::Vert, Out, B>(src, srcStep, dst, dstStep, roi);
+                else sobel3Direct<Dir::Horiz, Out, B>(src, srcStep, dst, dstStep, roi);
+            };
+            if (roi.width >= simd::Vec<uint8_t>::kLanes) direct(simd::Vec<uint8_t>{});
+            else direct(simd::Vec<uint8_t, 16>{});
             return StatusOk;
         }
     }
