@@ -61,6 +61,26 @@ void cvConvert16s32f(benchmark::State& state) {
     }
 }
 
+// ---- 8u to 32f ----
+void zorConvert8u32f(benchmark::State& state) {
+    const std::vector<uint8_t> src = ramp<uint8_t>(kLen, 127.0);
+    std::vector<float> dst(kLen);
+    for (auto _ : state) {
+        zorsConvert_8u32f(src.data(), dst.data(), kLen);
+        benchmark::DoNotOptimize(dst.data());
+    }
+}
+void cvConvert8u32f(benchmark::State& state) {
+    const std::vector<uint8_t> src = ramp<uint8_t>(kLen, 127.0);
+    std::vector<float> dst(kLen);
+    const cv::Mat s(1, kLen, CV_8U, const_cast<uint8_t*>(src.data()));
+    cv::Mat d(1, kLen, CV_32F, dst.data());
+    for (auto _ : state) {
+        s.convertTo(d, CV_32F);
+        benchmark::DoNotOptimize(dst.data());
+    }
+}
+
 // ---- Hamming window of 1024 samples ----
 std::vector<float> hammingTable(int n) {
     std::vector<float> w(n);
@@ -132,6 +152,8 @@ void cvHamming(benchmark::State& state) {
 ZB_PAIR(cvt_32f16s, "zorsConvert_32f16s_Sfs RoundNear sf 0, 64Ki", zorConvert32f16s, cvConvert32f16s,
         "cv::Mat::convertTo(CV_16S)", 1.0);
 ZB_PAIR(cvt_16s32f, "zorsConvert_16s32f 64Ki", zorConvert16s32f, cvConvert16s32f,
+        "cv::Mat::convertTo(CV_32F)", 1.0);
+ZB_PAIR(cvt_8u32f_vec, "zorsConvert_8u32f 64Ki", zorConvert8u32f, cvConvert8u32f,
         "cv::Mat::convertTo(CV_32F)", 1.0);
 ZB_PAIR(win_hamming, "zorsWinHamming_32f 1024", zorHamming, loopHamming,
         "loop over a precomputed window", 2.0);

@@ -1754,6 +1754,59 @@ struct Isa<32> : Halves<32> {
         const __m256 both = _mm256_insertf128_ps(_mm256_castps128_ps256(_mm256_cvtpd_ps(lo)), _mm256_cvtpd_ps(hi), 1);
         return _mm256_castpd_ps(blockPairsTogether(_mm256_castps_pd(both)));
     }
+
+    // Reinterprets the bits (one register, no instruction).
+    template <class To, class From>
+    static R<To> bitcast(R<From> a) {
+        if constexpr (std::is_same_v<To, From> || (std::is_integral_v<To> && std::is_integral_v<From>)) return a;
+        else if constexpr (isF<To> && isD<From>) return _mm256_castpd_ps(a);
+        else if constexpr (isD<To> && isF<From>) return _mm256_castps_pd(a);
+        else if constexpr (isF<To>) return _mm256_castsi256_ps(a);
+        else if constexpr (isD<To>) return _mm256_castsi256_pd(a);
+        else if constexpr (isF<From>) return _mm256_castps_si256(a);
+        else return _mm256_castpd_si256(a);
+    }
+
+    // -- whole-register lane order: vpmovsx / vpmovzx, and packs whose
+    // 64-bit chunks are put back in order
+    template <class T, class Half>
+    static R<Wider<T>> widenHalf(Half h) {
+        if constexpr (isF<T>) return _mm256_cvtps_pd(h);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm256_cvtepi8_epi16(h);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm256_cvtepu8_epi16(h);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm256_cvtepi16_epi32(h);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm256_cvtepu16_epi32(h);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm256_cvtepi32_epi64(h);
+        else return _mm256_cvtepu32_epi64(h);
+    }
+    template <class T>
+    static R<Wider<T>> widenLoInOrder(R<T> a) { return widenHalf<T>(lo<T>(a)); }
+    template <class T>
+    static R<Wider<T>> widenHiInOrder(R<T> a) { return widenHalf<T>(hi<T>(a)); }
+    template <class W, class N>
+    static R<W> loadWidened(const N* p) {
+        return widenHalf<N>(H::template load<N>(p));
+    }
+    template <class To, class From>
+    static constexpr bool kPacksInOrder =
+        std::is_same_v<From, int32_t> ? (std::is_same_v<To, int16_t> || std::is_same_v<To, uint16_t>)
+                                      : std::is_same_v<From, int16_t> && (std::is_same_v<To, int8_t> || std::is_same_v<To, uint8_t>);
+    template <class To, class From>
+    static R<To> narrowSatInOrder(R<From> l, R<From> h) {
+        if constexpr (isD<From>) {
+            return join<float>(_mm256_cvtpd_ps(l), _mm256_cvtpd_ps(h));
+        } else if constexpr (kPacksInOrder<To, From>) {
+            __m256i packed;
+            if constexpr (std::is_same_v<To, int16_t>) packed = _mm256_packs_epi32(l, h);
+            else if constexpr (std::is_same_v<To, uint16_t>) packed = _mm256_packus_epi32(l, h);
+            else if constexpr (std::is_same_v<To, int8_t>) packed = _mm256_packs_epi16(l, h);
+            else packed = _mm256_packus_epi16(l, h);
+            return _mm256_permute4x64_epi64(packed, _MM_SHUFFLE(3, 1, 2, 0));
+        } else {
+            return join<To>(H::template narrowSat<To, From>(lo<From>(l), hi<From>(l)),
+                            H::template narrowSat<To, From>(lo<From>(h), hi<From>(h)));
+        }
+    }
 };
 
 #  if ZOR_WIDTH >= 64
@@ -2049,6 +2102,58 @@ struct Isa<64> : Halves<64> {
         const __m512 both = _mm512_insertf32x8(_mm512_castps256_ps512(_mm512_cvtpd_ps(lo)), _mm512_cvtpd_ps(hi), 1);
         return _mm512_castpd_ps(blockPairsApart(_mm512_castps_pd(both)));
     }
+
+    // Reinterprets the bits (one register, no instruction).
+    template <class To, class From>
+    static R<To> bitcast(R<From> a) {
+        if constexpr (std::is_same_v<To, From> || (std::is_integral_v<To> && std::is_integral_v<From>)) return a;
+        else if constexpr (isF<To> && isD<From>) return _mm512_castpd_ps(a);
+        else if constexpr (isD<To> && isF<From>) return _mm512_castps_pd(a);
+        else if constexpr (isF<To>) return _mm512_castsi512_ps(a);
+        else if constexpr (isD<To>) return _mm512_castsi512_pd(a);
+        else if constexpr (isF<From>) return _mm512_castps_si512(a);
+        else return _mm512_castpd_si512(a);
+    }
+
+    // -- whole-register lane order (see Isa<32>)
+    template <class T, class Half>
+    static R<Wider<T>> widenHalf(Half h) {
+        if constexpr (isF<T>) return _mm512_cvtps_pd(h);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm512_cvtepi8_epi16(h);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm512_cvtepu8_epi16(h);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm512_cvtepi16_epi32(h);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm512_cvtepu16_epi32(h);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm512_cvtepi32_epi64(h);
+        else return _mm512_cvtepu32_epi64(h);
+    }
+    template <class T>
+    static R<Wider<T>> widenLoInOrder(R<T> a) { return widenHalf<T>(lo<T>(a)); }
+    template <class T>
+    static R<Wider<T>> widenHiInOrder(R<T> a) { return widenHalf<T>(hi<T>(a)); }
+    template <class W, class N>
+    static R<W> loadWidened(const N* p) {
+        return widenHalf<N>(Isa<32>::template load<N>(p));
+    }
+    template <class To, class From>
+    static constexpr bool kPacksInOrder =
+        std::is_same_v<From, int32_t> ? (std::is_same_v<To, int16_t> || std::is_same_v<To, uint16_t>)
+                                      : std::is_same_v<From, int16_t> && (std::is_same_v<To, int8_t> || std::is_same_v<To, uint8_t>);
+    template <class To, class From>
+    static R<To> narrowSatInOrder(R<From> l, R<From> h) {
+        if constexpr (isD<From>) {
+            return join<float>(_mm512_cvtpd_ps(l), _mm512_cvtpd_ps(h));
+        } else if constexpr (kPacksInOrder<To, From>) {
+            __m512i packed;
+            if constexpr (std::is_same_v<To, int16_t>) packed = _mm512_packs_epi32(l, h);
+            else if constexpr (std::is_same_v<To, uint16_t>) packed = _mm512_packus_epi32(l, h);
+            else if constexpr (std::is_same_v<To, int8_t>) packed = _mm512_packs_epi16(l, h);
+            else packed = _mm512_packus_epi16(l, h);
+            return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), packed);
+        } else {
+            return join<To>(Isa<32>::template narrowSatInOrder<To, From>(lo<From>(l), hi<From>(l)),
+                            Isa<32>::template narrowSatInOrder<To, From>(lo<From>(h), hi<From>(h)));
+        }
+    }
 };
 #  endif  // ZOR_WIDTH >= 64
 #endif  // ZOR_WIDTH >= 32
@@ -2098,6 +2203,14 @@ inline void storeHalf(T* p, Vec<T, B> v) { Isa<B>::template storeHalf<T>(p, v.ra
 // Non-temporal store to memory aligned to the register width.
 template <class T, int B>
 inline void stream(T* p, Vec<T, B> v) { Isa<B>::template stream<T>(p, v.raw); }
+// Orders the non-temporal stores before it ahead of every later store: a
+// kernel that streams calls it once before it returns, so that its results
+// are seen like those of plain stores.
+inline void streamFence() {
+#if ZOR_SIMD >= 1
+    _mm_sfence();
+#endif
+}
 
 // Brings the cache line holding p closer; p may lie beyond the data.
 template <class V>
@@ -2262,6 +2375,26 @@ template <class To, class From, int B>
 inline Vec<To, B> narrowSat(Vec<From, B> lo, Vec<From, B> hi) {
     if constexpr (std::is_same_v<From, double>) return {Isa<B>::doubleToFloat(lo.raw, hi.raw)};
     else return {Isa<B>::template narrowSat<To, From>(lo.raw, hi.raw)};
+}
+// The same in the lane order of the whole register (equal to widenLo /
+// widenHi and narrowSat in 16-byte registers): the lower (upper) half of
+// a's lanes widened, and lo's lanes followed by hi's narrowed with
+// saturation.  For kernels that widen on the way in or narrow on the way
+// out (conversions between memory of two lane sizes).
+template <class T, int B>
+inline Vec<Wider<T>, B> widenLoInOrder(Vec<T, B> a) {
+    if constexpr (B == 16) return widenLo(a);
+    else return {Isa<B>::template widenLoInOrder<T>(a.raw)};
+}
+template <class T, int B>
+inline Vec<Wider<T>, B> widenHiInOrder(Vec<T, B> a) {
+    if constexpr (B == 16) return widenHi(a);
+    else return {Isa<B>::template widenHiInOrder<T>(a.raw)};
+}
+template <class To, class From, int B>
+inline Vec<To, B> narrowSatInOrder(Vec<From, B> lo, Vec<From, B> hi) {
+    if constexpr (B == 16) return narrowSat<To>(lo, hi);
+    else return {Isa<B>::template narrowSatInOrder<To, From>(lo.raw, hi.raw)};
 }
 // V::kLanes values of the lane type half as wide from p, widened in order
 // (zero- or sign-extended by N's signedness; floats to double).

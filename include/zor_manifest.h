@@ -268,9 +268,9 @@ ZOR_FN(ZOR_GENERIC, Status, zorsCopy_64f,  (const double* pSrc, double* pDst, in
 ZOR_FN(ZOR_GENERIC, Status, zorsCopy_64fc, (const Complex64f* pSrc, Complex64f* pDst, int len))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_8s16s,  (const int8_t* pSrc, int16_t* pDst, int len))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_16s32s, (const int16_t* pSrc, int32_t* pDst, int len))
-ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_8u32f,  (const uint8_t* pSrc, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsConvert_8u32f,  (const uint8_t* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_8s32f,  (const int8_t* pSrc, float* pDst, int len))
-ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_16s32f, (const int16_t* pSrc, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsConvert_16s32f, (const int16_t* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_16u32f, (const uint16_t* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_32s32f, (const int32_t* pSrc, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_32s64f, (const int32_t* pSrc, double* pDst, int len))
@@ -281,7 +281,7 @@ ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_32f8s_Sfs,
        (const float* pSrc, int8_t* pDst, int len, int rndMode, int scaleFactor))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_32f16u_Sfs,
        (const float* pSrc, uint16_t* pDst, int len, int rndMode, int scaleFactor))
-ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_32f16s_Sfs,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsConvert_32f16s_Sfs,
        (const float* pSrc, int16_t* pDst, int len, int rndMode, int scaleFactor))
 ZOR_FN(ZOR_SSE2UP, Status, zorsConvert_32f32s_Sfs,
        (const float* pSrc, int32_t* pDst, int len, int rndMode, int scaleFactor))

@@ -12,6 +12,8 @@
 #include "frame/simd.h"
 #include "image/pixel/pixel_rows.h"
 
+#include <algorithm>
+
 #if ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
 namespace zor { namespace ZOR_NS {
@@ -52,7 +54,10 @@ ptrdiff_t widen8u16uSimd(const uint8_t* s, uint16_t* d, ptrdiff_t n) {
     });
 }
 
-// Sixteen bytes to sixteen floats, each byte zero-extended into a 32-bit lane.
+// Sixteen bytes to sixteen floats, each byte zero-extended into a 32-bit
+// lane.  With Stream the floats go out with non-temporal stores (d 16-byte
+// aligned).
+template <bool Stream = false>
 inline void bytesToFloat16(const uint8_t* s, float* d) {
     using namespace simd;
     const U8x16 v = load<U8x16>(s);
@@ -73,11 +78,15 @@ inline void bytesToFloat16(const uint8_t* s, float* d) {
     lanes[2] = bitcast<int32_t>(widenLo(hi));
     lanes[3] = bitcast<int32_t>(widenHi(hi));
 #  endif
-    for (int q = 0; q < 4; ++q) store(d + 4 * q, toFloat(lanes[q]));
+    for (int q = 0; q < 4; ++q) {
+        if constexpr (Stream) stream(d + 4 * q, toFloat(lanes[q]));
+        else store(d + 4 * q, toFloat(lanes[q]));
+    }
 }
 
+template <bool Stream = false>
 ptrdiff_t u8ToFloatSimd(const uint8_t* s, float* d, ptrdiff_t n) {
-    return eachBlock<16>(n, [&](ptrdiff_t x) { bytesToFloat16(s + x, d + x); });
+    return eachBlock<16>(n, [&](ptrdiff_t x) { bytesToFloat16<Stream>(s + x, d + x); });
 }
 
 ptrdiff_t s16ToFloatSimd(const int16_t* s, float* d, ptrdiff_t n) {
@@ -176,6 +185,21 @@ void toFloatRow(const S* s, float* d, ptrdiff_t n) {
 }
 
 #if ZOR_SIMD >= 2
+// Bytes to floats with non-temporal stores from the first 16-byte aligned
+// float on (the caller fences after the last row).
+void toFloatRowStreamed(const uint8_t* s, float* d, ptrdiff_t n) {
+    ptrdiff_t x = 0;
+    const uintptr_t a = reinterpret_cast<uintptr_t>(d);
+    if ((a & 3) == 0) {
+        const ptrdiff_t head = std::min<ptrdiff_t>(n, static_cast<ptrdiff_t>((16 - (a & 15)) & 15) / 4);
+        for (; x < head; ++x) d[x] = static_cast<float>(s[x]);
+        x += u8ToFloatSimd<true>(s + x, d + x, n - x);
+    }
+    toFloatRow(s + x, d + x, n - x);
+}
+#endif
+
+#if ZOR_SIMD >= 2
 using RowScope = ConversionScope;
 #else
 struct RowScope {};  // the generic rule needs no state
@@ -248,6 +272,13 @@ Status ZOR_CALL zoriConvert_8u16u_C4R(const uint8_t* pSrc, int srcStep, uint16_t
 }
 Status ZOR_CALL zoriConvert_8u32f_C1R(const uint8_t* pSrc, int srcStep, float* pDst, int dstStep,
                                       ImageSize roiSize) {
+#if ZOR_SIMD >= 2
+    if (streamsOutput(roiSize, sizeof(float))) {
+        const Status s = convert<uint8_t, float, 1>(pSrc, srcStep, pDst, dstStep, roiSize, toFloatRowStreamed);
+        simd::streamFence();
+        return s;
+    }
+#endif
     return convert<uint8_t, float, 1>(pSrc, srcStep, pDst, dstStep, roiSize, toFloatRow<uint8_t>);
 }
 Status ZOR_CALL zoriConvert_16s32f_C1R(const int16_t* pSrc, int srcStep, float* pDst, int dstStep,

@@ -159,6 +159,16 @@ Status setC3(const T* value, T* pDst, int dstStep, ImageSize roi) {
     const E v[3] = {Word<T>(value[0]), Word<T>(value[1]), Word<T>(value[2])};
     const Rows r = rowsOf(roi, 1, packed(dstStep, roi, 3 * sizeof(T)));
 #if ZOR_SIMD >= 2
+    if (streamsOutput(roi, 3 * sizeof(T))) {
+        uint8_t pixel[3 * sizeof(E)];
+        std::memcpy(pixel, v, sizeof pixel);
+        eachRow(r.count, [&](int y) {
+            fillStreamed(reinterpret_cast<uint8_t*>(rowAt(pDst, dstStep, y)), r.elems * ptrdiff_t(3 * sizeof(E)), pixel,
+                         int(sizeof pixel));
+        });
+        simd::streamFence();
+        return StatusOk;
+    }
     alignas(16) E pattern[48 / sizeof(E)];
     for (size_t i = 0; i < 48 / sizeof(E); ++i) pattern[i] = v[i % 3];
     Bytes16 p[3];

@@ -10,6 +10,7 @@
 #include "image/pixel/pixel_rows.h"
 #include "image/pixel/shuffle48.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -92,6 +93,23 @@ void swapRow(const E* s, E* d, ptrdiff_t n, int C, const int (&o)[3]) {
 // elements) over the first bytes of d; returns the bytes written (whole blocks).
 inline ptrdiff_t fill48(uint8_t* d, ptrdiff_t bytes, const Bytes16 (&p)[3]) {
     return eachBlock<48>(bytes, [&](ptrdiff_t i) { simd::storeBlock(d + i, p); });
+}
+
+// Fills `bytes` bytes at d with repeats of a pattern of `period` bytes (a
+// divisor of 48): its 16-byte aligned part with non-temporal stores (the
+// caller fences after the last row), the bytes before and after it one by
+// one.
+inline void fillStreamed(uint8_t* d, ptrdiff_t bytes, const uint8_t* pattern, int period) {
+    const ptrdiff_t head = std::min<ptrdiff_t>(bytes, static_cast<ptrdiff_t>((16 - (reinterpret_cast<uintptr_t>(d) & 15)) & 15));
+    ptrdiff_t i = 0;
+    for (; i < head; ++i) d[i] = pattern[i % period];
+    alignas(16) uint8_t phased[48];
+    for (int j = 0; j < 48; ++j) phased[j] = pattern[(head + j) % period];
+    Bytes16 p[3];
+    simd::loadBlock(phased, p);
+    for (; i + 48 <= bytes; i += 48)
+        for (int k = 0; k < 3; ++k) simd::stream(d + i + 16 * k, p[k]);
+    for (; i < bytes; ++i) d[i] = pattern[i % period];
 }
 
 template <class E>

@@ -31,6 +31,20 @@ inline bool packed(int step, ImageSize roi, int bytesPerPixel) {
     return static_cast<int64_t>(step) == static_cast<int64_t>(roi.width) * bytesPerPixel;
 }
 
+// Outputs of more bytes than this are written with non-temporal stores by
+// the movers that have them (the fill of three-element pixels, bytes to
+// floats): an output that large would mostly push other data out of the
+// last-level cache, and plain stores would read every line from memory
+// before writing it.  Outputs that fit in the cache stay there (plain
+// stores into a 32 MiB last-level cache ran twice as fast as streaming
+// 6-8 MiB images to memory); 16 MiB is half of such a cache.
+constexpr int64_t kStreamBytes = int64_t(16) << 20;
+
+inline bool streamsOutput(ImageSize roi, int bytesPerPixel) {
+    return roi.width > 0 && roi.height > 0 &&
+           int64_t(roi.width) * roi.height * bytesPerPixel > kStreamBytes;
+}
+
 // Calls block(x) for x = 0, Block, 2 Block, ... while a whole block fits in
 // n and returns where it stopped.  Two blocks per iteration: half the loop
 // overhead, and the loads of the next block are issued before the stores of

@@ -95,59 +95,60 @@ constexpr ByteFloatTable kByteFloat;
 #  endif
 
 #  if ZOR_SIMD >= 2
-// One step of each widening conversion from a 16-byte register of sources
-// (the widened halves are stored in order); returns the elements done.
+// One step of each widening conversion: a register of sources at the
+// column's width (widened in lane order, so any width gives the elements in
+// order); returns the elements done.  32s to 64f keeps 16-byte registers,
+// its int-to-double conversions work per 16-byte block.
 template <class S, class D>
 inline int widenBlock(const S* s, D* d) {
     using namespace simd;
-    using V = Vec<S, 16>;
-    if constexpr (sizeof(S) == 1) {  // 8u/8s to 16s or 32f: 16 elements
-        const V v = load<V>(s);
-        const auto lo = bitcast<int16_t>(widenLo(v)), hi = bitcast<int16_t>(widenHi(v));
-        if constexpr (sizeof(D) == 2) {
-            store(d, lo);
-            store(d + 8, hi);
-        } else {
-            store(d, toFloat(widenLo(lo)));
-            store(d + 4, toFloat(widenHi(lo)));
-            store(d + 8, toFloat(widenLo(hi)));
-            store(d + 12, toFloat(widenHi(hi)));
-        }
-        return 16;
-    } else if constexpr (sizeof(S) == 2 && std::is_same_v<D, float>) {
-        // 16s/16u to 32f, 16 elements: the 16 bits (made unsigned) become
-        // the low mantissa of 2^23, and subtracting 2^23 (plus the bias)
-        // leaves the value exactly; fewer steps than extend-and-convert.
-        using W = Vec<uint16_t, 16>;
-        using F = Vec<float, 16>;
-        const W flip = set1<W>(std::is_signed_v<S> ? 0x8000 : 0), high = set1<W>(0x4B00);
-        const F base = set1<F>(std::is_signed_v<S> ? 8388608.0f + 32768.0f : 8388608.0f);
-        const W v0 = bitcast<uint16_t>(load<V>(s)) ^ flip, v1 = bitcast<uint16_t>(load<V>(s + 8)) ^ flip;
-        store(d, bitcast<float>(zipLo(v0, high)) - base);
-        store(d + 4, bitcast<float>(zipHi(v0, high)) - base);
-        store(d + 8, bitcast<float>(zipLo(v1, high)) - base);
-        store(d + 12, bitcast<float>(zipHi(v1, high)) - base);
-        return 16;
-    } else if constexpr (sizeof(S) == 2) {  // 16s/16u to 32s: 16 elements
-        const V v0 = load<V>(s), v1 = load<V>(s + 8);
-        store(d, bitcast<D>(widenLo(v0)));
-        store(d + 4, bitcast<D>(widenHi(v0)));
-        store(d + 8, bitcast<D>(widenLo(v1)));
-        store(d + 12, bitcast<D>(widenHi(v1)));
-        return 16;
-    } else if constexpr (std::is_same_v<D, float>) {  // 32s to 32f
-        store(d, toFloat(load<V>(s)));
-        store(d + 4, toFloat(load<V>(s + 4)));
-        return 8;
-    } else if constexpr (std::is_same_v<D, double>) {  // 32s to 64f
+    if constexpr (std::is_same_v<D, double>) {  // 32s to 64f
+        using V = Vec<S, 16>;
         const V v = load<V>(s);
         store(d, toDoubleLo(v));
         store(d + 2, toDoubleHi(v));
         return 4;
-    } else {  // 32s to 16s, saturating
-        store(d, narrowSat<int16_t>(load<V>(s), load<V>(s + 4)));
-        return 8;
+    } else if constexpr (sizeof(S) == 4) {
+        using V = Vec<S>;
+        constexpr int L = V::kLanes;
+        if constexpr (std::is_same_v<D, float>) {  // 32s to 32f
+            store(d, toFloat(load<V>(s)));
+            store(d + L, toFloat(load<V>(s + L)));
+        } else {  // 32s to 16s, saturating
+            store(d, narrowSatInOrder<int16_t>(load<V>(s), load<V>(s + L)));
+        }
+        return 2 * L;
+    } else {
+        // 8 and 16-bit sources: widened to twice their size (8u/8s to 16s),
+        // or on to 32 bits and converted to float (exact)
+        using V = Vec<S>;
+        constexpr int L = V::kLanes;
+        const V v = load<V>(s);
+        const auto lo = widenLoInOrder(v), hi = widenHiInOrder(v);
+        if constexpr (std::is_integral_v<D>) {
+            store(d, bitcast<D>(lo));
+            store(d + L / 2, bitcast<D>(hi));
+        } else if constexpr (sizeof(S) == 2) {
+            store(d, toFloat(bitcast<int32_t>(lo)));
+            store(d + L / 2, toFloat(bitcast<int32_t>(hi)));
+        } else {
+            const auto widen = [&](auto h, float* out) {
+                store(out, toFloat(bitcast<int32_t>(widenLoInOrder(h))));
+                store(out + L / 4, toFloat(bitcast<int32_t>(widenHiInOrder(h))));
+            };
+            widen(lo, d);
+            widen(hi, d + L / 2);
+        }
+        return L;
     }
+}
+
+// Elements per widenBlock step.
+template <class S, class D>
+constexpr int widenStep() {
+    if constexpr (std::is_same_v<D, double>) return 4;
+    else if constexpr (sizeof(S) == 4) return 2 * simd::Vec<S>::kLanes;
+    else return simd::Vec<S>::kLanes;
 }
 #  endif
 
@@ -156,7 +157,7 @@ Status widenVector(const S* pSrc, D* pDst, int len) {
     if (Status s = checkFirst(anyNull(pSrc, pDst), badLength(len))) return s;
     int i = 0;
 #  if ZOR_SIMD >= 2
-    constexpr int step = (sizeof(S) <= 2) ? 16 : (std::is_same_v<D, double> ? 4 : 8);
+    constexpr int step = widenStep<S, D>();
     for (; i + step <= len; i += step) widenBlock(pSrc + i, pDst + i);
     for (; i < len; ++i) pDst[i] = widenOne<S, D>(pSrc[i]);
 #  else
@@ -237,67 +238,81 @@ struct Narrowing {
 };
 
 #  if ZOR_SIMD >= 2
-// The blocks below hold 16 elements as four 16-byte registers of 32-bit
-// integers, packed in order.
 using F4 = simd::Vec<float, 16>;
 using I4 = simd::Vec<int32_t, 16>;
 using D2 = simd::Vec<double, 16>;
 
-// Stores four registers of 32-bit integers as D elements at d, saturating
-// to D's range.
-template <class D>
-inline void packStore(D* d, const I4 (&r)[4]) {
+// Four registers of 32-bit integers as D elements, in order, saturated to
+// D's range: sizeof(D) registers of D.
+template <class D, int B>
+struct Packed {
+    simd::Vec<D, B> v[sizeof(D)];
+};
+
+template <class D, int B>
+inline Packed<D, B> pack(const simd::Vec<int32_t, B> (&r)[4]) {
     using namespace simd;
     if constexpr (sizeof(D) == 4) {
-        for (int k = 0; k < 4; ++k) store(d + 4 * k, r[k]);
+        return {{bitcast<D>(r[0]), bitcast<D>(r[1]), bitcast<D>(r[2]), bitcast<D>(r[3])}};
     } else if constexpr (sizeof(D) == 2) {
-        store(d, narrowSat<D>(r[0], r[1]));
-        store(d + 8, narrowSat<D>(r[2], r[3]));
+        return {{narrowSatInOrder<D>(r[0], r[1]), narrowSatInOrder<D>(r[2], r[3])}};
     } else {
-        store(d, narrowSat<D>(narrowSat<int16_t>(r[0], r[1]), narrowSat<int16_t>(r[2], r[3])));
+        return {{narrowSatInOrder<D>(narrowSatInOrder<int16_t>(r[0], r[1]), narrowSatInOrder<int16_t>(r[2], r[3]))}};
     }
 }
 
-// Float sources, unscaled, 16 elements.  Ties to even come from the
+template <class D, int B>
+inline void store(D* d, const Packed<D, B>& p) {
+    for (size_t k = 0; k < sizeof(D); ++k) simd::store(d + k * simd::Vec<D, B>::kLanes, p.v[k]);
+}
+
+// Float sources, unscaled: four registers at the column's width, the
+// conversions in lane order at any width.  Ties to even come from the
 // conversion itself (round to nearest, as float sources are exact).
 //
 // cvtps2dq (or cvttps2dq) is right for every input it can represent, and
 // the packs saturate to D's range; the clamps before it take care of the
-// rest (NaN, values outside the int32 range): min(hi, x) keeps a NaN (the second operand wins), which the
-// conversion turns into INT_MIN and the signed packs into the lowest value;
-// max(x, 0) turns a NaN into 0 for unsigned destinations.  For 32s the
-// conversion's INT_MIN at and above 2^31 is flipped to INT_MAX.
-template <class D, bool Nearest>
-inline void narrowFloatBlock(const float* s, D* d) {
-    using namespace simd;
-    using L = std::numeric_limits<D>;
-    I4 r[4];
-    for (int k = 0; k < 4; ++k) {
-        F4 x = load<F4>(s + 4 * k);
-        I4 over = zero<I4>();
-        if constexpr (sizeof(D) == 4) {
-            over = bitcast<int32_t>(ge(x, set1<F4>(2147483648.0f)));
-        } else {
-            if constexpr (!std::is_signed_v<D>) x = max(x, zero<F4>());
-            x = min(set1<F4>(float(L::max())), x);
-        }
-        r[k] = Nearest ? toInt32(x) : toInt32Trunc(x);
-        if constexpr (sizeof(D) == 4) r[k] = r[k] ^ over;
-    }
-    packStore(d, r);
-}
-
+// rest (NaN, values outside the int32 range): min(hi, x) keeps a NaN (the
+// second operand wins), which the conversion turns into INT_MIN and the
+// signed packs into the lowest value; max(x, 0) turns a NaN into 0 for
+// unsigned destinations.  For 32s the conversion's INT_MIN at and above
+// 2^31 is flipped to INT_MAX.
 template <class D, bool Nearest>
 void narrowFloatRun(const float* s, D* d, int n) {
-    for (int i = 0; i + 16 <= n; i += 16) narrowFloatBlock<D, Nearest>(s + i, d + i);
+    using namespace simd;
+    using F = Vec<float>;
+    using I = Vec<int32_t>;
+    using L = std::numeric_limits<D>;
+    for (int i = 0; i + 4 * F::kLanes <= n; i += 4 * F::kLanes) {
+        I r[4];
+        for (int k = 0; k < 4; ++k) {
+            F x = load<F>(s + i + k * F::kLanes);
+            I over = zero<I>();
+            if constexpr (sizeof(D) == 4) {
+                over = bitcast<int32_t>(ge(x, set1<F>(2147483648.0f)));
+            } else {
+                if constexpr (!std::is_signed_v<D>) x = max(x, zero<F>());
+                x = min(set1<F>(float(L::max())), x);
+            }
+            r[k] = Nearest ? toInt32(x) : toInt32Trunc(x);
+            if constexpr (sizeof(D) == 4) r[k] = r[k] ^ over;
+        }
+        store(d + i, pack<D>(r));
+    }
 }
 
-// The first n elements (a multiple of 16), clamped on the way: the clamps
-// cost a compare or two per register, far less than the memory traffic, and
-// give every input its value without consulting the processor's status
-// flags (which tools such as valgrind do not model).  With the invalid
-// exception unmasked, where a SIMD conversion of a NaN would trap, nothing
-// is done here and the caller's element loop does it all.
+// The elements a run of narrowFloatRun converts: whole blocks.
+inline int narrowFloatBlocks(int len) {
+    constexpr int kBlock = 4 * simd::Vec<float>::kLanes;
+    return len - len % kBlock;
+}
+
+// The first n elements (whole blocks), clamped on the way: the clamps cost
+// a compare or two per register, and give every input its value without
+// consulting the processor's status flags (which tools such as valgrind do
+// not model).  With the invalid exception unmasked, where
+// a SIMD conversion of a NaN would trap, nothing is done here and the
+// caller's element loop does it all.
 template <class D, bool Nearest>
 int narrowFloats(const float* s, D* d, int n) {
     ConversionScope nearestEven;
@@ -359,7 +374,7 @@ inline void narrowScaledBlock(const S* s, D* d, D2 mult, bool scaled, bool neare
         }
         r[k] = narrowDoubles<D>(x0, x1, nearest);
     }
-    packStore(d, r);
+    store(d, pack<D>(r));
 }
 #  endif
 
@@ -373,8 +388,8 @@ Status narrowVector(const S* pSrc, D* pDst, int len, int rndMode, int scaleFacto
     bool done = false;
     if constexpr (std::is_same_v<S, float>) {
         if (!one.scaled) {
-            i = one.nearest ? narrowFloats<D, true>(pSrc, pDst, len & ~15)
-                            : narrowFloats<D, false>(pSrc, pDst, len & ~15);
+            const int blocks = narrowFloatBlocks(len);
+            i = one.nearest ? narrowFloats<D, true>(pSrc, pDst, blocks) : narrowFloats<D, false>(pSrc, pDst, blocks);
             done = true;
         }
     }

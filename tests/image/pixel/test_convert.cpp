@@ -65,6 +65,18 @@ TEST_P(Convert, Widening) {
 
 // Both modes against the exact rule on the samples, the rare values alone
 // among ordinary ones in every position of a block.
+// Outputs of more than 16 MiB go out with non-temporal stores from the
+// first 16-byte aligned float of each row on.
+TEST_P(Convert, LargeWidening) {
+    Img<uint8_t> s(2100, 2100, 0, 3);
+    s.fill([](int x, int y) { return (x * 7 + y * 3) & 255; });
+    Img<float> d(2100, 2100, 0, 4);
+    ASSERT_EQ(z().zoriConvert_8u32f_C1R(s.roi(), s.step(), d.roi(), d.step(), {2100, 2100}), StatusOk);
+    for (int y = 0; y < d.height(); ++y)
+        for (int x = 0; x < d.width(); ++x) ASSERT_EQ(*d.at(x, y), float((x * 7 + y * 3) & 255)) << x << ", " << y;
+    EXPECT_TRUE(d.outsideIntact());
+}
+
 TEST_P(Convert, FloatTo8u) {
     for (int mode : {1, 0, 2, -1})
         EXPECT_TRUE((movesAsExpected<float, uint8_t>(

@@ -180,6 +180,16 @@ TEST_P(Copy, Fills) {
     for (uint32_t w : out) EXPECT_EQ(w, bits);
 }
 
+// Fills above 16 MiB stream from each row's first 16-byte aligned byte on.
+TEST_P(Copy, LargeFills) {
+    const uint8_t v[3] = {1, 128, 255};
+    Img<uint8_t> d(3 * 2400, 2400, 0, 5);
+    ASSERT_EQ(z().zoriSet_8u_C3R(v, d.roi(), d.step(), {2400, 2400}), StatusOk);
+    for (int y = 0; y < 2400; ++y)
+        for (int x = 0; x < 3 * 2400; ++x) ASSERT_EQ(*d.at(x, y), v[x % 3]) << x << ", " << y;
+    EXPECT_TRUE(d.outsideIntact());
+}
+
 // D[k] = S[o[k]] on three- or four-element pixels (alpha neither read nor
 // written), in place too.
 TEST_P(Copy, SwapChannels) {
