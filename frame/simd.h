@@ -1755,18 +1755,6 @@ struct Isa<32> : Halves<32> {
         return _mm256_castpd_ps(blockPairsTogether(_mm256_castps_pd(both)));
     }
 
-    // Reinterprets the bits (one register, no instruction).
-    template <class To, class From>
-    static R<To> bitcast(R<From> a) {
-        if constexpr (std::is_same_v<To, From> || (std::is_integral_v<To> && std::is_integral_v<From>)) return a;
-        else if constexpr (isF<To> && isD<From>) return _mm256_castpd_ps(a);
-        else if constexpr (isD<To> && isF<From>) return _mm256_castps_pd(a);
-        else if constexpr (isF<To>) return _mm256_castsi256_ps(a);
-        else if constexpr (isD<To>) return _mm256_castsi256_pd(a);
-        else if constexpr (isF<From>) return _mm256_castps_si256(a);
-        else return _mm256_castpd_si256(a);
-    }
-
     // -- whole-register lane order: vpmovsx / vpmovzx, and packs whose
     // 64-bit chunks are put back in order
     template <class T, class Half>
@@ -2101,18 +2089,6 @@ struct Isa<64> : Halves<64> {
     static __m512 doubleToFloat(__m512d lo, __m512d hi) {
         const __m512 both = _mm512_insertf32x8(_mm512_castps256_ps512(_mm512_cvtpd_ps(lo)), _mm512_cvtpd_ps(hi), 1);
         return _mm512_castpd_ps(blockPairsApart(_mm512_castps_pd(both)));
-    }
-
-    // Reinterprets the bits (one register, no instruction).
-    template <class To, class From>
-    static R<To> bitcast(R<From> a) {
-        if constexpr (std::is_same_v<To, From> || (std::is_integral_v<To> && std::is_integral_v<From>)) return a;
-        else if constexpr (isF<To> && isD<From>) return _mm512_castpd_ps(a);
-        else if constexpr (isD<To> && isF<From>) return _mm512_castps_pd(a);
-        else if constexpr (isF<To>) return _mm512_castsi512_ps(a);
-        else if constexpr (isD<To>) return _mm512_castsi512_pd(a);
-        else if constexpr (isF<From>) return _mm512_castps_si512(a);
-        else return _mm512_castpd_si512(a);
     }
 
     // -- whole-register lane order (see Isa<32>)
