@@ -1404,6 +1404,12 @@ struct Isa<32> : Halves<32> {
     }
     template <class T>
     static R<T> loadAligned(const T* p) { return load<T>(p); }
+    // Floats to doubles straight from memory (vcvtps2pd); other lanes by halves.
+    template <class W, class N>
+    static R<W> loadWidened(const N* p) {
+        if constexpr (isF<N>) return _mm256_cvtps_pd(_mm_loadu_ps(p));
+        else return Base::loadWidened<W, N>(p);
+    }
     template <class T>
     static void store(T* p, R<T> v) {
         if constexpr (isF<T>) _mm256_storeu_ps(p, v);
@@ -1590,6 +1596,11 @@ struct Isa<64> : Halves<64> {
     }
     template <class T>
     static R<T> loadAligned(const T* p) { return load<T>(p); }
+    template <class W, class N>
+    static R<W> loadWidened(const N* p) {
+        if constexpr (isF<N>) return _mm512_cvtps_pd(_mm256_loadu_ps(p));
+        else return Base::loadWidened<W, N>(p);
+    }
     template <class T>
     static void store(T* p, R<T> v) {
         if constexpr (isF<T>) _mm512_storeu_ps(p, v);
