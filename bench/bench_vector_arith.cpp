@@ -110,6 +110,52 @@ void cvDot(benchmark::State& state) {
     }
 }
 
+// ---- exactness-matched peers ----
+// Plain loops with zor's rule (double products and sums, one rounding at the
+// end), compiled for the widest registers the compiler has; the clone the
+// processor supports is chosen at load.  Built with -fno-math-errno so that
+// sqrt vectorizes.
+#if defined(__x86_64__) && defined(__GNUC__) && !defined(__clang__)
+#  define ZB_WIDEST_CLONES __attribute__((target_clones("avx512f", "avx2", "default")))
+#else
+#  define ZB_WIDEST_CLONES
+#endif
+
+// 32 double partial sums, so the compiler may keep four 512-bit registers.
+ZB_WIDEST_CLONES double dotInDouble(const float* a, const float* b, int n) {
+    double s[32] = {};
+    int i = 0;
+    for (; i + 32 <= n; i += 32)
+        for (int j = 0; j < 32; ++j) s[j] += double(a[i + j]) * double(b[i + j]);
+    double t = 0;
+    for (double x : s) t += x;
+    for (; i < n; ++i) t += double(a[i]) * double(b[i]);
+    return t;
+}
+
+ZB_WIDEST_CLONES void magnitudeInDouble(const Complex32f* c, float* d, int n) {
+    for (int i = 0; i < n; ++i) {
+        const double re = c[i].re, im = c[i].im;
+        d[i] = static_cast<float>(std::sqrt(re * re + im * im));
+    }
+}
+
+void loopDot(benchmark::State& state) {
+    auto a = randomFloats(kLen, 1, -1, 1), b = randomFloats(kLen, 2, -1, 1);
+    for (auto _ : state) {
+        float r = static_cast<float>(dotInDouble(a.data(), b.data(), kLen));
+        benchmark::DoNotOptimize(r);
+    }
+}
+void loopMagnitude(benchmark::State& state) {
+    auto c = randomFloats(2 * kLen, 1, -100, 100);
+    std::vector<float> d(kLen);
+    for (auto _ : state) {
+        magnitudeInDouble(reinterpret_cast<const Complex32f*>(c.data()), d.data(), kLen);
+        benchmark::DoNotOptimize(d.data());
+    }
+}
+
 // ---- magnitude of interleaved complex data ----
 void zorMagnitude(benchmark::State& state) {
     auto c = randomFloats(2 * kLen, 1, -100, 100);
@@ -233,6 +279,8 @@ ZB_PAIR(vmulc, "zorsMulC_32f 64Ki", zorMulC, cvMulC, "cv::multiply by scalar", 1
 ZB_PAIR(vmulnr, "zorsMul_NR_16s_Sfs 64Ki sf=12", zorMulNR, cvMul16s, "cv::multiply 16s scale 1/4096", 1.0);
 ZB_PAIR(vdot, "zorsDotProd_32f 64Ki", zorDot, cvDot, "cv::Mat::dot", 1.5);
 ZB_PAIR(vmag, "zorsMagnitude_32fc 64Ki", zorMagnitude, cvMagnitude, "cv::magnitude", 1.5);
+ZB_PAIR(vdotd, "zorsDotProd_32f 64Ki (same rule)", zorDot, loopDot, "double-accumulating loop", 0);
+ZB_PAIR(vmagd, "zorsMagnitude_32fc 64Ki (same rule)", zorMagnitude, loopMagnitude, "double-precision loop", 0);
 ZB_PAIR(vphase, "zorsPhase_32f 64Ki", zorPhase, cvPhase, "cv::phase", 2.0);
 ZB_PAIR(vln, "zorsLn_32f_I 64Ki (+copy)", zorLn, cvLn, "cv::log (+copy)", 1.5);
 ZB_PAIR(vlnexact, "zorsLn_32f_I 64Ki (+copy), same results", zorLn, exactLn, "float(std::log(double)) loop (+copy)", 0);

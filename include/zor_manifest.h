@@ -330,7 +330,22 @@ ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsAtan2_32f_A21,    (const float* pSrc1, const
 ZOR_FN(ZOR_GENERIC, Status, zorsSortDescend_32f_I, (float* pSrcDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsDeinterleave_16s, (const int16_t* pSrc, int channels, int len, int16_t** pDst))
 
-/* ---- signal/vector/stats ---- */
+/* ---- signal/vector/stats ----
+ * The float reductions accumulate in double in a fixed order, the same in
+ * every variant and column, so every processor gives the same bits.
+ * Sum, mean, standard deviation: two partial sums, the even and the odd
+ * elements of each group of four, added together, then the remainder.
+ * zorsDotProd_32f, zorsNorm_L2_32f, zorsNormDiff_L2_32f: the terms (products,
+ * squares, squared differences, exact in double for products and squares)
+ * go to 32 partial sums, element i of each full block of 32 to sum i mod 32;
+ * the sums are combined by halving (s[j] + s[j + 16] for j < 16, then
+ * s[j] + s[j + 8] for j < 8, s[j] + s[j + 4], s[j] + s[j + 2], s0 + s1), and
+ * the last len mod 32 terms added one by one in index order.  The L2 norms
+ * take the square root in double; each result is rounded once to float.
+ * A NaN result of these three is the input NaN with the largest payload
+ * (bits below the sign, the first in index order among equals) among the
+ * elements read, quieted, or the default NaN where no input is a NaN.
+ * The integer reductions are exact 64-bit sums. */
 ZOR_FN(ZOR_SSE2UP,  Status, zorsSum_32f,          (const float* pSrc, int len, float* pSum, int hint))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsMean_32f,         (const float* pSrc, int len, float* pMean, int hint))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsStdDev_32f,       (const float* pSrc, int len, float* pStdDev, int hint))
@@ -341,11 +356,11 @@ ZOR_FN(ZOR_ALL,     Status, zorsMin_32f,          (const float* pSrc, int len, f
 ZOR_FN(ZOR_SSE2UP,  Status, zorsMaxIndx_16s,      (const int16_t* pSrc, int len, int16_t* pMax, int* pIndx))
 ZOR_FN(ZOR_ALL,     Status, zorsMaxIndx_32f,      (const float* pSrc, int len, float* pMax, int* pIndx))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsMaxIndx_64f,      (const double* pSrc, int len, double* pMax, int* pIndx))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsNorm_L2_32f,      (const float* pSrc, int len, float* pNorm))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNorm_L2_32f,      (const float* pSrc, int len, float* pNorm))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsNorm_L2_16s32f,   (const int16_t* pSrc, int len, float* pNorm))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsNormDiff_L2_32f,  (const float* pSrc1, const float* pSrc2, int len, float* pNorm))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNormDiff_L2_32f,  (const float* pSrc1, const float* pSrc2, int len, float* pNorm))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsNorm_L1_16s32s_Sfs, (const int16_t* pSrc, int len, int32_t* pNorm, int scaleFactor))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsDotProd_32f,      (const float* pSrc1, const float* pSrc2, int len, float* pDp))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsDotProd_32f,      (const float* pSrc1, const float* pSrc2, int len, float* pDp))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsDotProd_16s32s_Sfs, (const int16_t* pSrc1, const int16_t* pSrc2, int len, int32_t* pDp, int scaleFactor))
 
 /* ---- signal/transform/window ---- */

@@ -6,9 +6,12 @@
 //   - sum, mean, standard deviation: two partial sums, one over the even and
 //     one over the odd elements of each group of four, added together at the
 //     end, then the remainder added one by one;
-//   - dot product and L2 norms: eight partial sums (element i goes to sum
-//     i mod 8) over groups of eight, combined as
-//     ((s0 + s2) + (s4 + s6)) + ((s1 + s3) + (s5 + s7)), then the remainder.
+//   - dot product and L2 norms: thirty-two partial sums (element i goes to
+//     sum i mod 32) over blocks of 32, combined by halving (s[j] += s[j + 16]
+//     for j < 16, then s[j] += s[j + 8] for j < 8, ... down to s0 + s1),
+//     then the remainder added one by one.  32 sums are what 512-bit
+//     registers need to keep their adds busy; narrower registers hold the
+//     same sums in more registers (or spill some), never in another order.
 // The integer reductions are exact, so their order does not matter.
 #include "frame/variant.h"
 #include "frame/fpu.h"
@@ -17,6 +20,7 @@
 
 #include <cmath>
 #include <cstdlib>
+#include <cstring>
 #include <type_traits>
 
 namespace zor { namespace ZOR_NS {
@@ -69,7 +73,7 @@ SumAndSquares pairSums(const float* s, int n) {
     return {t, q};
 }
 
-// ---- accumulation in eight partial sums ------------------------------------------
+// ---- accumulation in thirty-two partial sums ---------------------------------------
 
 // Term kinds: a * b, a * a, (a - b)^2, each formed in double.
 enum class Term { Product, Square, DiffSquare };
@@ -86,34 +90,67 @@ inline T term(T x, T y) {
     }
 }
 
-template <Term K>
-double eightSums(const float* a, const float* b, int n) {
-    int i = 0;
-    double t;
-#if ZOR_SIMD >= 2
-    // sum i mod 8 is lane i mod 2 of register (i mod 8) / 2: 16-byte registers
+// The sums of terms in the order described above.  D is a register of
+// doubles (or a plain double in the generic code): sum i mod 32 is lane
+// i mod L of register (i mod 32) / L, and halving the registers pairs the
+// same sums as halving the array, the lanes of the last one by reduceAdd.
+template <Term K, class D>
+double thirtyTwoSums(const float* a, const float* b, int n) {
     using namespace simd;
-    using D2 = Vec<double, 16>;
-    const auto at = [&](const float* p) { return loadWidened<D2>(p + i); };
-    D2 c0 = zero<D2>(), c1 = c0, c2 = c0, c3 = c0;
-    for (; i + 8 <= n; i += 8) {
-        c0 = c0 + term<K>(at(a), at(b));
-        c1 = c1 + term<K>(at(a + 2), at(b + 2));
-        c2 = c2 + term<K>(at(a + 4), at(b + 4));
-        c3 = c3 + term<K>(at(a + 6), at(b + 6));
-    }
-    const D2 s = (c0 + c1) + (c2 + c3);
-    t = reduceAdd(s);
-#else
-    double s[8] = {0, 0, 0, 0, 0, 0, 0, 0};
-    for (; i + 8 <= n; i += 8)
-        for (int j = 0; j < 8; ++j) s[j] = toDouble(s[j] + term<K>(double(a[i + j]), double(b[i + j])));
-    const double even = toDouble(toDouble(s[0] + s[2]) + toDouble(s[4] + s[6]));
-    const double odd = toDouble(toDouble(s[1] + s[3]) + toDouble(s[5] + s[7]));
-    t = toDouble(even + odd);
-#endif
+    constexpr int L = lanesOf<D>(), kRegs = 32 / L;
+    const auto at = [](const float* p) {
+        if constexpr (L == 1) return double(*p);
+        else return loadWidened<D>(p);
+    };
+    // x87 at 53 bits rounds these sums as double does: every term and sum
+    // is a multiple of 2^-298 below 2^290 in magnitude, so the wider
+    // exponent never shows and the sums need no trip through memory.
+    D s[kRegs];
+    for (D& r : s) r = zero<D>();
+    int i = 0;
+    for (; i + 32 <= n; i += 32)
+        for (int k = 0; k < kRegs; ++k) s[k] = s[k] + term<K>(at(a + i + k * L), at(b + i + k * L));
+    for (int h = kRegs / 2; h >= 1; h /= 2)
+        for (int k = 0; k < h; ++k) s[k] = s[k] + s[k + h];
+    double t;
+    if constexpr (L == 1) t = s[0];
+    else t = reduceAdd(s[0]);
     for (; i < n; ++i) t = toDouble(t + term<K>(double(a[i]), double(b[i])));
     return t;
+}
+
+// Where two NaNs meet in a sum, the one kept depends on the order of the
+// add's operands, which the compiler chooses freely (and x87 keeps the one
+// with the larger significand).  A NaN sum is therefore set by a rule of its
+// own: the input NaN with the largest payload (the bits below the sign;
+// the first such in index order) among the elements the terms read,
+// quieted; with none, the default NaN (made by inf * 0 or inf - inf).
+template <Term K>
+double nanOfTerms(const float* a, const float* b, int n) {
+    uint32_t kept = 0xFFC00000u, keptPayload = 0;
+    const auto consider = [&](const float* p) {
+        uint32_t u;
+        std::memcpy(&u, p, 4);
+        const uint32_t payload = u & 0x7FFFFFFFu;
+        if (payload > 0x7F800000u && payload > keptPayload) kept = u | 0x00400000u, keptPayload = payload;
+    };
+    for (int i = 0; i < n; ++i) {
+        consider(a + i);
+        if (K != Term::Square) consider(b + i);
+    }
+    float f;
+    std::memcpy(&f, &kept, 4);
+    return f;
+}
+
+template <Term K>
+double sumOfTerms(const float* a, const float* b, int n) {
+#if ZOR_SIMD >= 2
+    const double t = thirtyTwoSums<K, simd::Vec<double>>(a, b, n);
+#else
+    const double t = thirtyTwoSums<K, double>(a, b, n);
+#endif
+    return t == t ? t : nanOfTerms<K>(a, b, n);
 }
 
 // ---- extrema --------------------------------------------------------------------
@@ -346,19 +383,19 @@ Status ZOR_CALL zorsMaxIndx_64f(const double* pSrc, int len, double* pMax, int* 
 Status ZOR_CALL zorsNorm_L2_32f(const float* pSrc, int len, float* pNorm) {
     if (Status s = checkFirst(anyNull(pSrc, pNorm), badLength(len))) return s;
     DoublePrecisionScope precision;
-    *pNorm = toFloat(std::sqrt(eightSums<Term::Square>(pSrc, pSrc, len)));
+    *pNorm = toFloat(std::sqrt(sumOfTerms<Term::Square>(pSrc, pSrc, len)));
     return StatusOk;
 }
 Status ZOR_CALL zorsNormDiff_L2_32f(const float* pSrc1, const float* pSrc2, int len, float* pNorm) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pNorm), badLength(len))) return s;
     DoublePrecisionScope precision;
-    *pNorm = toFloat(std::sqrt(eightSums<Term::DiffSquare>(pSrc1, pSrc2, len)));
+    *pNorm = toFloat(std::sqrt(sumOfTerms<Term::DiffSquare>(pSrc1, pSrc2, len)));
     return StatusOk;
 }
 Status ZOR_CALL zorsDotProd_32f(const float* pSrc1, const float* pSrc2, int len, float* pDp) {
     if (Status s = checkFirst(anyNull(pSrc1, pSrc2, pDp), badLength(len))) return s;
     DoublePrecisionScope precision;
-    *pDp = toFloat(eightSums<Term::Product>(pSrc1, pSrc2, len));
+    *pDp = toFloat(sumOfTerms<Term::Product>(pSrc1, pSrc2, len));
     return StatusOk;
 }
 #endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)

@@ -8,6 +8,7 @@
 #include <limits>
 #include <random>
 #include <tuple>
+#include <utility>
 #include <vector>
 
 #include "tests/support/agree.h"
@@ -23,6 +24,7 @@ using zt::Case;
 uint32_t bitsOf(float x) { uint32_t u; std::memcpy(&u, &x, 4); return u; }
 
 const float kNaN = std::numeric_limits<float>::quiet_NaN();
+const float kInf = std::numeric_limits<float>::infinity();
 const float kBig = 9007199254740992.0f;  // 2^53: adding 1 to it is lost in double
 
 }  // namespace
@@ -115,22 +117,40 @@ TEST_P(VecStats, SumsUseTheirFixedPartialSums) {
     ASSERT_EQ(z.zorsStdDev_32f(tenth.data(), 7, &r, 0), StatusOk);
     EXPECT_EQ(r, 0.0f);
 
-    // Dot product and norms: element i goes to partial sum i mod 8, so 2^53
-    // and -2^53 at 0 and 8 cancel while the ones at 1 and 9 survive.
-    std::vector<float> a(16, 0.0f), ones(16, 1.0f);
-    a[0] = kBig;
-    a[1] = a[9] = 1.0f;
-    a[8] = -kBig;
-    ASSERT_EQ(z.zorsDotProd_32f(a.data(), ones.data(), 16, &r), StatusOk);
-    EXPECT_EQ(r, 2.0f);
-    // Combined as ((s0 + s2) + (s4 + s6)) + ((s1 + s3) + (s5 + s7)): the odd
-    // group's 2^53 swallows its 1, then the even group's -2^53 cancels it.
-    std::vector<float> b(8, 0.0f);
-    b[0] = -kBig;
-    b[1] = kBig;
-    b[3] = 1.0f;
-    ASSERT_EQ(z.zorsDotProd_32f(b.data(), ones.data(), 8, &r), StatusOk);
-    EXPECT_EQ(r, 0.0f);
+    // Dot product and norms: element i of each block of 32 goes to sum i mod
+    // 32 (2^53 and -2^53 at 0 and 32 cancel, the ones at 1 and 33 survive);
+    // the sums are combined by halving, 16 apart first (the 1 at 24 is lost
+    // in the 2^53 at 8 before the -2^53 at 0 cancels it; a 1 at 8 outlives
+    // 2^53 and -2^53 at 0 and 16); the last len mod 32 follow one by one (the
+    // 1 at 32 is lost in the 2^53 at 1 that the -2^53 at 33 cancels).
+    const auto with = [](int n, std::initializer_list<std::pair<int, float>> set, float fill = 0.0f) {
+        std::vector<float> v(n, fill);
+        for (auto [i, x] : set) v[i] = x;
+        return v;
+    };
+    const auto dot = [&](const std::vector<float>& x, const std::vector<float>& y, int n) {
+        float d = 0;
+        EXPECT_EQ(z.zorsDotProd_32f(x.data(), y.data(), n, &d), StatusOk);
+        return d;
+    };
+    const std::vector<float> ones(64, 1.0f);
+    EXPECT_EQ(dot(with(64, {{0, kBig}, {1, 1}, {32, -kBig}, {33, 1}}), ones, 64), 2.0f);
+    EXPECT_EQ(dot(with(32, {{0, -kBig}, {8, kBig}, {24, 1}}), ones, 32), 0.0f);
+    EXPECT_EQ(dot(with(32, {{0, kBig}, {8, 1}, {16, -kBig}}), ones, 32), 1.0f);
+    EXPECT_EQ(dot(with(34, {{1, kBig}, {32, 1}, {33, -kBig}}), ones, 34), 0.0f);
+    // A NaN result: the input NaN with the largest payload (the first of
+    // equals), quieted, whatever NaNs meet in the sums; the default NaN where
+    // no input is one (inf * 0, inf - inf).
+    const auto nan = [](uint32_t u) { float f; std::memcpy(&f, &u, 4); return f; };
+    const auto x = with(70, {{5, kInf}, {10, nan(0x7F800003u)}, {40, nan(0x7FC00001u)}, {67, nan(0x7FC00002u)}}, 1);
+    const auto y = with(70, {{5, 0.0f}, {66, nan(0xFFC00002u)}}, 1);
+    const auto e = with(8, {{3, nan(0x7FA00000u)}, {5, kInf}}, 1);
+    EXPECT_EQ(bitsOf(dot(x, y, 8)), 0xFFC00000u);
+    EXPECT_EQ(bitsOf(dot(x, y, 70)), 0xFFC00002u);
+    ASSERT_EQ(z.zorsNorm_L2_32f(x.data(), 41, &r), StatusOk);
+    EXPECT_EQ(bitsOf(r), 0x7FC00001u);
+    ASSERT_EQ(z.zorsNormDiff_L2_32f(x.data(), e.data(), 8, &r), StatusOk);
+    EXPECT_EQ(bitsOf(r), 0x7FE00000u);
     // Products in double, exact: (1 + 2^-12)^2 - 1 keeps 2^-24.
     const float p[2] = {1.0f + 0x1p-12f, -1.0f}, q[2] = {1.0f + 0x1p-12f, 1.0f};
     ASSERT_EQ(z.zorsDotProd_32f(p, q, 2, &r), StatusOk);
@@ -140,6 +160,30 @@ TEST_P(VecStats, SumsUseTheirFixedPartialSums) {
     EXPECT_EQ(r, static_cast<float>(std::sqrt(double(3e30f) * double(3e30f) + double(4e30f) * double(4e30f))));
     ASSERT_EQ(z.zorsNormDiff_L2_32f(m, u, 3, &r), StatusOk);  // (0, 0, 15)
     EXPECT_EQ(r, 15.0f);
+}
+
+// Random data against long double sums: within half a float ulp of the exact
+// value, give or take the double accumulation's error (far smaller).
+TEST_P(VecStats, DoubleSumsRoundTheExactValue) {
+    std::mt19937 rng(11);
+    std::uniform_real_distribution<float> u(-4, 4);
+    for (int n : {5, 31, 32, 97, 1000, 4133}) {
+        std::vector<float> a(n), b(n);
+        long double e[3] = {}, size = 0;  // dot product, squares, squared differences
+        for (int i = 0; i < n; ++i) a[i] = u(rng), b[i] = u(rng);
+        for (int i = 0; i < n; ++i) {  // from memory: x87 registers would keep u(rng) unrounded
+            const long double p = (long double)a[i] * b[i], d = (long double)a[i] - b[i];
+            e[0] += p, size += std::fabs(p), e[1] += (long double)a[i] * a[i], e[2] += d * d;
+        }
+        float r[3];
+        ASSERT_EQ(z().zorsDotProd_32f(a.data(), b.data(), n, r) + z().zorsNorm_L2_32f(a.data(), n, r + 1) +
+                      z().zorsNormDiff_L2_32f(a.data(), b.data(), n, r + 2), StatusOk);
+        for (int k = 0; k < 3; ++k) {
+            const long double exact = k ? std::sqrt(e[k]) : e[0], m = std::fabs(r[k]);
+            const long double halfUlp = 0.5L * (std::nextafter(std::fabs(r[k]), INFINITY) - m);
+            EXPECT_LE(std::fabs(r[k] - exact), halfUlp + (k ? e[k] : size) * 0x1p-40L) << n << " " << k;
+        }
+    }
 }
 
 // ---- extrema ------------------------------------------------------------------------
