@@ -567,6 +567,33 @@ Call histogram(const Api& z) {
     };
 }
 
+// ---- filters of the test picture by mask size --------------------------------------
+
+template <int M>
+Prepare median() {
+    return image(gray, 1, [](const Api& z, Picture s, uint8_t* d, int ds) {
+        z.zoriFilterMedian_8u_C1R(s.p, s.step, d, ds, kRoi, {M, M}, {M / 2, M / 2});
+    });
+}
+template <int M>
+Prepare box() {
+    return image(gray, 1, [](const Api& z, Picture s, uint8_t* d, int ds) {
+        z.zoriFilterBox_8u_C1R(s.p, s.step, d, ds, kRoi, {M, M}, {M / 2, M / 2});
+    });
+}
+template <int Mask>
+Prepare sobelVert() {
+    return image(gray, 2, [](const Api& z, Picture s, uint8_t* d, int ds) {
+        z.zoriFilterSobelVert_8u16s_C1R(s.p, s.step, as<int16_t>(d), ds, kRoi, Mask);
+    });
+}
+template <int Mask>
+Prepare gauss() {
+    return image(gray, 1, [](const Api& z, Picture s, uint8_t* d, int ds) {
+        z.zoriFilterGauss_8u_C1R(s.p, s.step, d, ds, kRoi, Mask);
+    });
+}
+
 // ---- the workloads of bench/bench_*.cpp, in file order ----------------------------
 
 const int32_t kKernel[25] = {1, 1, 2, 1, 1, 1, 2, 3, 2, 1, 2, 3, 5, 3, 2, 1, 2, 3, 2, 1, 1, 1, 2, 1, 1};
@@ -610,16 +637,11 @@ const std::vector<Workload>& workloads() {
              float k[25];
              for (int i = 0; i < 25; ++i) k[i] = float(kKernel[i]) / 45.0f;
              z.zoriFilter32f_8u_C1R(s.p, s.step, d, ds, kRoi, k, {5, 5}, {2, 2}); })},
-        {"zoriFilterSobelVert_8u16s_C1R 33 1920x1080", image(gray, 2, [](Z z, P s, D d, int ds) {
-             z.zoriFilterSobelVert_8u16s_C1R(s.p, s.step, as<int16_t>(d), ds, kRoi, 33); })},
-        {"zoriFilterSobelVert_8u16s_C1R 55 1920x1080", image(gray, 2, [](Z z, P s, D d, int ds) {
-             z.zoriFilterSobelVert_8u16s_C1R(s.p, s.step, as<int16_t>(d), ds, kRoi, 55); })},
-        {"zoriFilterMedian_8u_C1R 3x3 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterMedian_8u_C1R(s.p, s.step, d, ds, kRoi, {3, 3}, {1, 1}); })},
-        {"zoriFilterMedian_8u_C1R 5x5 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterMedian_8u_C1R(s.p, s.step, d, ds, kRoi, {5, 5}, {2, 2}); })},
-        {"zoriFilterMedian_8u_C1R 7x7 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterMedian_8u_C1R(s.p, s.step, d, ds, kRoi, {7, 7}, {3, 3}); })},
+        {"zoriFilterSobelVert_8u16s_C1R 33 1920x1080", sobelVert<33>()},
+        {"zoriFilterSobelVert_8u16s_C1R 55 1920x1080", sobelVert<55>()},
+        {"zoriFilterMedian_8u_C1R 3x3 1920x1080", median<3>()},
+        {"zoriFilterMedian_8u_C1R 5x5 1920x1080", median<5>()},
+        {"zoriFilterMedian_8u_C1R 7x7 1920x1080", median<7>()},
         {"zoriFilterMax_8u_C1R 3x3 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
              z.zoriFilterMax_8u_C1R(s.p, s.step, d, ds, kRoi, {3, 3}, {1, 1}); })},
         {"zoriDilate3x3_8u_C1IR 1920x1080", dilateInPlace},
@@ -671,18 +693,13 @@ const std::vector<Workload>& workloads() {
              const uint8_t v[3] = {10, 20, 30};
              z.zoriSet_8u_C3R(v, d, ds, kRoi); })},
         // smoothing
-        {"zoriFilterBox_8u_C1R 5x5 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterBox_8u_C1R(s.p, s.step, d, ds, kRoi, {5, 5}, {2, 2}); })},
-        {"zoriFilterGauss_8u_C1R 55 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterGauss_8u_C1R(s.p, s.step, d, ds, kRoi, 55); })},
-        {"zoriFilterBox_8u_C1R 3x3 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterBox_8u_C1R(s.p, s.step, d, ds, kRoi, {3, 3}, {1, 1}); })},
-        {"zoriFilterBox_8u_C1R 15x15 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterBox_8u_C1R(s.p, s.step, d, ds, kRoi, {15, 15}, {7, 7}); })},
+        {"zoriFilterBox_8u_C1R 5x5 1920x1080", box<5>()},
+        {"zoriFilterGauss_8u_C1R 55 1920x1080", gauss<55>()},
+        {"zoriFilterBox_8u_C1R 3x3 1920x1080", box<3>()},
+        {"zoriFilterBox_8u_C1R 15x15 1920x1080", box<15>()},
         {"zoriFilterBox_8u_C3R 5x5 1920x1080", image(noiseWithBorder, 3, [](Z z, P s, D d, int ds) {
              z.zoriFilterBox_8u_C3R(s.p, s.step, d, ds, kRoi, {5, 5}, {2, 2}); })},
-        {"zoriFilterGauss_8u_C1R 33 1920x1080", image(gray, 1, [](Z z, P s, D d, int ds) {
-             z.zoriFilterGauss_8u_C1R(s.p, s.step, d, ds, kRoi, 33); })},
+        {"zoriFilterGauss_8u_C1R 33 1920x1080", gauss<33>()},
         {"zoriFilterGauss_8u_C3R 55 1920x1080", image(noiseWithBorder, 3, [](Z z, P s, D d, int ds) {
              z.zoriFilterGauss_8u_C3R(s.p, s.step, d, ds, kRoi, 55); })},
         {"zoriConvFull_32f_C1R 512x512 * 9x9", convFull},
