@@ -389,7 +389,7 @@ public:
         shift_ = g;
 
         pairs_ = (ks.width + 1) / 2;
-        rowLen_ = static_cast<int64_t>(samples) + static_cast<int64_t>(ks.width - 1) * channels;
+        const int64_t rowLen = static_cast<int64_t>(samples) + static_cast<int64_t>(ks.width - 1) * channels;
         // walk-order grid kernel first, to test the mirror symmetry
         int32_t* grid = static_cast<int32_t*>(mem::alignedAlloc(static_cast<uint32_t>(n * 4)));
         if (!grid) return;
@@ -409,11 +409,14 @@ public:
             fold_ = std::memcmp(grid + r * ks.width, grid + (ks.height - 1 - r) * ks.width,
                                 sizeof(int32_t) * size_t(ks.width)) == 0;
         groups_ = fold_ ? (ks.height + 1) / 2 : ks.height;
-        rowStride_ = (rowLen_ + 7) & ~int64_t(7);
+        const int64_t rowStride = (rowLen + 7) & ~int64_t(7);
         const uint64_t tableBytes = uint64_t(groups_) * uint64_t(pairs_) * sizeof(I16x8);
-        const uint64_t bytes = tableBytes + uint64_t(groups_) * uint64_t(rowStride_) * 4;
+        const uint64_t bytes = tableBytes + uint64_t(groups_) * uint64_t(rowStride) * 4;
         if (bytes <= 0x7FFFFFFFu) block_ = mem::alignedAlloc(static_cast<uint32_t>(bytes));
         if (block_) {
+            // below 2^31 bytes: the row lengths are ordinary indices from here on
+            rowLen_ = static_cast<ptrdiff_t>(rowLen);
+            rowStride_ = static_cast<ptrdiff_t>(rowStride);
             table_ = static_cast<I16x8*>(block_);
             rows_ = reinterpret_cast<uint32_t*>(static_cast<uint8_t*>(block_) + tableBytes);
             for (int gi = 0; gi < groups_; ++gi)
@@ -495,7 +498,7 @@ private:
     void pairUp(const uint8_t* a, const uint8_t* b, uint32_t* w) const {
         using namespace simd;
         using U16x8 = Vec<uint16_t, 16>;
-        const int64_t c = channels_;
+        const ptrdiff_t c = channels_;
         const auto widened = [&](const uint8_t* p, const uint8_t* q, U16x8& lo, U16x8& hi) {
             const U8x16 v = load<U8x16>(p);
             lo = widenLo(v);
@@ -506,7 +509,7 @@ private:
                 hi = hi + widenHi(u);
             }
         };
-        int64_t i = 0;
+        ptrdiff_t i = 0;
         for (; i + c + 16 <= rowLen_; i += 16) {
             U16x8 v0, v1, u0, u1;
             widened(a + i, b ? b + i : nullptr, v0, v1);
@@ -516,7 +519,7 @@ private:
             storeTo(w + i + 8, zipLo(v1, u1));
             storeTo(w + i + 12, zipHi(v1, u1));
         }
-        auto v = [&](int64_t j) -> uint32_t { return j < rowLen_ ? uint32_t(a[j] + (b ? b[j] : 0)) : 0u; };
+        auto v = [&](ptrdiff_t j) -> uint32_t { return j < rowLen_ ? uint32_t(a[j] + (b ? b[j] : 0)) : 0u; };
         for (; i < rowLen_; ++i) w[i] = v(i) | (v(i + c) << 16);
     }
 
@@ -524,7 +527,7 @@ private:
     int channels_, samples_;
     int shift_ = 0, pairs_ = 0, groups_ = 0;
     bool fold_ = false;
-    int64_t rowLen_ = 0, rowStride_ = 0;
+    ptrdiff_t rowLen_ = 0, rowStride_ = 0;  // in 32-bit words; 64-bit sums on 32-bit cost registers
     int32_t loOff_ = 0, hiOff_ = 0;
     void* block_ = nullptr;
     I16x8* table_ = nullptr;

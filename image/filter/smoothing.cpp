@@ -145,8 +145,8 @@ Status hipass(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageS
 
 // ---- Gauss ---------------------------------------------------------------------------------
 
-Status gauss(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize roi, int channels,
-             int mask) {
+template <int channels>
+Status gauss(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize roi, int mask) {
     if (Status s = checkNeighbourhood(src, srcStep, dst, dstStep, roi)) return s;
     const int side = sideOf(mask);
     if (side == 0) return StatusBadMaskSize;
@@ -154,8 +154,8 @@ Status gauss(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSi
     Scratch<uint16_t> scratch((side + 1) * (outputs + int64_t(side - 1) * channels));
     if (!scratch.p) return StatusNoMemory;
     const uint8_t* top = neighbourhoodTop(src, srcStep, {side / 2, side / 2}, channels);
-    if (side == 3) gaussRows<3>(top, srcStep, roi.height, scratch.p, outputs, channels, dst, dstStep);
-    else gaussRows<5>(top, srcStep, roi.height, scratch.p, outputs, channels, dst, dstStep);
+    if (side == 3) gaussRows<3, channels>(top, srcStep, roi.height, scratch.p, outputs, dst, dstStep);
+    else gaussRows<5, channels>(top, srcStep, roi.height, scratch.p, outputs, dst, dstStep);
     return StatusOk;
 }
 
@@ -326,12 +326,12 @@ Status ZOR_CALL zoriFilterHipass_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_
 
 Status ZOR_CALL zoriFilterGauss_8u_C1R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                        ImageSize dstRoiSize, int mask) {
-    return gauss(pSrc, srcStep, pDst, dstStep, dstRoiSize, 1, mask);
+    return gauss<1>(pSrc, srcStep, pDst, dstStep, dstRoiSize, mask);
 }
 
 Status ZOR_CALL zoriFilterGauss_8u_C3R(const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep,
                                        ImageSize dstRoiSize, int mask) {
-    return gauss(pSrc, srcStep, pDst, dstStep, dstRoiSize, 3, mask);
+    return gauss<3>(pSrc, srcStep, pDst, dstStep, dstRoiSize, mask);
 }
 
 // ---- Wiener ------------------------------------------------------------------------------------

@@ -274,10 +274,13 @@ inline W binomial(const W (&x)[Taps]) {
 // once, into a ring of Taps rows; per output row the vertical pass over the
 // ring goes into col, then the horizontal pass, rounded and shifted by
 // 2 log2(weight sum), into the destination.  Scratch: (Taps + 1) (outputs
-// + (Taps - 1) stride) lanes.
-template <int Taps>
-void gaussRows(const uint8_t* top, int step, int rows, uint16_t* scratch, ptrdiff_t outputs, int stride,
-               uint8_t* dst, int dstStep) {
+// + (Taps - 1) stride) lanes.  The stride between taps (the channel count)
+// is a constant, so the taps of the horizontal pass are offsets from one
+// address rather than a pointer each, which the general registers of the
+// 32-bit build cannot all hold.
+template <int Taps, int stride>
+void gaussRows(const uint8_t* top, int step, int rows, uint16_t* scratch, ptrdiff_t outputs, uint8_t* dst,
+               int dstStep) {
     const ptrdiff_t columns = outputs + ptrdiff_t(Taps - 1) * stride;
     uint16_t* col = scratch + Taps * columns;
     auto slot = [&](int r) { return scratch + (r % Taps) * columns; };
@@ -435,7 +438,15 @@ void convRowFloat(const PaddedRows<double>& ring, const Image<float>& k, int y, 
             const double* ar = ring.slot(y - j) + x;
             for (int i = 0; i < k.size.width; ++i) {
                 const D kv = simd::set1<D>(double(kr[i]));
-                for (int r = 0; r < kRegs; ++r) acc[r] += kv * simd::load<D>(ar - i + r * D::kLanes);
+                const double* at = ar - i;
+#if !defined(__x86_64__)
+                // Each tap loads its own operands: left to itself the
+                // compiler keeps loads for the next taps, which needs more
+                // than the eight registers of the 32-bit build (it spilled
+                // them to the stack, 1.5 times the x86-64 time).
+                __asm__("" : "+r"(at));
+#endif
+                for (int r = 0; r < kRegs; ++r) acc[r] += kv * simd::load<D>(at + r * D::kLanes);
             }
         }
         for (int r = 0; r < kRegs; r += 2) {

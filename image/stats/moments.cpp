@@ -48,39 +48,58 @@ struct RowSums {
     }
 }
 
+#if ZOR_SIMD >= 2
+using F = simd::Vec<float>;
+using D = simd::Vec<double>;
+static_assert(F::kLanes == kPartials && 2 * D::kLanes == kPartials, "one float register widens into the four partials");
+
+// Adds the columns 0 .. end - 1 (end a multiple of 4) to the partial sums of
+// every order: acc[0] holds partials 0 and 1, acc[1] partials 2 and 3, of
+// the halves chosen.
+template <bool Lo, bool Hi>
+void addRegisterColumns(const float* f, int end, D (&acc)[2][kOrders]) {
+    const float first[4] = {0.0f, 1.0f, 2.0f, 3.0f};
+    const F columns = simd::load<F>(first);
+    D xlo = simd::widenLo(columns), xhi = simd::widenHi(columns);
+    const D step = simd::set1<D>(double(kPartials));
+    for (int x = 0; x < end; x += kPartials) {
+        const F v = simd::load<F>(f + x);
+        if constexpr (Lo) {
+            D t = simd::widenLo(v);
+            acc[0][0] += t;
+            for (int m = 1; m < kOrders; ++m) acc[0][m] += (t = xlo * t);
+            xlo += step;
+        }
+        if constexpr (Hi) {
+            D t = simd::widenHi(v);
+            acc[1][0] += t;
+            for (int m = 1; m < kOrders; ++m) acc[1][m] += (t = xhi * t);
+            xhi += step;
+        }
+    }
+}
+#endif
+
 [[maybe_unused]] RowSums rowSums(const float* f, int w) {
     double p[kOrders][kPartials] = {};
     int x = 0;
 #if ZOR_SIMD >= 2
-    using F = simd::Vec<float>;
-    using D = simd::Vec<double>;
-    static_assert(F::kLanes == kPartials && 2 * D::kLanes == kPartials,
-                  "one float register widens into the four partials");
     if (w >= kPartials) {
-        // lo holds partials 0 and 1, hi partials 2 and 3, of every order
-        D lo[kOrders], hi[kOrders];
-        for (int m = 0; m < kOrders; ++m) lo[m] = hi[m] = simd::zero<D>();
-        const float first[4] = {0.0f, 1.0f, 2.0f, 3.0f};
-        const F columns = simd::load<F>(first);
-        D xlo = simd::widenLo(columns), xhi = simd::widenHi(columns);
-        const D step = simd::set1<D>(double(kPartials));
-        for (; x + kPartials <= w; x += kPartials) {
-            const F v = simd::load<F>(f + x);
-            D tlo = simd::widenLo(v), thi = simd::widenHi(v);
-            lo[0] += tlo;
-            hi[0] += thi;
-            for (int m = 1; m < kOrders; ++m) {
-                tlo = xlo * tlo;
-                thi = xhi * thi;
-                lo[m] += tlo;
-                hi[m] += thi;
-            }
-            xlo += step;
-            xhi += step;
-        }
+        x = w - w % kPartials;
+        D acc[2][kOrders];
+        for (int m = 0; m < kOrders; ++m) acc[0][m] = acc[1][m] = simd::zero<D>();
+#if defined(__x86_64__)
+        addRegisterColumns<true, true>(f, x, acc);
+#else
+        // eight accumulators and their operands do not fit the eight
+        // registers of the 32-bit build: one half of the partials at a time
+        // (the row is in the cache for the second pass)
+        addRegisterColumns<true, false>(f, x, acc);
+        addRegisterColumns<false, true>(f, x, acc);
+#endif
         for (int m = 0; m < kOrders; ++m) {
-            simd::store(p[m], lo[m]);
-            simd::store(p[m] + 2, hi[m]);
+            simd::store(p[m], acc[0][m]);
+            simd::store(p[m] + 2, acc[1][m]);
         }
     }
 #endif

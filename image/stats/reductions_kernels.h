@@ -31,6 +31,28 @@ V channelLabels(int r) {
     return simd::loadAligned<V>(l);
 }
 
+// Channel c of a run of three registers, gathered into one: lane k of
+// register r holds channel (r kLanes + k) mod 3, and as kLanes is no
+// multiple of 3 every lane position holds channel c in exactly one of the
+// three registers.  Fewer live registers than keeping the three apart,
+// which the eight registers of the 32-bit build need.
+template <class V>
+class ChannelGather {
+public:
+    explicit ChannelGather(int c) {
+        using T = typename V::Lane;
+        for (int r = 0; r < 3; ++r) mask_[r] = simd::eq(channelLabels<V>(r), simd::set1<V>(T(c)));
+    }
+    V operator()(const typename V::Lane* run) const {
+        constexpr int L = V::kLanes;
+        return (simd::load<V>(run) & mask_[0]) | (simd::load<V>(run + L) & mask_[1]) |
+               (simd::load<V>(run + 2 * L) & mask_[2]);
+    }
+
+private:
+    V mask_[3];
+};
+
 // out[label of lane k] = op(out[...], lane k) for every lane.
 template <class T, int B, class Acc, class Op>
 void foldByChannel(simd::Vec<T, B> values, simd::Vec<T, B> labels, Acc* out, Op op) {
@@ -177,7 +199,8 @@ inline SumSquares rowChannelSquares8u(const uint8_t* s, int w, int c) {
     return addSamples(s, x, w, c, t);
 }
 
-// Channel c of a 16-bit three-channel row.  The SIMD path works on v - 32768,
+// Channel c of a 16-bit three-channel row.  The SIMD path gathers the
+// channel's samples of a run into one register and works on v - 32768,
 // whose squares (at most 2^30) pairs of lanes can sum, and corrects at the
 // end: sum v^2 = sum (v - 32768)^2 + 65536 sum v - n 2^30.
 inline SumSquares rowChannelSquares16u(const uint16_t* s, int w, int c) {
@@ -190,26 +213,21 @@ inline SumSquares rowChannelSquares16u(const uint16_t* s, int w, int c) {
     using U = simd::Vec<uint32_t>;
     using W = simd::Vec<uint64_t>;
     constexpr int L = V::kLanes;
-    H mask[3];
-    for (int r = 0; r < 3; ++r)
-        mask[r] = simd::bitcast<int16_t>(simd::eq(channelLabels<V>(r), simd::set1<V>(uint16_t(c))));
+    const ChannelGather<V> channel(c);
     const H bias = simd::set1<H>(int16_t(-32768)), ones = simd::set1<H>(1);
     W squares = simd::zero<W>();
-    int64_t centred = 0, n = 0;
+    int64_t centred = 0;
     while (x + L <= w) {
-        I sum = simd::zero<I>();  // at most 3 * 32768 per lane and run
+        I sum = simd::zero<I>();  // at most 2 * 32768 per lane and run
         for (int runs = 0; runs < 4096 && x + L <= w; ++runs, x += L) {
-            U sq = simd::zero<U>();  // at most 3 * 2^30 per lane
-            for (int r = 0; r < 3; ++r) {
-                const H v = (simd::bitcast<int16_t>(simd::load<V>(s + 3 * x + r * L)) ^ bias) & mask[r];
-                sum += simd::mulAddPairs(v, ones);
-                sq += simd::bitcast<uint32_t>(simd::mulAddPairs(v, v));
-            }
+            const H v = simd::bitcast<int16_t>(channel(s + 3 * x)) ^ bias;
+            sum += simd::mulAddPairs(v, ones);
+            const U sq = simd::bitcast<uint32_t>(simd::mulAddPairs(v, v));  // at most 2^31
             squares += simd::widenLo(sq) + simd::widenHi(sq);
-            n += L;
         }
         centred += simd::reduceAdd(sum);
     }
+    const int64_t n = x;  // the samples taken
     t.sum = centred + 32768 * n;
     t.squares = int64_t(simd::reduceAdd(squares)) + 65536 * t.sum - (n << 30);
 #endif
@@ -292,15 +310,27 @@ struct Range16u {
 inline Range16u rowRange16u(const uint16_t* s, int w, int c) {
     Range16u m;
 #if ZOR_SIMD >= 2
-    // Unsigned order as signed order of v ^ 0x8000, where the instructions
-    // are single.
+    // Channel c of each run gathered into one register (a last run that
+    // does not fill the registers overlaps the one before, with the same
+    // channel order); unsigned order as signed order of v ^ 0x8000, where
+    // the instructions are single.
     using V = simd::Vec<int16_t>;
-    if (w >= V::kLanes) {
+    constexpr int L = V::kLanes;
+    if (w >= L) {
+        const ChannelGather<V> channel(c);
         const V flip = simd::set1<V>(int16_t(-32768));
-        int16_t mn[3] = {32767, 32767, 32767}, mx[3] = {-32768, -32768, -32768};
-        runExtremes<V>(w, [&](int px, int r) { return simd::loadFrom<V>(s + 3 * px + r * V::kLanes) ^ flip; }, mn, mx);
-        m.min = uint16_t(mn[c] ^ 0x8000);
-        m.max = uint16_t(mx[c] ^ 0x8000);
+        const int16_t* p = reinterpret_cast<const int16_t*>(s);
+        V lo = channel(p) ^ flip, hi = lo;
+        auto take = [&](int x) {
+            const V v = channel(p + 3 * x) ^ flip;
+            lo = simd::min(lo, v);
+            hi = simd::max(hi, v);
+        };
+        int x = L;
+        for (; x + L <= w; x += L) take(x);
+        if (x < w) take(w - L);
+        m.min = uint16_t(simd::reduceMin(lo) ^ 0x8000);
+        m.max = uint16_t(simd::reduceMax(hi) ^ 0x8000);
         return m;
     }
 #endif
