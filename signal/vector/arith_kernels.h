@@ -9,6 +9,7 @@
 #include "frame/simd.h"
 #include "frame/status.h"
 
+#include <algorithm>
 #include <climits>
 #include <cmath>
 #include <cstddef>
@@ -351,19 +352,68 @@ constexpr PhaseTable makePhaseTable() {
 }
 constexpr PhaseTable kPhaseTable = makePhaseTable();
 
-// atan(z) plus T for the lanes that widenLo (widenHi with Upper) takes,
-// from snum = sigma num, den and sc = sigma c as floats (widened exactly)
-// and the table rows.
-template <bool Upper>
-inline D phaseHalf(F snum, F den, F sc, I row) {
+// The loop runs in two passes over chunks of kPhaseChunk elements: the
+// first forms, per register of elements, everything that needs only float
+// work (octant, table row, the float operands of z, whether the magnitudes
+// are in range) into a stack buffer; the second does the double-precision
+// work from there.  Split so, each pass's dependency chain is short enough
+// for several registers to be in flight at once, and the table rows are in
+// memory long before they are needed: the table loads go lane by lane from
+// general registers, much faster than a native gather.
+constexpr int kPhaseChunk = 256;
+
+// What the first pass leaves for one register of elements, read back by
+// the second a half register of doubles at a time, in element order.
+struct PhaseStaged {
+    float snum[F::kLanes], den[F::kLanes], sc[F::kLanes];  // sigma num, den, sigma c
+    int32_t row[F::kLanes];
+    F inRange;  // both magnitudes in [2^-60, 2^60)
+};
+
+inline void phaseStage(const float* py, const float* px, PhaseStaged& s) {
     using namespace simd;
-    const auto widen = [](F v) { return Upper ? widenHi(v) : widenLo(v); };
-    const D c = widen(sc), nd = widen(snum), dd = widen(den);
+    const I signBit = set1<I>(INT32_MIN);
+    const I yb = loadFrom<I>(py), xb = loadFrom<I>(px);
+    const I ya = andNot(signBit, yb), xa = andNot(signBit, xb);
+    // A NaN in either makes num (x's) or den (y's) NaN.
+    const F num = min(bitcast<float>(ya), bitcast<float>(xa));
+    const F den = max(bitcast<float>(xa), bitcast<float>(ya));
+    // t + 2^17 rounds t to a multiple of 1/64: the low bits hold k, and
+    // subtracting 2^17 again leaves c = k/64 exactly.  The reciprocal
+    // estimate (12 bits) keeps |t - c| <= 2^-7 + 2^-11.4 and k <= 64.
+    const F tk = num * recipApprox(den) + set1<F>(0x1p17f);
+    const I steep = gt(ya, xa);  // positive floats order as integers
+    const I left = shr<31>(xb);
+    const I row = (bitcast<int32_t>(tk) & set1<I>(127)) |
+                  ((steep & set1<I>(128)) | (left & set1<I>(256)));
+    const F sigma = bitcast<float>(shl<31>(steep ^ left));
+    store(s.snum, num ^ sigma);
+    store(s.den, den);
+    store(s.sc, (tk - set1<F>(0x1p17f)) ^ sigma);
+    // Zeros, infinities, NaNs and extreme ratios (a result below the normal
+    // floats, a reciprocal estimate out of range) are left to the library,
+    // like results near a rounding midpoint.
+    s.inRange = ge(num, set1<F>(0x1p-60f)) & lt(den, set1<F>(0x1p60f));
+    storeTo(s.row, row);
+}
+
+// atan(z) plus T for the elements from first on (a register of doubles of
+// them), from snum = sigma num, den and sc = sigma c as floats (widened
+// exactly) and the table rows.
+inline D phaseLanes(const PhaseStaged& s, int first) {
+    using namespace simd;
+    const D c = loadWidened<D>(s.sc + first), nd = loadWidened<D>(s.snum + first), dd = loadWidened<D>(s.den + first);
     const D z = (nd - c * dd) / (dd + c * nd);
     const D z2 = z * z;
     const D q = z2 * set1<D>(1.0 / 5) + set1<D>(-1.0 / 3);
-    const D t = Upper ? gatherHi(kPhaseTable.base, row) : gatherLo(kPhaseTable.base, row);
+    const D t = gather<D>(kPhaseTable.base, s.row + first);
     return (t + z) + (z * z2) * q;
+}
+
+// One register of elements by the library: kept out of the loop, whose
+// registers a call would clobber.
+[[gnu::noinline]] void atan2Elements(const float* py, const float* px, float* d) {
+    for (int j = 0; j < F::kLanes; ++j) d[j] = atan2Element(py[j], px[j]);
 }
 #endif
 
@@ -372,36 +422,22 @@ inline D phaseHalf(F snum, F den, F sc, I row) {
     int i = 0;
 #if ZOR_SIMD >= 2
     using namespace simd;
+    constexpr int kLanes = F::kLanes;
     const I signBit = set1<I>(INT32_MIN);
-    for (; i + F::kLanes <= n; i += F::kLanes) {
-        const I yb = loadFrom<I>(py + i), xb = loadFrom<I>(px + i);
-        const I ya = andNot(signBit, yb), xa = andNot(signBit, xb);
-        // A NaN in either makes num (x's) or den (y's) NaN.
-        const F num = min(bitcast<float>(ya), bitcast<float>(xa));
-        const F den = max(bitcast<float>(xa), bitcast<float>(ya));
-        // t + 2^17 rounds t to a multiple of 1/64: the low bits hold k, and
-        // subtracting 2^17 again leaves c = k/64 exactly.  The reciprocal
-        // estimate (12 bits) keeps |t - c| <= 2^-7 + 2^-11.4 and k <= 64.
-        const F tk = num * recipApprox(den) + set1<F>(0x1p17f);
-        const I steep = gt(ya, xa);  // positive floats order as integers
-        const I left = shr<31>(xb);
-        const I row = (bitcast<int32_t>(tk) & set1<I>(127)) |
-                      ((steep & set1<I>(128)) | (left & set1<I>(256)));
-        const F sigma = bitcast<float>(shl<31>(steep ^ left));
-        const F snum = num ^ sigma;
-        const F sc = (tk - set1<F>(0x1p17f)) ^ sigma;
-        const D r0 = phaseHalf<false>(snum, den, sc, row);
-        const D r1 = phaseHalf<true>(snum, den, sc, row);
-        // Both magnitudes must lie in [2^-60, 2^60): zeros, infinities, NaNs
-        // and extreme ratios (a result below the normal floats, a reciprocal
-        // estimate out of range) are left to the library, like results near
-        // a rounding midpoint.
-        const F inRange = ge(num, set1<F>(0x1p-60f)) & lt(den, set1<F>(0x1p60f));
-        if (allTrue(andNot(bitcast<float>(nearMidpoint<kPhaseMargin>(r0, r1)), inRange))) {
-            storeTo(d + i, narrowSat<float>(r0, r1) | bitcast<float>(yb & signBit));
-            continue;
+    PhaseStaged staged[kPhaseChunk / kLanes];
+    while (i + kLanes <= n) {
+        const int blocks = std::min(kPhaseChunk, n - i) / kLanes;
+        for (int b = 0; b < blocks; ++b) phaseStage(py + i + b * kLanes, px + i + b * kLanes, staged[b]);
+        for (int b = 0; b < blocks; ++b, i += kLanes) {
+            const D r0 = phaseLanes(staged[b], 0);
+            const D r1 = phaseLanes(staged[b], D::kLanes);
+            // nearMidpoint orders its lanes per 16-byte block, inRange in
+            // element order: they only meet in this test of all lanes.
+            if (allTrue(andNot(bitcast<float>(nearMidpoint<kPhaseMargin>(r0, r1)), staged[b].inRange)))
+                storeTo(d + i, narrowInOrder<float>(r0, r1) | bitcast<float>(loadFrom<I>(py + i) & signBit));
+            else
+                atan2Elements(py + i, px + i, d + i);
         }
-        for (int j = i; j < i + F::kLanes; ++j) d[j] = atan2Element(py[j], px[j]);
     }
 #else
     DoublePrecisionScope precision;

@@ -214,6 +214,9 @@ TEST(SimdLanes, TableLookupsFollowTheWideningOrder) {
     store(got, gatherLo(table, v));
     store(got + 2, gatherHi(table, v));
     for (int l = 0; l < 4; ++l) EXPECT_EQ(got[l], 0.5 * idx[l]) << l;
+    // in order, indices from memory
+    store(got, gather<D>(table, idx + 1));
+    for (int l = 0; l < D::kLanes; ++l) EXPECT_EQ(got[l], 0.5 * idx[l + 1]) << l;
     const int32_t rows[4] = {40, 2, 62, 11};
     D first, second;
     gatherRowsLo(table, rows, first, second);
@@ -244,6 +247,11 @@ TEST(SimdLanes, LoadWidenedExtendsInOrder) {
     store(d, loadWidened<Vec<double>>(f));
     EXPECT_EQ(d[0], double(f[0]));
     EXPECT_EQ(d[1], double(f[1]));
+    const float g[4] = {1.5f, -0.0f, 3e-39f, 7.25f};
+    using Dv = Vec<double>;
+    float back[4];
+    store(back, narrowInOrder<float>(loadWidened<Dv>(g), loadWidened<Dv>(g + Dv::kLanes)));
+    EXPECT_EQ(std::memcmp(back, g, sizeof g), 0);
     // the scalar twin of abs clears the sign bit like the register form
     const float negZero = abs(-0.0f);
     EXPECT_FALSE(std::signbit(negZero));
