@@ -1457,6 +1457,8 @@ struct Isa<32> : Halves<32> {
     static constexpr bool isF = std::is_same_v<T, float>;
     template <class T>
     static constexpr bool isD = std::is_same_v<T, double>;
+    template <class T>
+    static constexpr bool isInt = std::is_integral_v<T>;
 
     // Per 16-byte block, as the instructions work: one instruction per step.
     template <class T>
@@ -1473,39 +1475,6 @@ struct Isa<32> : Halves<32> {
             a = _mm256_unpacklo_epi64(t0, t2), b = _mm256_unpackhi_epi64(t0, t2);
             c = _mm256_unpacklo_epi64(t1, t3), d = _mm256_unpackhi_epi64(t1, t3);
         }
-    }
-    // Widening and saturating narrowing, per 16-byte block, as the
-    // instructions work.
-    template <class T>
-    static __m256i extension(__m256i a) {
-        if constexpr (std::is_unsigned_v<T>) return _mm256_setzero_si256();
-        else if constexpr (sizeof(T) == 1) return _mm256_cmpgt_epi8(_mm256_setzero_si256(), a);
-        else if constexpr (sizeof(T) == 2) return _mm256_srai_epi16(a, 15);
-        else return _mm256_srai_epi32(a, 31);
-    }
-    template <class T>
-    static __m256i widenLo(__m256i a) {
-        const __m256i e = extension<T>(a);
-        if constexpr (sizeof(T) == 1) return _mm256_unpacklo_epi8(a, e);
-        else if constexpr (sizeof(T) == 2) return _mm256_unpacklo_epi16(a, e);
-        else return _mm256_unpacklo_epi32(a, e);
-    }
-    template <class T>
-    static __m256i widenHi(__m256i a) {
-        const __m256i e = extension<T>(a);
-        if constexpr (sizeof(T) == 1) return _mm256_unpackhi_epi8(a, e);
-        else if constexpr (sizeof(T) == 2) return _mm256_unpackhi_epi16(a, e);
-        else return _mm256_unpackhi_epi32(a, e);
-    }
-    template <class To, class From>
-    static R<To> narrowSat(R<From> lo, R<From> hi) {
-        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>)
-            return _mm256_packus_epi16(lo, hi);
-        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>)
-            return _mm256_packs_epi16(lo, hi);
-        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>)
-            return _mm256_packs_epi32(lo, hi);
-        else return Base::template narrowSat<To, From>(lo, hi);
     }
 
     template <class T>
@@ -1630,13 +1599,87 @@ struct Isa<32> : Halves<32> {
     static R<T> min(R<T> a, R<T> b) {
         if constexpr (isF<T>) return _mm256_min_ps(a, b);
         else if constexpr (isD<T>) return _mm256_min_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm256_min_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm256_min_epi8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm256_min_epu16(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm256_min_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm256_min_epu32(a, b);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm256_min_epi32(a, b);
         else return Base::min<T>(a, b);
     }
     template <class T>
     static R<T> max(R<T> a, R<T> b) {
         if constexpr (isF<T>) return _mm256_max_ps(a, b);
         else if constexpr (isD<T>) return _mm256_max_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm256_max_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm256_max_epi8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm256_max_epu16(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm256_max_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm256_max_epu32(a, b);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm256_max_epi32(a, b);
         else return Base::max<T>(a, b);
+    }
+
+    // -- integer lanes per 16-byte block, one instruction where the
+    // 16-byte registers take one
+    template <class T>
+    static R<T> loadBlocks(const T* p, ptrdiff_t blockStride) {
+        if constexpr (!isInt<T>) return Base::loadBlocks<T>(p, blockStride);
+        else if (blockStride == 0) return _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(p)));
+        else return Base::loadBlocks<T>(p, blockStride);
+    }
+    static __m256i shuffleBytes(__m256i t, __m256i idx) { return _mm256_shuffle_epi8(t, idx); }
+    static __m256i mulAddPairs16(__m256i a, __m256i b) { return _mm256_madd_epi16(a, b); }
+    template <int N>
+    static __m256i shiftBytesUp(__m256i a) { return _mm256_bslli_epi128(a, N); }
+    template <int N>
+    static __m256i shiftBytesDown(__m256i a) { return _mm256_bsrli_epi128(a, N); }
+    template <class T>
+    static R<T> zipLo(R<T> a, R<T> b) {
+        if constexpr (!isInt<T>) return Base::zipLo<T>(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm256_unpacklo_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm256_unpacklo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm256_unpacklo_epi32(a, b);
+        else return _mm256_unpacklo_epi64(a, b);
+    }
+    template <class T>
+    static R<T> zipHi(R<T> a, R<T> b) {
+        if constexpr (!isInt<T>) return Base::zipHi<T>(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm256_unpackhi_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm256_unpackhi_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm256_unpackhi_epi32(a, b);
+        else return _mm256_unpackhi_epi64(a, b);
+    }
+    // The lanes' upper halves when widened: zero, or copies of the sign.
+    template <class T>
+    static __m256i extension(__m256i a) {
+        if constexpr (std::is_unsigned_v<T>) return _mm256_setzero_si256();
+        else if constexpr (sizeof(T) == 1) return _mm256_cmpgt_epi8(_mm256_setzero_si256(), a);
+        else if constexpr (sizeof(T) == 2) return _mm256_srai_epi16(a, 15);
+        else return _mm256_srai_epi32(a, 31);
+    }
+    template <class T>
+    static R<Wider<T>> widenLo(R<T> a) {
+        if constexpr (isInt<T> && sizeof(T) <= 4) return zipLo<T>(a, extension<T>(a));
+        else return Base::widenLo<T>(a);
+    }
+    template <class T>
+    static R<Wider<T>> widenHi(R<T> a) {
+        if constexpr (isInt<T> && sizeof(T) <= 4) return zipHi<T>(a, extension<T>(a));
+        else return Base::widenHi<T>(a);
+    }
+    template <class To, class From>
+    static R<To> narrowSat(R<From> lo, R<From> hi) {
+        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>) return _mm256_packus_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>) return _mm256_packs_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>) return _mm256_packs_epi32(lo, hi);
+        else return Base::narrowSat<To, From>(lo, hi);
+    }
+    using Base::addPairs;
+    template <class T>
+    static R<T> addPairs(R<T> a, R<T> b) {
+        if constexpr (std::is_same_v<T, int32_t> || std::is_same_v<T, uint32_t>) return _mm256_hadd_epi32(a, b);
+        else return Base::addPairs<T>(a, b);
     }
 
     // Three interleaved byte channels, 96 bytes: each 16-byte lane does the
@@ -1766,11 +1809,6 @@ struct Isa<32> : Halves<32> {
     static __m256 doubleToFloatInOrder(__m256d lo, __m256d hi) {
         return _mm256_insertf128_ps(_mm256_castps128_ps256(_mm256_cvtpd_ps(lo)), _mm256_cvtpd_ps(hi), 1);
     }
-    template <class W, class N>
-    static R<W> loadWidened(const N* p) {
-        if constexpr (isD<W> && isF<N>) return _mm256_cvtps_pd(_mm_loadu_ps(p));
-        else return Base::template loadWidened<W, N>(p);
-    }
 
     // -- whole-register lane order: vpmovsx / vpmovzx, and packs whose
     // 64-bit chunks are put back in order
@@ -1823,6 +1861,8 @@ struct Isa<64> : Halves<64> {
     static constexpr bool isF = std::is_same_v<T, float>;
     template <class T>
     static constexpr bool isD = std::is_same_v<T, double>;
+    template <class T>
+    static constexpr bool isInt = std::is_integral_v<T>;
 
     // Per 16-byte block, as the instructions work: one instruction per step.
     template <class T>
@@ -1839,39 +1879,6 @@ struct Isa<64> : Halves<64> {
             a = _mm512_unpacklo_epi64(t0, t2), b = _mm512_unpackhi_epi64(t0, t2);
             c = _mm512_unpacklo_epi64(t1, t3), d = _mm512_unpackhi_epi64(t1, t3);
         }
-    }
-    // Widening and saturating narrowing, per 16-byte block, as the
-    // instructions work.
-    template <class T>
-    static __m512i extension(__m512i a) {
-        if constexpr (std::is_unsigned_v<T>) return _mm512_setzero_si512();
-        else if constexpr (sizeof(T) == 1) return _mm512_movm_epi8(_mm512_movepi8_mask(a));
-        else if constexpr (sizeof(T) == 2) return _mm512_srai_epi16(a, 15);
-        else return _mm512_srai_epi32(a, 31);
-    }
-    template <class T>
-    static __m512i widenLo(__m512i a) {
-        const __m512i e = extension<T>(a);
-        if constexpr (sizeof(T) == 1) return _mm512_unpacklo_epi8(a, e);
-        else if constexpr (sizeof(T) == 2) return _mm512_unpacklo_epi16(a, e);
-        else return _mm512_unpacklo_epi32(a, e);
-    }
-    template <class T>
-    static __m512i widenHi(__m512i a) {
-        const __m512i e = extension<T>(a);
-        if constexpr (sizeof(T) == 1) return _mm512_unpackhi_epi8(a, e);
-        else if constexpr (sizeof(T) == 2) return _mm512_unpackhi_epi16(a, e);
-        else return _mm512_unpackhi_epi32(a, e);
-    }
-    template <class To, class From>
-    static R<To> narrowSat(R<From> lo, R<From> hi) {
-        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>)
-            return _mm512_packus_epi16(lo, hi);
-        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>)
-            return _mm512_packs_epi16(lo, hi);
-        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>)
-            return _mm512_packs_epi32(lo, hi);
-        else return Base::template narrowSat<To, From>(lo, hi);
     }
 
     template <class T>
@@ -1993,13 +2000,109 @@ struct Isa<64> : Halves<64> {
     static R<T> min(R<T> a, R<T> b) {
         if constexpr (isF<T>) return _mm512_min_ps(a, b);
         else if constexpr (isD<T>) return _mm512_min_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm512_min_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm512_min_epi8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm512_min_epu16(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm512_min_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm512_min_epu32(a, b);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm512_min_epi32(a, b);
         else return Base::min<T>(a, b);
     }
     template <class T>
     static R<T> max(R<T> a, R<T> b) {
         if constexpr (isF<T>) return _mm512_max_ps(a, b);
         else if constexpr (isD<T>) return _mm512_max_pd(a, b);
+        else if constexpr (std::is_same_v<T, uint8_t>) return _mm512_max_epu8(a, b);
+        else if constexpr (std::is_same_v<T, int8_t>) return _mm512_max_epi8(a, b);
+        else if constexpr (std::is_same_v<T, uint16_t>) return _mm512_max_epu16(a, b);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm512_max_epi16(a, b);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm512_max_epu32(a, b);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm512_max_epi32(a, b);
         else return Base::max<T>(a, b);
+    }
+
+    // -- integer lanes per 16-byte block, one instruction where the
+    // 16-byte registers take one
+    template <class T>
+    static R<T> loadBlocks(const T* p, ptrdiff_t blockStride) {
+        if constexpr (!isInt<T>) {
+            return Base::loadBlocks<T>(p, blockStride);
+        } else {
+            const auto block = [&](int b) {
+                return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + blockStride * b));
+            };
+            if (blockStride == 0) return _mm512_broadcast_i32x4(block(0));
+            __m512i v = _mm512_castsi128_si512(block(0));
+            v = _mm512_inserti32x4(v, block(1), 1);
+            v = _mm512_inserti32x4(v, block(2), 2);
+            return _mm512_inserti32x4(v, block(3), 3);
+        }
+    }
+    template <class T>
+    static void storeBlocks(T* p, ptrdiff_t blockStride, R<T> v) {
+        if constexpr (!isInt<T>) {
+            Base::storeBlocks<T>(p, blockStride, v);
+        } else {
+            const auto at = [&](int b) { return reinterpret_cast<__m128i*>(p + blockStride * b); };
+            _mm_storeu_si128(at(0), _mm512_castsi512_si128(v));
+            _mm_storeu_si128(at(1), _mm512_extracti32x4_epi32(v, 1));
+            _mm_storeu_si128(at(2), _mm512_extracti32x4_epi32(v, 2));
+            _mm_storeu_si128(at(3), _mm512_extracti32x4_epi32(v, 3));
+        }
+    }
+    static __m512i shuffleBytes(__m512i t, __m512i idx) { return _mm512_shuffle_epi8(t, idx); }
+    static __m512i mulAddPairs16(__m512i a, __m512i b) { return _mm512_madd_epi16(a, b); }
+    template <int N>
+    static __m512i shiftBytesUp(__m512i a) { return _mm512_bslli_epi128(a, N); }
+    template <int N>
+    static __m512i shiftBytesDown(__m512i a) { return _mm512_bsrli_epi128(a, N); }
+    template <class T>
+    static R<T> zipLo(R<T> a, R<T> b) {
+        if constexpr (!isInt<T>) return Base::zipLo<T>(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm512_unpacklo_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm512_unpacklo_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm512_unpacklo_epi32(a, b);
+        else return _mm512_unpacklo_epi64(a, b);
+    }
+    template <class T>
+    static R<T> zipHi(R<T> a, R<T> b) {
+        if constexpr (!isInt<T>) return Base::zipHi<T>(a, b);
+        else if constexpr (sizeof(T) == 1) return _mm512_unpackhi_epi8(a, b);
+        else if constexpr (sizeof(T) == 2) return _mm512_unpackhi_epi16(a, b);
+        else if constexpr (sizeof(T) == 4) return _mm512_unpackhi_epi32(a, b);
+        else return _mm512_unpackhi_epi64(a, b);
+    }
+    // The lanes' upper halves when widened: zero, or copies of the sign.
+    template <class T>
+    static __m512i extension(__m512i a) {
+        if constexpr (std::is_unsigned_v<T>) return _mm512_setzero_si512();
+        else if constexpr (sizeof(T) == 1) return _mm512_movm_epi8(_mm512_movepi8_mask(a));
+        else if constexpr (sizeof(T) == 2) return _mm512_srai_epi16(a, 15);
+        else return _mm512_srai_epi32(a, 31);
+    }
+    template <class T>
+    static R<Wider<T>> widenLo(R<T> a) {
+        if constexpr (isInt<T> && sizeof(T) <= 4) return zipLo<T>(a, extension<T>(a));
+        else return Base::widenLo<T>(a);
+    }
+    template <class T>
+    static R<Wider<T>> widenHi(R<T> a) {
+        if constexpr (isInt<T> && sizeof(T) <= 4) return zipHi<T>(a, extension<T>(a));
+        else return Base::widenHi<T>(a);
+    }
+    template <class To, class From>
+    static R<To> narrowSat(R<From> lo, R<From> hi) {
+        if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, uint8_t>) return _mm512_packus_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int16_t> && std::is_same_v<To, int8_t>) return _mm512_packs_epi16(lo, hi);
+        else if constexpr (std::is_same_v<From, int32_t> && std::is_same_v<To, int16_t>) return _mm512_packs_epi32(lo, hi);
+        else return Base::narrowSat<To, From>(lo, hi);
+    }
+    using Base::addPairs;
+    template <class T>
+    static R<T> addPairs(R<T> a, R<T> b) {
+        if constexpr (std::is_same_v<T, int32_t> || std::is_same_v<T, uint32_t>) return _mm512_add_epi32(_mm512_castps_si512(_mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), 0x88)),
+                                    _mm512_castps_si512(_mm512_shuffle_ps(_mm512_castsi512_ps(a), _mm512_castsi512_ps(b), 0xDD)));
+        else return Base::addPairs<T>(a, b);
     }
 
     // 8-byte chunks 0, 2, 4, 6 (lanes 0, 1 of each block) first, then 1, 3, 5, 7.
@@ -2108,11 +2211,6 @@ struct Isa<64> : Halves<64> {
     }
     static __m512 doubleToFloatInOrder(__m512d lo, __m512d hi) {
         return _mm512_insertf32x8(_mm512_castps256_ps512(_mm512_cvtpd_ps(lo)), _mm512_cvtpd_ps(hi), 1);
-    }
-    template <class W, class N>
-    static R<W> loadWidened(const N* p) {
-        if constexpr (isD<W> && isF<N>) return _mm512_cvtps_pd(_mm256_loadu_ps(p));
-        else return Base::template loadWidened<W, N>(p);
     }
 
     // -- whole-register lane order (see Isa<32>)

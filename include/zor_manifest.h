@@ -993,11 +993,11 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriDeinterlaceFilterTriangle_8u_C1R,
  * more counts as 0; 16u forms store the truncated sum modulo 2^16 (NaN and
  * magnitudes of 2^63 or more give 0).  A null coefficient pointer selects
  * the default weights. */
-ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToYCbCr_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriRGBToYCbCr_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCrToRGB_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriYCbCrToRGB_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToHSV_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriRGBToHSV_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_GENERIC, Status, zoriHSVToRGB_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
@@ -1013,15 +1013,15 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToYCbCr422_8u_C3C2R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCr422ToRGB_8u_C2C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriBGRToYCbCr420_8u_C3P3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriBGRToYCbCr420_8u_C3P3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* const pDst[3], const int dstStep[3], ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriYCbCr420ToBGR_8u_P3C3R,
        (const uint8_t* const pSrc[3], const int srcStep[3], uint8_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriRGBToGray_8u_C3C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriRGBToGray_8u_C3C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriColorToGray_8u_C3C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriColorToGray_8u_C3C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriColorToGray_8u_AC4C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriColorToGray_8u_AC4C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))
 ZOR_FN(ZOR_GENERIC, Status, zoriColorToGray_16u_C3C1R,
        (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize, const float coeffs[3]))

@@ -20,46 +20,57 @@ using I32 = simd::Vec<int32_t>;
 using U32 = simd::Vec<uint32_t>;
 using F32 = simd::Vec<float>;
 
-// The rows below take 16 pixels at a time in four groups of four (one
-// 32-bit lane per pixel), laid out for 16-byte registers.
-static_assert(U8::kBytes == 16, "pixel groups are laid out for 16-byte registers");
-constexpr int kBlock = 16;
+// The rows work on groups of 16 pixels in four quarters of four (one
+// 32-bit lane per pixel), laid out for a 16-byte block: each 16-byte block
+// of a register works on a group of its own, consecutive groups in
+// consecutive blocks, so that every shuffle and widening (per block) keeps
+// its meaning at any register width.  Loads and stores move each block
+// from or to its own group (loadBlocks / storeBlocks at the group's
+// stride).  A row steps kPixels pixels (16 per block); B names the register
+// width where a row keeps to 16 bytes.
+constexpr int kPixels = U8::kLanes;
+template <class T, int B>
+using Reg = simd::Vec<T, B>;
 
-// The bytes of four 32-bit registers, saturated: lanes of group k to bytes 4k..4k+3.
-inline U8 toBytes(const I32 (&v)[4]) {
+// The bytes of four 32-bit registers, saturated: lanes of quarter k to bytes 4k..4k+3.
+template <int B>
+inline Reg<uint8_t, B> toBytes(const Reg<int32_t, B> (&v)[4]) {
     return simd::narrowSat<uint8_t>(simd::narrowSat<int16_t>(v[0], v[1]), simd::narrowSat<int16_t>(v[2], v[3]));
 }
 
 // w0 a + w1 b for the words (a, b) of every 32-bit lane (a the lower),
 // exact (modulo 2^32); a weight outside 16 bits (up to 65535 in
 // magnitude) is applied as w -+ 65536 plus or minus 65536 times its word.
-inline I16 pairWeights(int w0, int w1) {
-    return simd::bitcast<int16_t>(simd::set1<I32>(static_cast<int32_t>(uint32_t(w1) << 16 | uint16_t(w0))));
+template <int B = U8::kBytes>
+inline Reg<int16_t, B> pairWeights(int w0, int w1) {
+    return simd::bitcast<int16_t>(simd::set1<Reg<int32_t, B>>(static_cast<int32_t>(uint32_t(w1) << 16 | uint16_t(w0))));
 }
 constexpr int inWord(int w) { return w > 32767 ? w - 65536 : w < -32768 ? w + 65536 : w; }
-template <int W0, int W1>
-inline I32 dot(I16 p) {
+template <int W0, int W1, int B>
+inline Reg<int32_t, B> dot(Reg<int16_t, B> p) {
+    using S = Reg<int32_t, B>;
     constexpr int l0 = inWord(W0), l1 = inWord(W1);
     static_assert(W0 >= -65535 && W0 <= 65535 && W1 >= -65535 && W1 <= 65535, "weights of at most 16 bits");
-    I32 r = simd::mulAddPairs(p, pairWeights(l0, l1));
-    const I32 words = simd::bitcast<int32_t>(p);
-    const I32 low = simd::shl<16>(words), high = words & simd::set1<I32>(int32_t(0xFFFF0000u));
+    S r = simd::mulAddPairs(p, pairWeights<B>(l0, l1));
+    const S words = simd::bitcast<int32_t>(p);
+    const S low = simd::shl<16>(words), high = words & simd::set1<S>(int32_t(0xFFFF0000u));
     if constexpr (l0 < W0) r = r + low;
     if constexpr (l0 > W0) r = r - low;
     if constexpr (l1 < W1) r = r + high;
     if constexpr (l1 > W1) r = r - high;
     return r;
 }
-template <int K>
-inline I32 plus(I32 v) {
+template <int K, int B>
+inline Reg<int32_t, B> plus(Reg<int32_t, B> v) {
     if constexpr (K == 0) return v;
-    else return v + simd::set1<I32>(K);
+    else return v + simd::set1<Reg<int32_t, B>>(K);
 }
 
-// Sixteen pixels of three bytes (48 bytes), handing out pairs of their
-// channels as 16-bit words: pairs<A, B>(k) holds (channel A, channel B) of
-// pixels 4k .. 4k+3, B < 0 gives (A, 0).  SSSE3 shuffles each pair register
-// straight out of the bytes; SSE2 separates the channels first.
+// Groups of sixteen pixels of three bytes (48 bytes), handing out pairs of
+// their channels as 16-bit words: pairs<A, C>(k) holds (channel A, channel
+// C) of pixels 4k .. 4k+3 of each group, C < 0 gives (A, 0).  SSSE3
+// shuffles each pair register straight out of the bytes; SSE2 separates the
+// channels first (16-byte registers only).
 #  if ZOR_SIMD >= 4
 struct ByteMask {
     uint8_t m[16];
@@ -77,40 +88,44 @@ template <int A, int B, int At>
 alignas(16) inline constexpr ByteMask kPairMask = pairMask(A, B, At);
 #  endif
 
-class Pixels16 {
+template <int B = U8::kBytes>
+class Pixels {
 public:
-    explicit Pixels16(const uint8_t* p) {
+    using Bytes = Reg<uint8_t, B>;
+    explicit Pixels(const uint8_t* p) {
 #  if ZOR_SIMD >= 4
-        // groups 0..2 at the start of their loads; group 3 from byte 4 of the
-        // last 16 bytes, so that nothing past the 48 bytes is read
-        for (int k = 0; k < 4; ++k) part_[k] = simd::load<U8>(p + (k < 3 ? 12 * k : 32));
+        // quarters 0..2 at the start of their loads; quarter 3 from byte 4 of
+        // the last 16 bytes, so that nothing past the 48 bytes is read
+        for (int k = 0; k < 4; ++k) part_[k] = simd::loadBlocks<Bytes>(p + (k < 3 ? 12 * k : 32), 48);
 #  else
+        static_assert(B == 16, "SSE2 pixel groups fill 16-byte registers");
         simd::loadInterleaved3(p, plane_[0], plane_[1], plane_[2]);
 #  endif
     }
-    template <int A, int B>
-    I16 pairs(int k) const {
+    template <int A, int C>
+    Reg<int16_t, B> pairs(int k) const {
 #  if ZOR_SIMD >= 4
-        const ByteMask& m = k < 3 ? kPairMask<A, B, 0> : kPairMask<A, B, 4>;
-        return simd::bitcast<int16_t>(simd::shuffleBytes(part_[k], simd::fromLanes<U8>(m.m)));
+        const ByteMask& m = k < 3 ? kPairMask<A, C, 0> : kPairMask<A, C, 4>;
+        return simd::bitcast<int16_t>(simd::shuffleBytes(part_[k], simd::loadBlocks<Bytes>(m.m, 0)));
 #  else
-        const U8 b = B < 0 ? simd::zero<U8>() : plane_[B < 0 ? 0 : B];
-        const U8 ab = k < 2 ? simd::zipLo(plane_[A], b) : simd::zipHi(plane_[A], b);
-        return simd::bitcast<int16_t>(k % 2 ? simd::widenHi(ab) : simd::widenLo(ab));
+        const Bytes c = C < 0 ? simd::zero<Bytes>() : plane_[C < 0 ? 0 : C];
+        const Bytes ac = k < 2 ? simd::zipLo(plane_[A], c) : simd::zipHi(plane_[A], c);
+        return simd::bitcast<int16_t>(k % 2 ? simd::widenHi(ac) : simd::widenLo(ac));
 #  endif
     }
 
 private:
 #  if ZOR_SIMD >= 4
-    U8 part_[4];
+    Bytes part_[4];
 #  else
-    U8 plane_[3];
+    Bytes plane_[3];
 #  endif
 };
 
-// Words (a, b) of pixels 4k .. 4k+3 from two byte registers of 16 pixels.
-inline I16 zipWords(U8 a, U8 b, int k) {
-    const U8 ab = k < 2 ? simd::zipLo(a, b) : simd::zipHi(a, b);
+// Words (a, b) of pixels 4k .. 4k+3 from two byte registers of 16 pixels a block.
+template <int B>
+inline Reg<int16_t, B> zipWords(Reg<uint8_t, B> a, Reg<uint8_t, B> b, int k) {
+    const Reg<uint8_t, B> ab = k < 2 ? simd::zipLo(a, b) : simd::zipHi(a, b);
     return simd::bitcast<int16_t>(k % 2 ? simd::widenHi(ab) : simd::widenLo(ab));
 }
 
@@ -118,26 +133,29 @@ inline I16 zipWords(U8 a, U8 b, int k) {
 // time, to interleaved bytes.  Saturating: the lanes are values, narrowed
 // with saturation.  Otherwise they are sums whose bits 16..23 are the value
 // (0 <= sum < 2^24), and SSSE3 picks those bytes straight into place.
-// put(k, ...) takes group k; SSSE3 stores groups 0..2 16 bytes wide (the
-// last 4 are the next group's, which overwrites them), group 3 with the
-// end of group 2.
-template <bool Saturating>
+// put(k, ...) takes quarter k of each group; SSSE3 stores quarters 0..2
+// 16 bytes wide (the last 4 are the next quarter's, which overwrites them),
+// quarter 3 with the end of quarter 2.
+template <bool Saturating, int B = U8::kBytes>
 class Interleave3 {
 public:
+    using Bytes = Reg<uint8_t, B>;
+    using Sums = Reg<int32_t, B>;
     explicit Interleave3(uint8_t* d) : d_(d) {}
-    void put(int k, I32 a, I32 b, I32 c) {
+    void put(int k, Sums a, Sums b, Sums c) {
 #  if ZOR_SIMD >= 4
         const int at = k == 3;
-        U8 bytes;
+        Bytes bytes;
         if constexpr (Saturating) {
-            const U8 v = simd::narrowSat<uint8_t>(simd::narrowSat<int16_t>(a, b), simd::narrowSat<int16_t>(c, c));
+            const Bytes v = simd::narrowSat<uint8_t>(simd::narrowSat<int16_t>(a, b), simd::narrowSat<int16_t>(c, c));
             bytes = simd::shuffleBytes(v, mask(3, at));  // a0..3 b0..3 c0..3 to pixel order
         } else {
             bytes = pick(a, 0, at) | pick(b, 1, at) | pick(c, 2, at);
         }
-        if (k < 3) simd::store(d_ + 12 * k, third_ = bytes);
-        else simd::store(d_ + 32, simd::shiftBytesDown<8>(third_) | bytes);
+        if (k < 3) simd::storeBlocks(d_ + 12 * k, 48, third_ = bytes);
+        else simd::storeBlocks(d_ + 32, 48, simd::shiftBytesDown<8>(third_) | bytes);
 #  else
+        static_assert(B == 16, "SSE2 pixel groups fill 16-byte registers");
         if constexpr (!Saturating) a = simd::shr<16>(a), b = simd::shr<16>(b), c = simd::shr<16>(c);
         a_[k] = a, b_[k] = b, c_[k] = c;
         if (k == 3) simd::storeInterleaved3(d_, toBytes(a_), toBytes(b_), toBytes(c_));
@@ -163,14 +181,14 @@ private:
             }
         return t;
     }
-    static U8 mask(int ch, int at) {
+    static Bytes mask(int ch, int at) {
         alignas(16) static constexpr Masks kMasks = masks();
-        return simd::fromLanes<U8>(kMasks.m[ch][at]);
+        return simd::loadBlocks<Bytes>(kMasks.m[ch][at], 0);
     }
-    static U8 pick(I32 v, int ch, int at) { return simd::shuffleBytes(simd::bitcast<uint8_t>(v), mask(ch, at)); }
-    U8 third_;
+    static Bytes pick(Sums v, int ch, int at) { return simd::shuffleBytes(simd::bitcast<uint8_t>(v), mask(ch, at)); }
+    Bytes third_;
 #  else
-    I32 a_[4], b_[4], c_[4];
+    Sums a_[4], b_[4], c_[4];
 #  endif
 };
 
@@ -180,8 +198,8 @@ private:
 
 inline int ycbcrRowSimd(const uint8_t* s, uint8_t* d, int n) {
     int x = 0;
-    for (; x + kBlock <= n; x += kBlock) {
-        const Pixels16 px(s + 3 * x);
+    for (; x + kPixels <= n; x += kPixels) {
+        const Pixels<> px(s + 3 * x);
         Interleave3<false> out(d + 3 * x);
         for (int k = 0; k < 4; ++k) {
             const I16 rg = px.pairs<0, 1>(k), bg = px.pairs<2, 1>(k);
@@ -200,12 +218,13 @@ inline int ycbcrRowSimd(const uint8_t* s, uint8_t* d, int n) {
 // -53281 cr = -10656 (5 cr) - cr.  Pairs (y, cr), (y, cb), (cb, cr) of raw
 // bytes; YO and CO are the offsets taken off luma and chroma, K the forms'
 // constants.
-template <int YO, int CO, int KR, int KG, int KB>
-inline void rgbOfPairs(I16 ycr, I16 ycb, I16 cbcr, I32& r, I32& g, I32& b) {
-    const auto scaled = [](I16 p, int sy, int sc, int oc) {
-        return p * pairWeights(sy, sc) - pairWeights(sy * YO, sc * oc);
+template <int YO, int CO, int KR, int KG, int KB, int B>
+inline void rgbOfPairs(Reg<int16_t, B> ycr, Reg<int16_t, B> ycb, Reg<int16_t, B> cbcr, Reg<int32_t, B>& r,
+                       Reg<int32_t, B>& g, Reg<int32_t, B>& b) {
+    const auto scaled = [](Reg<int16_t, B> p, int sy, int sc, int oc) {
+        return p * pairWeights<B>(sy, sc) - pairWeights<B>(sy * YO, sc * oc);
     };
-    const I16 yr = scaled(ycr, 4, 5, CO), yb = scaled(ycb, 4, 6, CO), c = cbcr - pairWeights(CO, CO);
+    const Reg<int16_t, B> yr = scaled(ycr, 4, 5, CO), yb = scaled(ycb, 4, 6, CO), c = cbcr - pairWeights<B>(CO, CO);
     r = simd::shr<16>(plus<KR>(dot<19071, 20919>(yr)));
     g = simd::shr<16>(plus<KG>(dot<19071, -10656>(yr) + dot<-25690, -1>(c)));
     b = simd::shr<16>(plus<KB>(dot<19071, 22031>(yb)));
@@ -213,8 +232,8 @@ inline void rgbOfPairs(I16 ycr, I16 ycb, I16 cbcr, I32& r, I32& g, I32& b) {
 
 inline int rgbRowSimd(const uint8_t* s, uint8_t* d, int n) {
     int x = 0;
-    for (; x + kBlock <= n; x += kBlock) {
-        const Pixels16 px(s + 3 * x);
+    for (; x + kPixels <= n; x += kPixels) {
+        const Pixels<> px(s + 3 * x);
         Interleave3<true> out(d + 3 * x);
         for (int k = 0; k < 4; ++k) {
             I32 r, g, b;
@@ -225,13 +244,13 @@ inline int rgbRowSimd(const uint8_t* s, uint8_t* d, int n) {
     return x;
 }
 
-// 16 pixels from luma bytes and 8 chroma bytes each (one per pixel pair).
-template <int YO, int CO, int KR, int KG, int KB, bool Bgr>
-inline void rgbOfPairedChroma(U8 luma, U8 cb8, U8 cr8, uint8_t* d) {
-    const U8 cb = simd::zipLo(cb8, cb8), cr = simd::zipLo(cr8, cr8);
-    Interleave3<true> out(d);
+// 16 pixels a block from luma bytes and 8 chroma bytes each (one per pixel pair).
+template <int YO, int CO, int KR, int KG, int KB, bool Bgr, int B>
+inline void rgbOfPairedChroma(Reg<uint8_t, B> luma, Reg<uint8_t, B> cb8, Reg<uint8_t, B> cr8, uint8_t* d) {
+    const Reg<uint8_t, B> cb = simd::zipLo(cb8, cb8), cr = simd::zipLo(cr8, cr8);
+    Interleave3<true, B> out(d);
     for (int k = 0; k < 4; ++k) {
-        I32 r, g, b;
+        Reg<int32_t, B> r, g, b;
         rgbOfPairs<YO, CO, KR, KG, KB>(zipWords(luma, cr, k), zipWords(luma, cb, k), zipWords(cb, cr, k), r, g, b);
         if constexpr (Bgr) out.put(k, b, g, r);
         else out.put(k, r, g, b);
@@ -239,8 +258,9 @@ inline void rgbOfPairedChroma(U8 luma, U8 cb8, U8 cr8, uint8_t* d) {
 }
 
 // Rows of 4:2:2 quadruples Y0 Cb Y1 Cr: the even bytes are luma, the odd
-// ones alternate Cb and Cr.
+// ones alternate Cb and Cr.  16-byte registers.
 inline int unpack422RowSimd(const uint8_t* s, uint8_t* d, int n) {
+    using U16 = Reg<uint16_t, 16>;
     const U16 low = simd::set1<U16>(0x00FF);
     const auto evens = [&](U16 a, U16 b) {
         return simd::narrowSat<uint8_t>(simd::bitcast<int16_t>(a & low), simd::bitcast<int16_t>(b & low));
@@ -249,7 +269,7 @@ inline int unpack422RowSimd(const uint8_t* s, uint8_t* d, int n) {
         return simd::narrowSat<uint8_t>(simd::bitcast<int16_t>(simd::shr<8>(a)), simd::bitcast<int16_t>(simd::shr<8>(b)));
     };
     int x = 0;
-    for (; x + kBlock <= n; x += kBlock) {
+    for (; x + 16 <= n; x += 16) {
         const U16 q0 = simd::loadFrom<U16>(s + 2 * x), q1 = simd::loadFrom<U16>(s + 2 * x + 16);
         const U16 chroma = simd::bitcast<uint16_t>(odds(q0, q1));  // Cb Cr Cb Cr ...
         rgbOfPairedChroma<0, 0, -14608761, 8887730, -18140365, false>(
@@ -259,12 +279,13 @@ inline int unpack422RowSimd(const uint8_t* s, uint8_t* d, int n) {
 }
 
 // 4:2:0 planes to BGR, one luma row: rounds to nearest (32768 before the
-// shift of the centred sums).
+// shift of the centred sums).  16-byte registers.
 inline int unplanar420RowSimd(const uint8_t* luma, const uint8_t* cb, const uint8_t* cr, uint8_t* d, int blocks) {
+    using Bytes = Reg<uint8_t, 16>;
     int j = 0;
-    for (; j + kBlock / 2 <= blocks; j += kBlock / 2)
-        rgbOfPairedChroma<16, 128, 32768, 32768, 32768, true>(simd::load<U8>(luma + 2 * j), simd::loadHalf<U8>(cb + j),
-                                                            simd::loadHalf<U8>(cr + j), d + 6 * j);
+    for (; j + 8 <= blocks; j += 8)
+        rgbOfPairedChroma<16, 128, 32768, 32768, 32768, true>(simd::load<Bytes>(luma + 2 * j), simd::loadHalf<Bytes>(cb + j),
+                                                            simd::loadHalf<Bytes>(cr + j), d + 6 * j);
     return j;
 }
 
@@ -272,15 +293,24 @@ inline int unplanar420RowSimd(const uint8_t* luma, const uint8_t* cb, const uint
 
 // Chroma sums (times the weights) of 16 pixels' word pairs rg and bg, a
 // 32-bit lane per pixel; shifted by Shift after adding the offset K.
-inline I32 cbSum(I16 rg, I16 bg) { return dot<-9699, -19071>(rg) + dot<28770, 0>(bg); }
-inline I32 crSum(I16 rg, I16 bg) { return dot<28770, -24117>(rg) + dot<-4653, 0>(bg); }
+template <int B>
+inline Reg<int32_t, B> cbSum(Reg<int16_t, B> rg, Reg<int16_t, B> bg) {
+    return dot<-9699, -19071>(rg) + dot<28770, 0>(bg);
+}
+template <int B>
+inline Reg<int32_t, B> crSum(Reg<int16_t, B> rg, Reg<int16_t, B> bg) {
+    return dot<28770, -24117>(rg) + dot<-4653, 0>(bg);
+}
 
+// 16-byte registers.
 inline int packed422RowSimd(const uint8_t* s, uint8_t* d, int n) {
+    using I16 = Reg<int16_t, 16>;
+    using I32 = Reg<int32_t, 16>;
     // luma with the rounding half on even pixels only; chroma of pair sums
     const I32 round = simd::bitcast<int32_t>(simd::zipLo(simd::set1<I32>(1081344), simd::set1<I32>(1048576)));
     int x = 0;
-    for (; x + kBlock <= n; x += kBlock) {
-        const Pixels16 px(s + 3 * x);
+    for (; x + 16 <= n; x += 16) {
+        const Pixels<16> px(s + 3 * x);
         I32 y[4], cbs[4], crs[4];
         for (int k = 0; k < 4; ++k) {
             const I16 rg = px.pairs<0, 1>(k), bg = px.pairs<2, 1>(k);
@@ -296,7 +326,7 @@ inline int packed422RowSimd(const uint8_t* s, uint8_t* d, int n) {
         }
         const I32 pairs[4] = {simd::zipLo(cb[0], cr[0]), simd::zipHi(cb[0], cr[0]), simd::zipLo(cb[1], cr[1]),
                               simd::zipHi(cb[1], cr[1])};
-        const U8 luma = toBytes(y), chroma = toBytes(pairs);
+        const Reg<uint8_t, 16> luma = toBytes(y), chroma = toBytes(pairs);
         simd::store(d + 2 * x, simd::zipLo(luma, chroma));
         simd::store(d + 2 * x + 16, simd::zipHi(luma, chroma));
     }
@@ -304,7 +334,7 @@ inline int packed422RowSimd(const uint8_t* s, uint8_t* d, int n) {
 }
 
 // Two BGR rows to two luma rows and one row of each chroma plane, 8 blocks of
-// 2 x 2 at a time.  The chroma starts from the pairs' sums over the two rows
+// 2 x 2 a register block at a time.  The chroma starts from the pairs' sums over the two rows
 // and then over neighbouring pixels (a 32-bit lane holds a pair of 16-bit
 // sums below 1021, so adding lanes adds the sums), weighted once per block.
 inline int planar420RowsSimd(const uint8_t* s0, const uint8_t* s1, uint8_t* y0, uint8_t* y1, uint8_t* cb,
@@ -313,8 +343,8 @@ inline int planar420RowsSimd(const uint8_t* s0, const uint8_t* s1, uint8_t* y0, 
         return simd::bitcast<int16_t>(simd::addPairs(simd::bitcast<int32_t>(a), simd::bitcast<int32_t>(b)));
     };
     int j = 0;
-    for (; j + kBlock / 2 <= blocks; j += kBlock / 2) {
-        const Pixels16 a(s0 + 6 * j), b(s1 + 6 * j);
+    for (; j + kPixels / 2 <= blocks; j += kPixels / 2) {
+        const Pixels<> a(s0 + 6 * j), b(s1 + 6 * j);
         I32 ya[4], yb[4], c[4];
         I16 rg[4], bg[4];
         for (int k = 0; k < 4; ++k) {
@@ -332,9 +362,11 @@ inline int planar420RowsSimd(const uint8_t* s0, const uint8_t* s1, uint8_t* y0, 
             c[h] = simd::shr<18>(plus<33587200>(cbSum(rgs, bgs)));
             c[2 + h] = simd::shr<18>(plus<33587200>(crSum(rgs, bgs)));
         }
-        const U8 bytes = toBytes(c);  // Cb of the 8 blocks, then Cr
-        simd::storeHalf(cb + j, bytes);
-        simd::storeHalf(cr + j, simd::shiftBytesDown<8>(bytes));
+        // per register block: Cb of its 8 blocks, then Cr
+        simd::eachBlock(toBytes(c), [&](int k, Reg<uint8_t, 16> bytes) {
+            simd::storeHalf(cb + j + 8 * k, bytes);
+            simd::storeHalf(cr + j + 8 * k, simd::shiftBytesDown<8>(bytes));
+        });
     }
     return j;
 }
@@ -359,17 +391,18 @@ inline int grayRowSimd(const uint8_t* s, uint8_t* d, int n, const uint32_t (&w)[
     const I16 first = SC == 3 ? pairWeights(w0, w1) : pairWeights(w0, w2), second = SC == 3 ? pairWeights(w2, 0) : pairWeights(w1, 0);
     const U32 byteMask = simd::set1<U32>(0xFF), alternate = simd::set1<U32>(0x00FF00FF);
     int x = 0;
-    for (; x + kBlock <= n; x += kBlock) {
+    for (; x + kPixels <= n; x += kPixels) {
         I32 g[4];
         if constexpr (SC == 3) {
-            const Pixels16 px(s + 3 * x);
+            const Pixels<> px(s + 3 * x);
             for (int k = 0; k < 4; ++k)
                 g[k] = simd::mulAddPairs(px.pairs<0, 1>(k), first) + simd::mulAddPairs(px.pairs<2, -1>(k), second);
         } else {
             // a pixel is one 32-bit lane c0 c1 c2 alpha: channels 0 and 2,
-            // then 1 and alpha, as word pairs
+            // then 1 and alpha, as word pairs; quarter k of each group of
+            // 16 pixels (64 bytes)
             for (int k = 0; k < 4; ++k) {
-                const U32 p = simd::loadFrom<U32>(s + 4 * (x + 4 * k));
+                const U32 p = simd::bitcast<uint32_t>(simd::loadBlocks<U8>(s + 4 * x + 16 * k, 64));
                 g[k] = simd::mulAddPairs(simd::bitcast<int16_t>(p & alternate), first) +
                        simd::mulAddPairs(simd::bitcast<int16_t>(simd::shr<8>(p) & alternate), second);
             }
@@ -379,7 +412,7 @@ inline int grayRowSimd(const uint8_t* s, uint8_t* d, int n, const uint32_t (&w)[
             if (wraps) v = v & byteMask;
             g[k] = simd::bitcast<int32_t>(v);
         }
-        simd::store(d + x, toBytes(g));
+        simd::store(d + x, toBytes(g));  // groups in order: 16 bytes each
     }
     return x;
 }
@@ -401,7 +434,7 @@ inline I32 floorDiv(I32 num, I32 den) {
 inline int hsvRowSimd(const uint8_t* s, uint8_t* d, int n) {
     const U8 one = simd::set1<U8>(1);
     int x = 0;
-    for (; x + kBlock <= n; x += kBlock) {
+    for (; x + kPixels <= n; x += kPixels) {
         U8 r, g, b;
         simd::loadInterleaved3(s + 3 * x, r, g, b);
         const U8 mx = simd::max(simd::max(r, g), b), delta = mx - simd::min(simd::min(r, g), b);

@@ -30,16 +30,19 @@ using color::I32;
 using color::U16;
 using color::U8;
 using color::dot;
-using color::kBlock;
 using color::plus;
 using color::toBytes;
+
+// The rows below are laid out for 16-byte registers, 16 pixels at a time.
+static_assert(U8::kBytes == 16, "JPEG rows are laid out for 16-byte registers");
+constexpr int kBlock = 16;
 
 inline I32 lumaSum(I16 rg, I16 bg) { return dot<19595, 19235>(rg) + dot<7471, 19235>(bg); }
 
 inline int lumaRowSimd(const uint8_t* s, uint8_t* d, int n) {
     int x = 0;
     for (; x + kBlock <= n; x += kBlock) {
-        const color::Pixels16 px(s + 3 * x);
+        const color::Pixels<> px(s + 3 * x);
         I32 y[4];
         for (int k = 0; k < 4; ++k) y[k] = simd::shr<16>(plus<32768>(lumaSum(px.pairs<2, 1>(k), px.pairs<0, 1>(k))));
         simd::store(d + x, toBytes(y));
@@ -50,7 +53,7 @@ inline int lumaRowSimd(const uint8_t* s, uint8_t* d, int n) {
 inline int planesRowSimd(const uint8_t* s, uint8_t* const* d, int n) {
     int x = 0;
     for (; x + kBlock <= n; x += kBlock) {
-        const color::Pixels16 px(s + 3 * x);
+        const color::Pixels<> px(s + 3 * x);
         I32 y[4], cb[4], cr[4];
         for (int k = 0; k < 4; ++k) {
             const I16 rg = px.pairs<2, 1>(k), bg = px.pairs<0, 1>(k);
@@ -83,7 +86,7 @@ inline int sampleDownRowSimd(const uint8_t* s0, const uint8_t* s1, uint8_t* d, i
 // One row of a 4:2:2 MCU: 16 BGR pixels to the luma rows of the left and
 // right blocks and 8 chroma pairs, all level-shifted.
 inline bool mcuRowSimd(const uint8_t* s, int16_t* left, int16_t* right, int16_t* cb, int16_t* cr) {
-    const color::Pixels16 px(s);
+    const color::Pixels<> px(s);
     I32 y[4], cbs[4], crs[4];
     for (int k = 0; k < 4; ++k) {
         const I16 rg = px.pairs<2, 1>(k), bg = px.pairs<0, 1>(k);
