@@ -1476,6 +1476,14 @@ struct Isa<32> : Halves<32> {
             c = _mm256_unpacklo_epi64(t1, t3), d = _mm256_unpackhi_epi64(t1, t3);
         }
     }
+    // Lane order over the whole register: the even and odd lanes of the run
+    // a, b.
+    static void deinterleave(__m256 a, __m256 b, __m256& even, __m256& odd) {
+        const __m256d e = _mm256_castps_pd(_mm256_shuffle_ps(a, b, 0x88));
+        const __m256d o = _mm256_castps_pd(_mm256_shuffle_ps(a, b, 0xDD));
+        even = _mm256_castpd_ps(_mm256_permute4x64_pd(e, 0xD8));
+        odd = _mm256_castpd_ps(_mm256_permute4x64_pd(o, 0xD8));
+    }
 
     template <class T>
     static R<T> zero() {
@@ -1879,6 +1887,13 @@ struct Isa<64> : Halves<64> {
             a = _mm512_unpacklo_epi64(t0, t2), b = _mm512_unpackhi_epi64(t0, t2);
             c = _mm512_unpacklo_epi64(t1, t3), d = _mm512_unpackhi_epi64(t1, t3);
         }
+    }
+    // Lane order over the whole register: the even and odd lanes of the run
+    // a, b.
+    static void deinterleave(__m512 a, __m512 b, __m512& even, __m512& odd) {
+        const __m512i e = _mm512_setr_epi32(0, 2, 4, 6, 8, 10, 12, 14, 16, 18, 20, 22, 24, 26, 28, 30);
+        even = _mm512_permutex2var_ps(a, e, b);
+        odd = _mm512_permutex2var_ps(a, _mm512_add_epi32(e, _mm512_set1_epi32(1)), b);
     }
 
     template <class T>
