@@ -32,27 +32,14 @@
 
 #include "bench/picture_pixels.h"
 #include "frame/attach.h"
+#include "frame/column_api.h"
 #include "frame/dispatch.h"
 #include "zor.h"
 
 namespace {
 
-// The whole library as one variant's entries, typed like the exports.
-struct Api {
-#define ZOR_FN(map, ret, name, params) ret(ZOR_CALL* name) params;
-#include "zor_manifest.h"
-#undef ZOR_FN
-};
-
-Api variantApi(int k) {
-    const zor::dispatch::Table t = zor::dispatch::libraryTable();
-    Api a{};
-#define ZOR_FN(map, ret, name, params) \
-    a.name = reinterpret_cast<decltype(a.name)>(t.rows[zor::dispatch::Idx_##name].entry[k]);
-#include "zor_manifest.h"
-#undef ZOR_FN
-    return a;
-}
+using Api = zor::dispatch::ColumnApi;
+using zor::dispatch::columnApi;
 
 // Keeps the compiler from dropping a result.
 volatile uint32_t gSink;
@@ -817,7 +804,7 @@ int runTimings(const std::vector<int>& variants, int reps, const std::string& fi
     };
     std::vector<Case> cases;
     Api apis[zor::dispatch::kColumns];
-    for (int k = 0; k < zor::dispatch::kColumns; ++k) apis[k] = variantApi(k);
+    for (int k = 0; k < zor::dispatch::kColumns; ++k) apis[k] = columnApi(k);
     for (const Workload& w : workloads()) {
         if (!matches(w.name, filter)) continue;
         for (int k : variants) {

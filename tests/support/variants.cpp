@@ -10,25 +10,15 @@
 
 namespace zt {
 
-namespace {
-Api buildApi(int k) {
-    const zor::dispatch::Table t = zor::dispatch::libraryTable();
-    Api a{};
-#define ZOR_FN(map, ret, name, params) \
-    a.name = reinterpret_cast<decltype(a.name)>(t.rows[zor::dispatch::Idx_##name].entry[k]);
-#include "zor_manifest.h"
-#undef ZOR_FN
-    return a;
-}
-}  // namespace
+using zor::dispatch::columnApi;
 
 // With ZT_RECORD_CALLS=<file> the generic variant's calls are recorded
 // there (every test body runs on it): the fuzzer's seeds.
 const Api& api(int variant) {
     static const Api apis[7] = {
-        std::getenv("ZT_RECORD_CALLS") ? recordingApi(buildApi(0), std::getenv("ZT_RECORD_CALLS")) : buildApi(0),
-        buildApi(1), buildApi(2), buildApi(3), buildApi(4),
-        buildApi(kColumns > 5 ? 5 : 4), buildApi(kColumns > 6 ? 6 : 4)};
+        std::getenv("ZT_RECORD_CALLS") ? recordingApi(columnApi(0), std::getenv("ZT_RECORD_CALLS")) : columnApi(0),
+        columnApi(1), columnApi(2), columnApi(3), columnApi(4),
+        columnApi(kColumns > 5 ? 5 : 4), columnApi(kColumns > 6 ? 6 : 4)};
     return apis[variant];
 }
 

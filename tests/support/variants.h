@@ -10,26 +10,19 @@
 #include <string>
 #include <vector>
 
+#include "frame/column_api.h"
 #include "zor.h"
 
 namespace zt {
 
-struct Api {
-#define ZOR_FN(map, ret, name, params) ret(ZOR_CALL* name) params;
-#include "zor_manifest.h"
-#undef ZOR_FN
-};
+using Api = zor::dispatch::ColumnApi;
 
 const Api& api(int variant);
 
 // The columns of the dispatch table: the five variants, and on x86-64 the
 // wide columns 5 (AVX2 with FMA) and 6 (AVX-512): api(5) and api(6) hold
 // the wide entries where an export has them and the SSSE3 entries elsewhere.
-#if defined(__x86_64__)
-constexpr int kColumns = 7;
-#else
-constexpr int kColumns = 5;
-#endif
+constexpr int kColumns = zor::dispatch::kColumns;
 
 // Variants whose instruction set the running processor has, lowest first.
 const std::vector<int>& supportedVariants();
