@@ -122,18 +122,20 @@ ptrdiff_t fillRowSimd(E* d, ptrdiff_t n, E v) {
 
 #if ZOR_SIMD >= 4
 // Interleaved three channels <-> three planes, 48 bytes at a time.
-template <int E>
-struct SplitMap {  // output register k = plane k
-    static constexpr int src(int j) {
-        const int plane = j / 16, elem = (j % 16) / E, byte = j % E;
-        return (elem * 3 + plane) * E + byte;
-    }
-};
 
 // Bytes in registers wider than 16 bytes: the vocabulary's three-channel
 // loads and stores (one 48-byte block per 16-byte lane).
 template <class E>
 constexpr bool kWideBytes = sizeof(E) == 1 && simd::kNativeBytes > 16;
+
+// Twelve bytes of three-element pixels with each channel's elements
+// gathered into one 32-bit lane (lane 3 is left empty).
+template <int E>
+inline Bytes16 groupChannels3() {
+    if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 3, 6, 9, 1, 4, 7, 10, 2, 5, 8, 11, 0x80, 0x80, 0x80, 0x80});
+    else return simd::fromLanes<Bytes16>({0, 1, 6, 7, 2, 3, 8, 9, 4, 5, 10, 11, 0x80, 0x80, 0x80, 0x80});
+}
+using Words4 = simd::Vec<uint32_t, 16>;
 
 template <class E>
 ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
@@ -150,14 +152,23 @@ ptrdiff_t split3Simd(const E* s, E* const* planes, ptrdiff_t n) {
             simd::store(p2 + x, c);
         });
     }
+    // The 48 bytes as four runs of 12 (four one-byte or two two-byte
+    // pixels), each grouped by channel into 32-bit lanes by one shuffle,
+    // then a 4 x 4 transpose of those lanes: one shuffle mask instead of
+    // nine, which keeps the loop in eight registers.
+    const Bytes16 g = groupChannels3<sizeof(E)>();
     return eachBlock<16 / sizeof(E)>(n, [&](ptrdiff_t x) {
         using namespace simd;
-        Bytes16 in[3], out[3];
+        Bytes16 in[3];
         loadBlock(s + 3 * x, in);
-        Shuffle48<SplitMap<sizeof(E)>>::apply(in, out);
-        storeTo(p0 + x, out[0]);
-        storeTo(p1 + x, out[1]);
-        storeTo(p2 + x, out[2]);
+        Words4 v0 = bitcast<uint32_t>(shuffleBytes(in[0], g));
+        Words4 v1 = bitcast<uint32_t>(shuffleBytes(alignBytes<12>(in[1], in[0]), g));
+        Words4 v2 = bitcast<uint32_t>(shuffleBytes(alignBytes<8>(in[2], in[1]), g));
+        Words4 v3 = bitcast<uint32_t>(shuffleBytes(shiftBytesDown<4>(in[2]), g));
+        transpose4(v0, v1, v2, v3);
+        storeTo(p0 + x, v0);
+        storeTo(p1 + x, v1);
+        storeTo(p2 + x, v2);
     });
 }
 
@@ -225,8 +236,6 @@ inline Bytes16 spreadChannels() {  // the inverse of groupChannels
     if constexpr (E == 1) return simd::fromLanes<Bytes16>({0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15});
     else return simd::fromLanes<Bytes16>({0, 1, 4, 5, 8, 9, 12, 13, 2, 3, 6, 7, 10, 11, 14, 15});
 }
-
-using Words4 = simd::Vec<uint32_t, 16>;
 
 template <class E>
 ptrdiff_t split4Simd(const E* s, E* const* planes, ptrdiff_t n) {
