@@ -327,7 +327,7 @@ ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsMagnitude_32fc,  (const Complex32f* pSrc, fl
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsPhase_32f,        (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsPowerSpectr_32f,  (const float* pSrcRe, const float* pSrcIm, float* pDst, int len))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsAtan2_32f_A21,    (const float* pSrc1, const float* pSrc2, float* pDst, int len))
-ZOR_FN(ZOR_GENERIC, Status, zorsSortDescend_32f_I, (float* pSrcDst, int len))
+ZOR_FN(ZOR_ALL,     Status, zorsSortDescend_32f_I, (float* pSrcDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsDeinterleave_16s, (const int16_t* pSrc, int channels, int len, int16_t** pDst))
 
 /* ---- signal/vector/stats ----

@@ -423,8 +423,10 @@ Status ZOR_CALL zorsDeinterleave_16s(const int16_t* pSrc, int channels, int len,
 }
 #endif  // ZOR_DEFINES_ENTRIES_OF(ZOR_SSE2UP)
 
-#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
-// Sorting is the same comparison sequence on every processor.
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_ALL)
+// Sorting is the same comparison sequence on every processor; each variant
+// has its own entry so that the 32-bit build compares in the SSE unit
+// rather than on the x87 stack.
 Status ZOR_CALL zorsSortDescend_32f_I(float* pSrcDst, int len) {
     if (Status s = checkFirst(anyNull(pSrcDst), badLength(len))) return s;
     if (len > 1) sortDescend(pSrcDst, len);

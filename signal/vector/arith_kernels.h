@@ -523,7 +523,7 @@ void squaresSum(const float* re, const float* im, float* d, int n) {
 
 // ---- sort -------------------------------------------------------------------------
 
-#if ZOR_DEFINES_ENTRIES_OF(ZOR_GENERIC)
+#if ZOR_DEFINES_ENTRIES_OF(ZOR_ALL)
 inline void swapAt(float* a, int i, int j) {
     const float t = a[i];
     a[i] = a[j];
