@@ -1,12 +1,15 @@
 // Normal random numbers: uniforms from a subtract-with-borrow generator
 // added to a linear congruential one, turned normal by the polar method.
 // The state carries a half-used pair across calls, so a draw split into
-// several calls gives the same sequence as one call.
+// several calls gives the same sequence as one call.  The logarithm is the
+// library's own (randgauss_log.h), not the C runtime's, so the sequence is
+// the same on every platform.
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/fpu.h"
 #include "frame/simd.h"
 #include "frame/memory.h"
+#include "signal/transform/randgauss_log.h"
 
 #include <cmath>
 
@@ -146,7 +149,7 @@ Status ZOR_CALL zorsRandGauss_32f(float* pDst, int len, void* pState) {
         int got = 0;
         while (got < want) got = drawAccepted(g, want - got, u1s, u2s, qs, got);
         double fs[kBatch];
-        for (int t = 0; t < want; ++t) fs[t] = toDouble(-2.0 * std::log(qs[t]));
+        for (int t = 0; t < want; ++t) fs[t] = toDouble(-2.0 * logOfPositive(qs[t]));
         int t = 0;
 #if ZOR_SIMD >= 2
         // IEEE division and square root: the same bits a register at a time
