@@ -112,14 +112,8 @@ void cvDot(benchmark::State& state) {
 
 // ---- exactness-matched peers ----
 // Plain loops with zor's rule (double products and sums, one rounding at the
-// end), compiled for the widest registers the compiler has; the clone the
-// processor supports is chosen at load.  Built with -fno-math-errno so that
+// end), compiled as ZB_WIDEST_CLONES.  Built with -fno-math-errno so that
 // sqrt vectorizes.
-#if defined(__x86_64__) && defined(__GNUC__) && !defined(__clang__)
-#  define ZB_WIDEST_CLONES __attribute__((target_clones("avx512f", "avx2", "default")))
-#else
-#  define ZB_WIDEST_CLONES
-#endif
 
 // 32 double partial sums, so the compiler may keep four 512-bit registers.
 ZB_WIDEST_CLONES double dotInDouble(const float* a, const float* b, int n) {

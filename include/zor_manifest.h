@@ -369,15 +369,15 @@ ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_16s,    (const int16_t* pSrc, int16_t
 ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_16s_I,  (int16_t* pSrcDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_16sc,   (const Complex16s* pSrc, Complex16s* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_16sc_I, (Complex16s* pSrcDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_32f,    (const float* pSrc, float* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_32f_I,  (float* pSrcDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_32fc,   (const Complex32f* pSrc, Complex32f* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_32fc_I, (Complex32f* pSrcDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_64f,    (const double* pSrc, double* pDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_64f_I,  (double* pSrcDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHamming_32f,    (const float* pSrc, float* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHamming_32f_I,  (float* pSrcDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHamming_32fc,   (const Complex32f* pSrc, Complex32f* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHamming_32fc_I, (Complex32f* pSrcDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHamming_64f,    (const double* pSrc, double* pDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHamming_64f_I,  (double* pSrcDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_64fc,   (const Complex64f* pSrc, Complex64f* pDst, int len))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHamming_64fc_I, (Complex64f* pSrcDst, int len))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsWinHann_32f_I,     (float* pSrcDst, int len))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsWinHann_32f_I,     (float* pSrcDst, int len))
 
 /* ---- signal/transform/fft ---- */
 
