@@ -357,7 +357,7 @@ ZOR_FN(ZOR_SSE2UP,  Status, zorsMaxIndx_16s,      (const int16_t* pSrc, int len,
 ZOR_FN(ZOR_ALL,     Status, zorsMaxIndx_32f,      (const float* pSrc, int len, float* pMax, int* pIndx))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsMaxIndx_64f,      (const double* pSrc, int len, double* pMax, int* pIndx))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNorm_L2_32f,      (const float* pSrc, int len, float* pNorm))
-ZOR_FN(ZOR_SSE2UP,  Status, zorsNorm_L2_16s32f,   (const int16_t* pSrc, int len, float* pNorm))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNorm_L2_16s32f,   (const int16_t* pSrc, int len, float* pNorm))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsNormDiff_L2_32f,  (const float* pSrc1, const float* pSrc2, int len, float* pNorm))
 ZOR_FN(ZOR_SSE2UP,  Status, zorsNorm_L1_16s32s_Sfs, (const int16_t* pSrc, int len, int32_t* pNorm, int scaleFactor))
 ZOR_FN(ZOR_SSE2UP_WIDE, Status, zorsDotProd_32f,      (const float* pSrc1, const float* pSrc2, int len, float* pDp))
