@@ -110,16 +110,25 @@ void cvDot(benchmark::State& state) {
     }
 }
 
+// ---- L2 norm of 16-bit samples (an exact integer sum of squares) ----
+void zorNormL2_16s(benchmark::State& state) {
+    const auto a = randomShorts(kLen, 3);
+    float r = 0;
+    for (auto _ : state) {
+        zorsNorm_L2_16s32f(a.data(), kLen, &r);
+        benchmark::DoNotOptimize(r);
+    }
+}
+void cvNormL2_16s(benchmark::State& state) {
+    auto a = randomShorts(kLen, 3);
+    const cv::Mat m(1, kLen, CV_16S, a.data());
+    for (auto _ : state) benchmark::DoNotOptimize(cv::norm(m, cv::NORM_L2));
+}
+
 // ---- exactness-matched peers ----
 // Plain loops with zor's rule (double products and sums, one rounding at the
-// end), compiled for the widest registers the compiler has; the clone the
-// processor supports is chosen at load.  Built with -fno-math-errno so that
+// end), compiled as ZB_WIDEST_CLONES.  Built with -fno-math-errno so that
 // sqrt vectorizes.
-#if defined(__x86_64__) && defined(__GNUC__) && !defined(__clang__)
-#  define ZB_WIDEST_CLONES __attribute__((target_clones("avx512f", "avx2", "default")))
-#else
-#  define ZB_WIDEST_CLONES
-#endif
 
 // 32 double partial sums, so the compiler may keep four 512-bit registers.
 ZB_WIDEST_CLONES double dotInDouble(const float* a, const float* b, int n) {
@@ -279,6 +288,7 @@ ZB_PAIR(vmulc, "zorsMulC_32f 64Ki", zorMulC, cvMulC, "cv::multiply by scalar", 1
 ZB_PAIR(vmulnr, "zorsMul_NR_16s_Sfs 64Ki sf=12", zorMulNR, cvMul16s, "cv::multiply 16s scale 1/4096", 1.0);
 ZB_PAIR(vdot, "zorsDotProd_32f 64Ki", zorDot, cvDot, "cv::Mat::dot", 1.5);
 ZB_PAIR(vmag, "zorsMagnitude_32fc 64Ki", zorMagnitude, cvMagnitude, "cv::magnitude", 1.5);
+ZB_PAIR(vnorm16s, "zorsNorm_L2_16s32f 64Ki", zorNormL2_16s, cvNormL2_16s, "cv::norm L2 (CV_16S)", 0);
 ZB_PAIR(vdotd, "zorsDotProd_32f 64Ki (same rule)", zorDot, loopDot, "double-accumulating loop", 0);
 ZB_PAIR(vmagd, "zorsMagnitude_32fc 64Ki (same rule)", zorMagnitude, loopMagnitude, "double-precision loop", 0);
 ZB_PAIR(vphase, "zorsPhase_32f 64Ki", zorPhase, cvPhase, "cv::phase", 2.0);

@@ -734,6 +734,7 @@ const std::vector<Workload>& workloads() {
         {"zorsMul_NR_16s_Sfs 64Ki sf=12", signal([](Z z, Signals& v, D d) {
              z.zorsMul_NR_16s_Sfs(v.s1.data(), v.s2.data(), as<int16_t>(d), kLen, 12); })},
         {"zorsDotProd_32f 64Ki", signal([](Z z, Signals& v, D d) { z.zorsDotProd_32f(v.a.data(), v.b.data(), kLen, as<float>(d)); })},
+        {"zorsNorm_L2_16s32f 64Ki", signal([](Z z, Signals& v, D d) { z.zorsNorm_L2_16s32f(v.s1.data(), kLen, as<float>(d)); })},
         {"zorsMagnitude_32fc 64Ki", signal([](Z z, Signals& v, D d) {
              z.zorsMagnitude_32fc(reinterpret_cast<const Complex32f*>(v.wide.data()), as<float>(d), kLen); })},
         {"zorsPhase_32f 64Ki", signal([](Z z, Signals& v, D d) {

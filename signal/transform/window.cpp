@@ -14,7 +14,8 @@
 // same window to frame after frame, so the SSE2 variants keep the weights of
 // the last window they built (kind, length and the floating-point control
 // state they were computed under) and apply them as a table: the products
-// are the same double multiplies rounded once, so the bits do not change.
+// are the same double multiplies rounded once, so the bits do not change
+// (at any register width: the wide columns apply the table with their own).
 // The generic variant, and any call that finds the table in use by another
 // thread or too long to keep, runs the recurrence as it goes.
 #include "frame/variant.h"
@@ -116,7 +117,7 @@ struct KeptWeights {
     int busy;
     int kind, len;
     uint32_t state;
-    alignas(16) double w[kKeptMax];
+    alignas(64) double w[kKeptMax];
 };
 KeptWeights kept;
 
@@ -124,36 +125,44 @@ template <class T>
 void applyWeights(const T* s, T* d, int n, const double* w) {
     for (int i = 0; i < n; ++i) d[i] = weigh(s[i], w[i]);
 }
-// The table is 16-byte aligned and read two weights at a time.
-using D2 = simd::Vec<double, 16>;
+// Registers of doubles at the column's width; the table is aligned to the
+// widest register and read a register of weights at a time.
+using D = simd::Vec<double>;
+constexpr int kLanes = D::kLanes;
 
-// Floats are widened straight from 64-bit loads (loadWidened): no shuffle is
-// needed to reach the upper pair, which measured faster than splitting a
-// 16-byte load.
+// Floats are widened in order straight from memory (loadWidened): no
+// shuffle is needed to reach the upper half, which measured faster than
+// splitting a register of floats.
 void applyWeights(const float* s, float* d, int n, const double* w) {
     using namespace simd;
+    const auto weighed = [&](int at) { return loadWidened<D>(s + at) * loadAligned<D>(w + at); };
     int i = 0;
-    for (; i + 4 <= n; i += 4)
-        store(d + i, narrowSat<float>(loadWidened<D2>(s + i) * loadAligned<D2>(w + i),
-                                      loadWidened<D2>(s + i + 2) * loadAligned<D2>(w + i + 2)));
+    for (; i + 2 * kLanes <= n; i += 2 * kLanes) store(d + i, narrowInOrder<float>(weighed(i), weighed(i + kLanes)));
     for (; i < n; ++i) d[i] = weigh(s[i], w[i]);
 }
+// A register of floats holds kLanes complex elements; per 16-byte block
+// widenLo/widenHi give its first and second element, and zipLo/zipHi of the
+// weights the matching weight twice.
 void applyWeights(const Complex32f* s, Complex32f* d, int n, const double* w) {
     using namespace simd;
-    const auto at = [](const Complex32f* c) { return loadWidened<D2>(&c->re); };
+    using F = Vec<float>;
     int k = 0;
-    for (; k + 2 <= n; k += 2)
-        storeTo(d + k, narrowSat<float>(at(s + k) * set1<D2>(w[k]), at(s + k + 1) * set1<D2>(w[k + 1])));
+    for (; k + kLanes <= n; k += kLanes) {
+        const F x = loadFrom<F>(s + k);
+        const D wk = loadAligned<D>(w + k);
+        storeTo(d + k, narrowSat<float>(widenLo(x) * zipLo(wk, wk), widenHi(x) * zipHi(wk, wk)));
+    }
     for (; k < n; ++k) d[k] = weigh(s[k], w[k]);
 }
 void applyWeights(const double* s, double* d, int n, const double* w) {
     using namespace simd;
     int i = 0;
-    for (; i + 2 <= n; i += 2) store(d + i, load<D2>(s + i) * loadAligned<D2>(w + i));
+    for (; i + kLanes <= n; i += kLanes) store(d + i, load<D>(s + i) * loadAligned<D>(w + i));
     for (; i < n; ++i) d[i] = weigh(s[i], w[i]);
 }
 void applyWeights(const Complex64f* s, Complex64f* d, int n, const double* w) {
     using namespace simd;
+    using D2 = Vec<double, 16>;
     for (int k = 0; k < n; ++k) store(&d[k].re, load<D2>(&s[k].re) * set1<D2>(w[k]));
 }
 

@@ -107,6 +107,19 @@ TEST_P(Window, KeptWeightsFollowTheRoundingMode) {
     }
 }
 
+// Twice each (building the kept weights, then applying them), on specials
+// and shifted buffers against guard pages.
+TEST_P(Window, AgreesWithGeneric) {
+    zt::agreesWithGeneric(variant(), [](const zt::Api& z, zt::Case& c) {
+        const int n = c.len();
+        const float* f = c.in(c.floats(2 * n));
+        const auto twice = [](auto fn, auto... args) { return fn(args...) + fn(args...); };
+        return twice(z.zorsWinHamming_32f, f, c.out<float>(n), n) + twice(z.zorsWinHann_32f_I, c.inOut(c.floats(n)), n) +
+               twice(z.zorsWinHamming_32fc, reinterpret_cast<const Complex32f*>(f), c.out<Complex32f>(n), n) +
+               twice(z.zorsWinHamming_64f, c.in<double>(n), c.out<double>(n), n);
+    });
+}
+
 #if !defined(_WIN32)
 // Two threads applying different windows at once each get their own.
 TEST_P(Window, ConcurrentCallsKeepTheirOwnWeights) {
