@@ -125,19 +125,19 @@ ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSet_16s_C3R,
 ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C3MR,
        (const uint8_t value[3], uint8_t* pDst, int dstStep, ImageSize roiSize,
         const uint8_t* pMask, int maskStep))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_16u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_16u_C3R,
        (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_AC4R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_8u_AC4R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_16u_AC4R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_16u_AC4R,
        (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_C3IR,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_8u_C3IR,
        (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, const int dstOrder[3]))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopyReplicateBorder_8u_C1R,
        (const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst, int dstStep,

@@ -363,9 +363,12 @@ inline void maskedStore48(uint8_t* d, const uint8_t* m, const Bytes16 (&fresh)[3
 
 // Channel order applied to 48-byte blocks of three-element pixels: output
 // register k draws on input registers k-1..k+1 only (a pixel never moves
-// further than its own bytes).
+// further than its own bytes).  Registers wider than 16 bytes hold one
+// 48-byte block per 16-byte lane block (loadBlocks at a stride of 48), so
+// the same per-block shuffles serve every width.
+using SwapBytes = simd::Vec<uint8_t>;
 struct SwapShuffle {
-    Bytes16 m[3][3];
+    SwapBytes m[3][3];
     SwapShuffle(const int (&o)[3], int elemBytes) {
         alignas(16) uint8_t t[3][3][16];
         for (int j = 0; j < 48; ++j) {
@@ -375,9 +378,9 @@ struct SwapShuffle {
                 t[j / 16][r][j % 16] = s / 16 == r ? static_cast<uint8_t>(s % 16) : uint8_t(0x80);
         }
         for (int a = 0; a < 3; ++a)
-            for (int r = 0; r < 3; ++r) m[a][r] = simd::loadAligned<Bytes16>(t[a][r]);
+            for (int r = 0; r < 3; ++r) m[a][r] = simd::loadBlocks<SwapBytes>(t[a][r], 0);
     }
-    void apply(const Bytes16 (&in)[3], Bytes16 (&out)[3]) const {
+    void apply(const SwapBytes (&in)[3], SwapBytes (&out)[3]) const {
         using simd::shuffleBytes;
         out[0] = shuffleBytes(in[0], m[0][0]) | shuffleBytes(in[1], m[0][1]);
         out[1] = (shuffleBytes(in[0], m[1][0]) | shuffleBytes(in[1], m[1][1])) | shuffleBytes(in[2], m[1][2]);
@@ -385,20 +388,23 @@ struct SwapShuffle {
     }
 };
 
-// Returns the bytes done (whole 48-byte blocks).
+// Returns the bytes done (whole groups of 48-byte blocks).  A group is read
+// whole before it is written: the in-place form relies on it.
 ptrdiff_t swap3Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle& sh) {
-    return eachBlock<48>(bytes, [&](ptrdiff_t i) {
-        Bytes16 in[3], out[3];
-        simd::loadBlock(s + i, in);
+    using namespace simd;
+    constexpr ptrdiff_t kGroup = 3 * SwapBytes::kBytes;
+    return eachBlock<kGroup>(bytes, [&](ptrdiff_t i) {
+        SwapBytes in[3], out[3];
+        for (int r = 0; r < 3; ++r) in[r] = loadBlocks<SwapBytes>(s + i + 16 * r, 48);
         sh.apply(in, out);
-        simd::storeBlock(d + i, out);
+        for (int r = 0; r < 3; ++r) storeBlocks(d + i + 16 * r, 48, out[r]);
     });
 }
 
 // Four-element pixels: the order picks colour elements inside 16 bytes; the
 // destination's alpha is carried over unchanged.
 struct SwapShuffle4 {
-    Bytes16 m, alpha;
+    SwapBytes m, alpha;
     SwapShuffle4(const int (&o)[3], int elemBytes) {
         alignas(16) uint8_t t[16], a[16];
         for (int j = 0; j < 16; ++j) {
@@ -406,16 +412,16 @@ struct SwapShuffle4 {
             t[j] = k == 3 ? uint8_t(0x80) : static_cast<uint8_t>((pixel * 4 + o[k]) * elemBytes + byte);
             a[j] = k == 3 ? 0xFF : 0;
         }
-        m = simd::loadAligned<Bytes16>(t);
-        alpha = simd::loadAligned<Bytes16>(a);
+        m = simd::loadBlocks<SwapBytes>(t, 0);
+        alpha = simd::loadBlocks<SwapBytes>(a, 0);
     }
 };
 
 ptrdiff_t swap4Simd(const uint8_t* s, uint8_t* d, ptrdiff_t bytes, const SwapShuffle4& sh) {
     using namespace simd;
     ptrdiff_t i = 0;
-    for (; i + 16 <= bytes; i += 16)
-        store(d + i, select(sh.alpha, load<Bytes16>(d + i), shuffleBytes(load<Bytes16>(s + i), sh.m)));
+    for (; i + SwapBytes::kBytes <= bytes; i += SwapBytes::kBytes)
+        store(d + i, select(sh.alpha, load<SwapBytes>(d + i), shuffleBytes(load<SwapBytes>(s + i), sh.m)));
     return i;
 }
 #endif
