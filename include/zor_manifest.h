@@ -118,26 +118,26 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C1R,  (uint8_t value, uint8_t* pDst, int d
 ZOR_FN(ZOR_SSE2UP, Status, zoriSet_16s_C1R, (int16_t value, int16_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriSet_32s_C1R, (int32_t value, int32_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriSet_32f_C1R, (float value, float* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSet_8u_C3R,
        (const uint8_t value[3], uint8_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSet_16s_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSet_16s_C3R,
        (const int16_t value[3], int16_t* pDst, int dstStep, ImageSize roiSize))
 ZOR_FN(ZOR_SSE2UP, Status, zoriSet_8u_C3MR,
        (const uint8_t value[3], uint8_t* pDst, int dstStep, ImageSize roiSize,
         const uint8_t* pMask, int maskStep))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_16u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_16u_C3R,
        (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_AC4R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_8u_AC4R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_16u_AC4R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_16u_AC4R,
        (const uint16_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize,
         const int dstOrder[3]))
-ZOR_FN(ZOR_SSE2UP, Status, zoriSwapChannels_8u_C3IR,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriSwapChannels_8u_C3IR,
        (uint8_t* pSrcDst, int srcDstStep, ImageSize roiSize, const int dstOrder[3]))
 ZOR_FN(ZOR_SSE2UP, Status, zoriCopyReplicateBorder_8u_C1R,
        (const uint8_t* pSrc, int srcStep, ImageSize srcRoiSize, uint8_t* pDst, int dstStep,
@@ -151,23 +151,23 @@ ZOR_FN(ZOR_SSE2UP, Status, zoriCopyReplicateBorder_16s_C1R,
 
 /* ---- image/pixel/convert ---- */
 
-ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u16u_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriConvert_8u16u_C1R,
        (const uint8_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u16u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriConvert_8u16u_C3R,
        (const uint8_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u16u_C4R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriConvert_8u16u_C4R,
        (const uint8_t* pSrc, int srcStep, uint16_t* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_8u32f_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriConvert_8u32f_C1R,
        (const uint8_t* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_16s32f_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriConvert_16s32f_C1R,
        (const int16_t* pSrc, int srcStep, float* pDst, int dstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriConvert_32f8u_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriConvert_32f8u_C1R,
        (const float* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize roiSize, int roundMode))
-ZOR_FN(ZOR_SSE2UP, Status, zoriLShiftC_16u_C1IR,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriLShiftC_16u_C1IR,
        (uint32_t value, uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriLShiftC_16u_C3IR,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriLShiftC_16u_C3IR,
        (const uint32_t value[3], uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize))
-ZOR_FN(ZOR_SSE2UP, Status, zoriLShiftC_16u_AC4IR,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriLShiftC_16u_AC4IR,
        (const uint32_t value[3], uint16_t* pSrcDst, int srcDstStep, ImageSize roiSize))
 
 /* ---- image/geometry/mirror ---- */

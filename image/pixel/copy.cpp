@@ -169,21 +169,20 @@ Status setC3(const T* value, T* pDst, int dstStep, ImageSize roi) {
         simd::streamFence();
         return StatusOk;
     }
-    alignas(16) E pattern[48 / sizeof(E)];
-    for (size_t i = 0; i < 48 / sizeof(E); ++i) pattern[i] = v[i % 3];
-    Bytes16 p[3];
+    // the pattern over three registers: 3 * kBytes is a whole number of pixels
+    using V = simd::Vec<uint8_t>;
+    alignas(64) E pattern[3 * V::kBytes / sizeof(E)];
+    for (size_t i = 0; i < 3 * V::kBytes / sizeof(E); ++i) pattern[i] = v[i % 3];
+    V p[3];
     simd::loadBlock(pattern, p);
 #endif
     eachRow(r.count, [&](int y) {
-        repeatFill(reinterpret_cast<uint8_t*>(rowAt(pDst, dstStep, y)), r.elems * ptrdiff_t(3 * sizeof(E)),
-                   [&](uint8_t* b, ptrdiff_t n) {
-                       const ptrdiff_t pixels = n / ptrdiff_t(3 * sizeof(E));
-                       ptrdiff_t x = 0;
+        uint8_t* b = reinterpret_cast<uint8_t*>(rowAt(pDst, dstStep, y));
+        ptrdiff_t x = 0;
 #if ZOR_SIMD >= 2
-                       x = fill48(b, n, p) / ptrdiff_t(3 * sizeof(E));
+        x = fillPattern3(b, r.elems * ptrdiff_t(3 * sizeof(E)), p) / ptrdiff_t(3 * sizeof(E));
 #endif
-                       fill3Row<E>(reinterpret_cast<E*>(b) + 3 * x, pixels - x, v);
-                   });
+        fill3Row<E>(reinterpret_cast<E*>(b) + 3 * x, r.elems - x, v);
     });
     return StatusOk;
 }
