@@ -1638,6 +1638,7 @@ struct Isa<32> : Halves<32> {
     }
     static __m256i shuffleBytes(__m256i t, __m256i idx) { return _mm256_shuffle_epi8(t, idx); }
     static __m256i mulAddPairs16(__m256i a, __m256i b) { return _mm256_madd_epi16(a, b); }
+    static __m256i mulAddPairs8(__m256i u, __m256i s) { return _mm256_maddubs_epi16(u, s); }
     template <int N>
     static __m256i shiftBytesUp(__m256i a) { return _mm256_bslli_epi128(a, N); }
     template <int N>
@@ -2067,6 +2068,7 @@ struct Isa<64> : Halves<64> {
     }
     static __m512i shuffleBytes(__m512i t, __m512i idx) { return _mm512_shuffle_epi8(t, idx); }
     static __m512i mulAddPairs16(__m512i a, __m512i b) { return _mm512_madd_epi16(a, b); }
+    static __m512i mulAddPairs8(__m512i u, __m512i s) { return _mm512_maddubs_epi16(u, s); }
     template <int N>
     static __m512i shiftBytesUp(__m512i a) { return _mm512_bslli_epi128(a, N); }
     template <int N>
