@@ -531,7 +531,7 @@ private:
             const U8s<B> sure = settle<B>(acc, dst + x);
             if (allTrue(sure)) continue;
             // a sum too close to a half: the double loop decides
-            alignas(64) uint8_t settled[L];
+            alignas(B) uint8_t settled[L];
             store(settled, sure);
             for (int i = 0; i < L; ++i)
                 if (!settled[i]) floatRow(top, srcStep, dst, x + i, x + i + 1, kernel, ks_, c);
@@ -866,7 +866,7 @@ void doubleRow(const T* top, int srcStep, T* dst, int samples, const float* kern
             }
         }
         // block b of acc[i] holds samples 8 b + 2 i and 8 b + 2 i + 1
-        alignas(64) double sums[L];
+        alignas(B) double sums[L];
         for (int i = 0; i < 4; ++i) storeBlocks(sums + 2 * i, 8, acc[i]);
         for (int i = 0; i < L; ++i) {
             if constexpr (sizeof(T) == 1)
