@@ -52,10 +52,12 @@ inline int64_t rowSamples(int width, int kernelWidth, int channels) {
 #if ZOR_SIMD >= 2
 // Calls f with the register width in bytes for rows of n lanes of type Lane:
 // the column's own where one register of them fits in the row, 16 bytes
-// otherwise (the wide columns' registers outgrow short rows).
+// otherwise (the wide columns' registers outgrow short rows).  One call
+// site in the 16-byte columns, so that f is inlined there as before.
 template <class Lane, class F>
 void atWidthFor(int n, F&& f) {
-    if (n >= simd::Vec<Lane>::kLanes) f(std::integral_constant<int, simd::kNativeBytes>{});
+    if constexpr (simd::kNativeBytes == 16) f(std::integral_constant<int, 16>{});
+    else if (n >= simd::Vec<Lane>::kLanes) f(std::integral_constant<int, simd::kNativeBytes>{});
     else f(std::integral_constant<int, 16>{});
 }
 #endif

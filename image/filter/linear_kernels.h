@@ -265,10 +265,12 @@ public:
         }
     }
 
-    // A table entry in every 16-byte block of a register.
+    // A table entry in every 16-byte block of a register (at 16 bytes the
+    // aligned entry itself, which instructions can take as an operand).
     template <int B>
     static I16s<B> coefficients(const I16x8* entry) {
-        return simd::loadBlocks<I16s<B>>(reinterpret_cast<const int16_t*>(entry), 0);
+        if constexpr (B == 16) return *entry;
+        else return simd::loadBlocks<I16s<B>>(reinterpret_cast<const int16_t*>(entry), 0);
     }
 
 private:
