@@ -1638,6 +1638,7 @@ struct Isa<32> : Halves<32> {
     }
     static __m256i shuffleBytes(__m256i t, __m256i idx) { return _mm256_shuffle_epi8(t, idx); }
     static __m256i mulAddPairs16(__m256i a, __m256i b) { return _mm256_madd_epi16(a, b); }
+    static __m256i mulAddPairs8(__m256i u, __m256i s) { return _mm256_maddubs_epi16(u, s); }
     template <int N>
     static __m256i shiftBytesUp(__m256i a) { return _mm256_bslli_epi128(a, N); }
     template <int N>
@@ -1761,8 +1762,25 @@ struct Isa<32> : Halves<32> {
             else return _mm256_castpd_si256(a);
         }
     }
-    using Base::shl;  // by a run-time count
-    using Base::shr;
+    // Shifts by a run-time count, one instruction.
+    template <class T>
+    static R<T> shl(R<T> a, int n) {
+        const __m128i c = _mm_cvtsi32_si128(n);
+        if constexpr (sizeof(T) == 2) return _mm256_sll_epi16(a, c);
+        else if constexpr (sizeof(T) == 4) return _mm256_sll_epi32(a, c);
+        else if constexpr (sizeof(T) == 8) return _mm256_sll_epi64(a, c);
+        else return Base::shl<T>(a, n);
+    }
+    template <class T>
+    static R<T> shr(R<T> a, int n) {
+        const __m128i c = _mm_cvtsi32_si128(n);
+        if constexpr (std::is_same_v<T, uint16_t>) return _mm256_srl_epi16(a, c);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm256_sra_epi16(a, c);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm256_srl_epi32(a, c);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm256_sra_epi32(a, c);
+        else if constexpr (std::is_same_v<T, uint64_t>) return _mm256_srl_epi64(a, c);
+        else return Base::shr<T>(a, n);
+    }
     template <class T, int N>
     static R<T> shl(R<T> a) {
         if constexpr (sizeof(T) == 2) return _mm256_slli_epi16(a, N);
@@ -2067,6 +2085,7 @@ struct Isa<64> : Halves<64> {
     }
     static __m512i shuffleBytes(__m512i t, __m512i idx) { return _mm512_shuffle_epi8(t, idx); }
     static __m512i mulAddPairs16(__m512i a, __m512i b) { return _mm512_madd_epi16(a, b); }
+    static __m512i mulAddPairs8(__m512i u, __m512i s) { return _mm512_maddubs_epi16(u, s); }
     template <int N>
     static __m512i shiftBytesUp(__m512i a) { return _mm512_bslli_epi128(a, N); }
     template <int N>
@@ -2170,8 +2189,25 @@ struct Isa<64> : Halves<64> {
             else return _mm512_castpd_si512(a);
         }
     }
-    using Base::shl;  // by a run-time count
-    using Base::shr;
+    // Shifts by a run-time count, one instruction.
+    template <class T>
+    static R<T> shl(R<T> a, int n) {
+        const __m128i c = _mm_cvtsi32_si128(n);
+        if constexpr (sizeof(T) == 2) return _mm512_sll_epi16(a, c);
+        else if constexpr (sizeof(T) == 4) return _mm512_sll_epi32(a, c);
+        else if constexpr (sizeof(T) == 8) return _mm512_sll_epi64(a, c);
+        else return Base::shl<T>(a, n);
+    }
+    template <class T>
+    static R<T> shr(R<T> a, int n) {
+        const __m128i c = _mm_cvtsi32_si128(n);
+        if constexpr (std::is_same_v<T, uint16_t>) return _mm512_srl_epi16(a, c);
+        else if constexpr (std::is_same_v<T, int16_t>) return _mm512_sra_epi16(a, c);
+        else if constexpr (std::is_same_v<T, uint32_t>) return _mm512_srl_epi32(a, c);
+        else if constexpr (std::is_same_v<T, int32_t>) return _mm512_sra_epi32(a, c);
+        else if constexpr (std::is_same_v<T, uint64_t>) return _mm512_srl_epi64(a, c);
+        else return Base::shr<T>(a, n);
+    }
     template <class T, int N>
     static R<T> shl(R<T> a) {
         if constexpr (sizeof(T) == 2) return _mm512_slli_epi16(a, N);

@@ -24,6 +24,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <type_traits>
 
 namespace zor { namespace ZOR_NS {
 namespace {
@@ -47,6 +48,19 @@ inline Walk walkOf(ImageSize kernelSize, ImagePoint anchor, int channels) {
 inline int64_t rowSamples(int width, int kernelWidth, int channels) {
     return (static_cast<int64_t>(width) + kernelWidth - 1) * channels;
 }
+
+#if ZOR_SIMD >= 2
+// Calls f with the register width in bytes for rows of n lanes of type Lane:
+// the column's own where one register of them fits in the row, 16 bytes
+// otherwise (the wide columns' registers outgrow short rows).  One call
+// site in the 16-byte columns, so that f is inlined there as before.
+template <class Lane, class F>
+void atWidthFor(int n, F&& f) {
+    if constexpr (simd::kNativeBytes == 16) f(std::integral_constant<int, 16>{});
+    else if (n >= simd::Vec<Lane>::kLanes) f(std::integral_constant<int, simd::kNativeBytes>{});
+    else f(std::integral_constant<int, 16>{});
+}
+#endif
 
 // ---- checks ----------------------------------------------------------------------
 
@@ -86,20 +100,23 @@ Status filterInt8u(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, I
             const Scale16 scale(d, bytes.absMax());
             if (scale.ok()) {
                 PairRows pairs(ks.height, rowSamples(roi.width, ks.width, channels), channels);
-                for (int y = 0; y < roi.height; ++y) {
-                    const uint8_t* t = rowAt(top, srcStep, y);
-                    uint8_t* o = rowAt(dst, dstStep, y);
-                    if (pairs.ok()) {
-                        bytes.pairedRow(pairs.advance(t, srcStep, y), o, samples, channels, scale);
-                        continue;
+                atWidthFor<uint8_t>(samples, [&](auto width) {
+                    constexpr int B = decltype(width)::value, L = B;  // byte lanes
+                    for (int y = 0; y < roi.height; ++y) {
+                        const uint8_t* t = rowAt(top, srcStep, y);
+                        uint8_t* o = rowAt(dst, dstStep, y);
+                        if (pairs.ok()) {
+                            bytes.pairedRow<B>(pairs.advance(t, srcStep, y), o, samples, channels, scale);
+                            continue;
+                        }
+                        for (int x0 = 0; x0 < samples; x0 += L) {
+                            const int x = x0 + L <= samples ? x0 : samples - L;  // last block overlaps
+                            I16s<B> lo, hi;
+                            bytes.sums<B>(t, srcStep, x, channels, lo, hi);
+                            simd::store(o + x, scale.template apply<false>(lo, hi));
+                        }
                     }
-                    for (int x0 = 0; x0 < samples; x0 += 16) {
-                        const int x = x0 + 16 <= samples ? x0 : samples - 16;  // last block overlaps
-                        I16x8 lo, hi;
-                        bytes.sums(t, srcStep, x, channels, lo, hi);
-                        simd::store(o + x, scale.apply(lo, hi));
-                    }
-                }
+                });
                 return StatusOk;
             }
         }
@@ -114,9 +131,12 @@ Status filterInt8u(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, I
             for (int i = 0; i < ks.width * ks.height; ++i)
                 absSum += 255 * static_cast<int64_t>(kernel[i] < 0 ? -int64_t(kernel[i]) : kernel[i]);
             const bool doubleExact = d.mode == 2 && absSum < (int64_t(1) << 29) && d.exp <= 44;
-            for (int y = 0; y < roi.height; ++y)
-                intRows8uSimd(table, rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y),
-                              samples, kernel, ks, channels, d, doubleExact);
+            atWidthFor<uint8_t>(samples, [&](auto width) {
+                for (int y = 0; y < roi.height; ++y)
+                    intRows8uSimd<decltype(width)::value>(table, rowAt(top, srcStep, y), srcStep,
+                                                          rowAt(dst, dstStep, y), samples, kernel, ks,
+                                                          channels, d, doubleExact);
+            });
             return StatusOk;
         }
     }
@@ -141,22 +161,31 @@ Status filterFloat(const T* src, int srcStep, T* dst, int dstStep, ImageSize roi
     if constexpr (sizeof(T) == 1) {
         GridFloatKernel grid(kernel, ks, channels, samples);
         if (grid.ok()) {
-            for (int y = 0; y < roi.height; ++y)
-                grid.row(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), kernel);
+            atWidthFor<uint8_t>(samples, [&](auto width) {
+                for (int y = 0; y < roi.height; ++y)
+                    grid.row<decltype(width)::value>(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y),
+                                                     kernel);
+            });
             return StatusOk;
         }
         if (samples >= 16) {
             ExactFloatKernel exact(kernel, ks);
             if (exact.ok()) {
-                for (int y = 0; y < roi.height; ++y)
-                    exact.row(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), samples, channels);
+                atWidthFor<uint8_t>(samples, [&](auto width) {
+                    for (int y = 0; y < roi.height; ++y)
+                        exact.row<decltype(width)::value>(rowAt(top, srcStep, y), srcStep,
+                                                          rowAt(dst, dstStep, y), samples, channels);
+                });
                 return StatusOk;
             }
         }
     }
     if (samples >= 8) {
-        for (int y = 0; y < roi.height; ++y)
-            doubleRow(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y), samples, kernel, ks, channels);
+        atWidthFor<int16_t>(samples, [&](auto width) {
+            for (int y = 0; y < roi.height; ++y)
+                doubleRow<decltype(width)::value>(rowAt(top, srcStep, y), srcStep, rowAt(dst, dstStep, y),
+                                                  samples, kernel, ks, channels);
+        });
         return StatusOk;
     }
 #endif

@@ -5,8 +5,11 @@
 //                     coefficients, 16-bit sums), IntKernelTable (SSE2:
 //                     16-bit coefficient pairs, 32-bit sums), intRow8u;
 //   float kernels     GridFloatKernel, ExactFloatKernel (8u, SSE2: exact
-//                     integer sums), doubleRow (SSE2: the double loop two
-//                     lanes at a time), floatRow.
+//                     integer sums), doubleRow (SSE2: the double loop a
+//                     register of lanes at a time), floatRow.
+// The SIMD kernels are written once over the lane vocabulary and run at the
+// column's register width (32 and 64 bytes in the wide columns), with the
+// same bits at every width.
 // Included by linear.cpp only, after frame/variant.h.
 #pragma once
 
@@ -145,21 +148,40 @@ void floatRow(const T* top, int srcStep, Out* dst, int from, int to, const float
 // ---- SIMD rows -----------------------------------------------------------------
 
 #if ZOR_SIMD >= 2
-// The SIMD rows compute 16 output samples (one 16-byte register of bytes,
-// four of 32-bit sums) at a time.
-using U8x16 = simd::Vec<uint8_t, 16>;
-using I16x8 = simd::Vec<int16_t, 16>;
-using I32x4 = simd::Vec<int32_t, 16>;
-using D2 = simd::Vec<double, 16>;
+// The SIMD rows compute one register of byte results (four of 32-bit sums)
+// at a time, at B bytes a register: the column's width (wider in the wide
+// columns) or 16 bytes for rows shorter than that (widthFor in linear.cpp).
+// Every result is formed lane by lane, so the width changes no bit.  The
+// coefficient tables hold 16-byte blocks, broadcast to every block of a
+// wider register (loadBlocks with stride 0).
+template <int B>
+using U8s = simd::Vec<uint8_t, B>;
+template <int B>
+using I16s = simd::Vec<int16_t, B>;
+template <int B>
+using I32s = simd::Vec<int32_t, B>;
+template <int B>
+using Ds = simd::Vec<double, B>;
+using I16x8 = I16s<16>;
 
-// Sixteen 32-bit sums narrowed and saturated to bytes, in order.
-inline U8x16 packBytes(const I32x4 (&v)[4]) {
+// Per 16-byte block: the four registers of 32-bit sums that widenLo/widenHi
+// and zipLo/zipHi made from one register of bytes, narrowed and saturated
+// back to bytes in the bytes' order.
+template <int B>
+inline U8s<B> packBytes(const I32s<B> (&v)[4]) {
     using simd::narrowSat;
     return narrowSat<uint8_t>(narrowSat<int16_t>(v[0], v[1]), narrowSat<int16_t>(v[2], v[3]));
 }
+// The same of sums held in the lanes' order (v[0] the first quarter).
+template <int B>
+inline U8s<B> packBytesInOrder(const I32s<B> (&v)[4]) {
+    using simd::narrowSatInOrder;
+    return narrowSatInOrder<uint8_t>(narrowSatInOrder<int16_t>(v[0], v[1]), narrowSatInOrder<int16_t>(v[2], v[3]));
+}
 // Coefficients c0 (low) and c1 (high) as 16-bit pairs in every 32-bit lane.
-inline I16x8 coefficientPairs(int32_t c0, int32_t c1) {
-    return simd::bitcast<int16_t>(simd::set1<I32x4>(
+template <int B = 16>
+inline I16s<B> coefficientPairs(int32_t c0, int32_t c1) {
+    return simd::bitcast<int16_t>(simd::set1<I32s<B>>(
         static_cast<int32_t>((static_cast<uint32_t>(c1) << 16) | (static_cast<uint32_t>(c0) & 0xFFFFu))));
 }
 
@@ -190,12 +212,13 @@ public:
     IntKernelTable& operator=(const IntKernelTable&) = delete;
     bool ok() const { return table_ != nullptr; }
 
-    // The 16 samples at p of kernel columns q and q + 1 (0 past the kernel's
-    // width) as four vectors of 16-bit pairs, ready for pmaddwd.
-    void columnPairs(const uint8_t* p, int q, int channels, I16x8 v[4]) const {
+    // The register of samples at p of kernel columns q and q + 1 (0 past the
+    // kernel's width) as four vectors of 16-bit pairs, ready for pmaddwd.
+    template <int B>
+    void columnPairs(const uint8_t* p, int q, int channels, I16s<B> v[4]) const {
         using namespace simd;
-        const U8x16 a = load<U8x16>(p + q * channels);
-        const U8x16 b = q + 1 < ks_.width ? load<U8x16>(p + (q + 1) * channels) : zero<U8x16>();
+        const U8s<B> a = load<U8s<B>>(p + q * channels);
+        const U8s<B> b = q + 1 < ks_.width ? load<U8s<B>>(p + (q + 1) * channels) : zero<U8s<B>>();
         const auto alo = widenLo(a), ahi = widenHi(a), blo = widenLo(b), bhi = widenHi(b);
         v[0] = bitcast<int16_t>(zipLo(alo, blo));
         v[1] = bitcast<int16_t>(zipHi(alo, blo));
@@ -203,39 +226,51 @@ public:
         v[3] = bitcast<int16_t>(zipHi(ahi, bhi));
     }
 
-    // Sums of 16 output samples starting at sample x.
-    void sums(const uint8_t* top, int srcStep, int x, int channels, I32x4 acc[4]) const {
-        for (int i = 0; i < 4; ++i) acc[i] = simd::zero<I32x4>();
+    // Sums of a register of output samples starting at sample x.
+    template <int B>
+    void sums(const uint8_t* top, int srcStep, int x, int channels, I32s<B> acc[4]) const {
+        for (int i = 0; i < 4; ++i) acc[i] = simd::zero<I32s<B>>();
         for (int r = 0; r < ks_.height; ++r) {
             const uint8_t* p = rowAt(top, srcStep, r) + x;
             const I16x8* t = table_ + r * pairs_;
             for (int k = 0; k < pairs_; ++k) {
-                I16x8 v[4];
-                columnPairs(p, 2 * k, channels, v);
-                for (int i = 0; i < 4; ++i) acc[i] = acc[i] + simd::mulAddPairs(v[i], t[k]);
+                I16s<B> v[4];
+                columnPairs<B>(p, 2 * k, channels, v);
+                const I16s<B> tk = coefficients<B>(t + k);
+                for (int i = 0; i < 4; ++i) acc[i] = acc[i] + simd::mulAddPairs(v[i], tk);
             }
         }
     }
 
     // Sums of two kernels of the same shape over the same pixels (each pixel
     // pair unpacked once).
+    template <int B>
     void sums2(const IntKernelTable& other, const uint8_t* top, int srcStep, int x, int channels,
-               I32x4 acc[4], I32x4 acc2[4]) const {
+               I32s<B> acc[4], I32s<B> acc2[4]) const {
         using simd::mulAddPairs;
-        for (int i = 0; i < 4; ++i) acc[i] = acc2[i] = simd::zero<I32x4>();
+        for (int i = 0; i < 4; ++i) acc[i] = acc2[i] = simd::zero<I32s<B>>();
         for (int r = 0; r < ks_.height; ++r) {
             const uint8_t* p = rowAt(top, srcStep, r) + x;
             const I16x8* t = table_ + r * pairs_;
             const I16x8* t2 = other.table_ + r * pairs_;
             for (int k = 0; k < pairs_; ++k) {
-                I16x8 v[4];
-                columnPairs(p, 2 * k, channels, v);
+                I16s<B> v[4];
+                columnPairs<B>(p, 2 * k, channels, v);
+                const I16s<B> tk = coefficients<B>(t + k), tk2 = coefficients<B>(t2 + k);
                 for (int i = 0; i < 4; ++i) {
-                    acc[i] = acc[i] + mulAddPairs(v[i], t[k]);
-                    acc2[i] = acc2[i] + mulAddPairs(v[i], t2[k]);
+                    acc[i] = acc[i] + mulAddPairs(v[i], tk);
+                    acc2[i] = acc2[i] + mulAddPairs(v[i], tk2);
                 }
             }
         }
+    }
+
+    // A table entry in every 16-byte block of a register (at 16 bytes the
+    // aligned entry itself, which instructions can take as an operand).
+    template <int B>
+    static I16s<B> coefficients(const I16x8* entry) {
+        if constexpr (B == 16) return *entry;
+        else return simd::loadBlocks<I16s<B>>(reinterpret_cast<const int16_t*>(entry), 0);
     }
 
 private:
@@ -246,36 +281,40 @@ private:
 
 // Mode 2 in double: exact when |sum| * |mant| < 2^53 and sum * factor + 0.5
 // needs no rounding below 256 (exp <= 44).
-inline I32x4 scaleDouble(I32x4 s, D2 f) {
+template <int B>
+inline I32s<B> scaleDouble(I32s<B> s, Ds<B> f) {
     using namespace simd;
-    const D2 half = set1<D2>(0.5);
-    const D2 lo = toDoubleLo(s) * f + half, hi = toDoubleHi(s) * f + half;
+    const Ds<B> half = set1<Ds<B>>(0.5);
+    const Ds<B> lo = toDoubleLo(s) * f + half, hi = toDoubleHi(s) * f + half;
     // clamp below 256 before the conversion so that no lane overflows it
-    const D2 top = set1<D2>(256.0);
+    const Ds<B> top = set1<Ds<B>>(256.0);
     return toInt32Trunc(min(lo, top), min(hi, top));
 }
 
+template <int B>
 void intRows8uSimd(const IntKernelTable& table, const uint8_t* top, int srcStep, uint8_t* dst,
                    int samples, const int32_t* kernel, ImageSize ks, int channels,
                    const DivisorScaling& d, bool doubleExact) {
     using namespace simd;
-    const I32x4 z = zero<I32x4>(), round1 = set1<I32x4>(1);
-    const D2 f = set1<D2>(static_cast<double>(d.factor));
+    using I32 = I32s<B>;
+    constexpr int L = U8s<B>::kLanes;
+    const I32 z = zero<I32>(), round1 = set1<I32>(1);
+    const Ds<B> f = set1<Ds<B>>(static_cast<double>(d.factor));
     if (d.mode == 2 && !doubleExact) {
         intRow8u(top, srcStep, dst, 0, samples, kernel, ks, channels, d);
         return;
     }
-    for (int x0 = 0; x0 < samples; x0 += 16) {
-        const int x = x0 + 16 <= samples ? x0 : samples - 16;  // last block overlaps
-        I32x4 acc[4];
-        table.sums(top, srcStep, x, channels, acc);
+    for (int x0 = 0; x0 < samples; x0 += L) {
+        const int x = x0 + L <= samples ? x0 : samples - L;  // last block overlaps
+        I32 acc[4];
+        table.sums<B>(top, srcStep, x, channels, acc);
         if (d.mode == 1) {
-            for (I32x4& a : acc) {
+            for (I32& a : acc) {
                 a = a & gt(a, z);  // s < 1 gives 0
                 a = shr(a, d.shift) + (shr(a, d.shift - 1) & round1);
             }
         } else if (d.mode == 2) {
-            for (I32x4& a : acc) a = scaleDouble(a, f);
+            for (I32& a : acc) a = scaleDouble(a, f);
         }
         store(dst + x, packBytes(acc));
     }
@@ -324,20 +363,23 @@ public:
     ExactFloatKernel& operator=(const ExactFloatKernel&) = delete;
     bool ok() const { return hiTable_ && loTable_ && hiTable_->ok() && loTable_->ok(); }
 
+    template <int B>
     void row(const uint8_t* top, int srcStep, uint8_t* dst, int samples, int channels) const {
         using namespace simd;
-        const D2 k14 = set1<D2>(16384.0), scale = set1<D2>(scale_);
-        const D2 half = set1<D2>(0.5), topV = set1<D2>(256.0);
+        using D = Ds<B>;
+        constexpr int L = U8s<B>::kLanes;
+        const D k14 = set1<D>(16384.0), scale = set1<D>(scale_);
+        const D half = set1<D>(0.5), topV = set1<D>(256.0);
         // (hi * 2^14 + lo) * scale + 1/2, clamped below 256, truncated
-        const auto finish = [&](I32x4 h, I32x4 l) {
-            const D2 sLo = (toDoubleLo(h) * k14 + toDoubleLo(l)) * scale;
-            const D2 sHi = (toDoubleHi(h) * k14 + toDoubleHi(l)) * scale;
+        const auto finish = [&](I32s<B> h, I32s<B> l) {
+            const D sLo = (toDoubleLo(h) * k14 + toDoubleLo(l)) * scale;
+            const D sHi = (toDoubleHi(h) * k14 + toDoubleHi(l)) * scale;
             return toInt32Trunc(min(sLo + half, topV), min(sHi + half, topV));
         };
-        for (int x0 = 0; x0 < samples; x0 += 16) {
-            const int x = x0 + 16 <= samples ? x0 : samples - 16;
-            I32x4 h[4], l[4];
-            hiTable_->sums2(*loTable_, top, srcStep, x, channels, h, l);
+        for (int x0 = 0; x0 < samples; x0 += L) {
+            const int x = x0 + L <= samples ? x0 : samples - L;
+            I32s<B> h[4], l[4];
+            hiTable_->sums2<B>(*loTable_, top, srcStep, x, channels, h, l);
             for (int i = 0; i < 4; ++i) h[i] = finish(h[i], l[i]);
             store(dst + x, packBytes(h));
         }
@@ -434,90 +476,100 @@ public:
     GridFloatKernel& operator=(const GridFloatKernel&) = delete;
     bool ok() const { return block_ != nullptr; }
 
+    // The row at the widest registers that the samples fill.
+    template <int B>
     void row(const uint8_t* top, int srcStep, uint8_t* dst, const float* kernel) const {
         for (int gi = 0; gi < groups_; ++gi) {
             const int other = ks_.height - 1 - gi;
-            pairUp(rowAt(top, srcStep, gi), fold_ && other != gi ? rowAt(top, srcStep, other) : nullptr,
-                   rows_ + gi * rowStride_);
+            pairUp<B>(rowAt(top, srcStep, gi), fold_ && other != gi ? rowAt(top, srcStep, other) : nullptr,
+                      rows_ + gi * rowStride_);
         }
         switch (ks_.width) {  // the common widths with the tap loop unrolled
-        case 3: blocks<3>(top, srcStep, dst, kernel); break;
-        case 5: blocks<5>(top, srcStep, dst, kernel); break;
-        case 7: blocks<7>(top, srcStep, dst, kernel); break;
-        default: blocks<0>(top, srcStep, dst, kernel); break;
+        case 3: blocks<3, B>(top, srcStep, dst, kernel); break;
+        case 5: blocks<5, B>(top, srcStep, dst, kernel); break;
+        case 7: blocks<7, B>(top, srcStep, dst, kernel); break;
+        default: blocks<0, B>(top, srcStep, dst, kernel); break;
         }
     }
 
 private:
-    // Rounds 16 grid sums to bytes, each under both ends of its interval;
-    // returns the samples where they differ.
-    unsigned settle(const I32x4 acc[4], uint8_t* dst) const {
+    // Rounds a register of grid sums (in order) to bytes, each under both
+    // ends of its interval; stores the lower ends' bytes and returns the
+    // mask of the samples where the two agree.
+    template <int B>
+    U8s<B> settle(const I32s<B> acc[4], uint8_t* dst) const {
         using namespace simd;
         const auto bytes = [&](int32_t off) {
-            I32x4 v[4];
-            for (int i = 0; i < 4; ++i) v[i] = shr(acc[i] + set1<I32x4>(off), shift_);
-            return packBytes(v);
+            I32s<B> v[4];
+            for (int i = 0; i < 4; ++i) v[i] = shr(acc[i] + set1<I32s<B>>(off), shift_);
+            return packBytesInOrder(v);
         };
-        const U8x16 lo = bytes(loOff_), hi = bytes(hiOff_);
+        const U8s<B> lo = bytes(loOff_);
         store(dst, lo);
-        return ~static_cast<unsigned>(laneMask(eq(lo, hi))) & 0xFFFFu;
+        return eq(lo, bytes(hiOff_));
     }
 
     // KW: the kernel width when known at compile time, 0 otherwise.
-    template <int KW>
+    template <int KW, int B>
     void blocks(const uint8_t* top, int srcStep, uint8_t* dst, const float* kernel) const {
         const int c = channels_;
         const int pairs = KW ? (KW + 1) / 2 : pairs_;
         using namespace simd;
-        for (int x0 = 0; x0 < samples_; x0 += 16) {
-            const int x = x0 + 16 <= samples_ ? x0 : samples_ - 16;  // last block overlaps
-            I32x4 acc[4];
-            for (I32x4& a : acc) a = zero<I32x4>();
+        using I32 = I32s<B>;
+        constexpr int L = U8s<B>::kLanes, Q = I32::kLanes;  // samples a register of bytes, of sums
+        for (int x0 = 0; x0 < samples_; x0 += L) {
+            const int x = x0 + L <= samples_ ? x0 : samples_ - L;  // last block overlaps
+            I32 acc[4];
+            for (I32& a : acc) a = zero<I32>();
             for (int gi = 0; gi < groups_; ++gi) {
                 const uint32_t* w = rows_ + gi * rowStride_ + x;
                 const I16x8* t = table_ + gi * pairs_;
                 for (int k = 0; k < pairs; ++k) {
                     const uint32_t* pk = w + 2 * k * c;
-                    const I16x8 tk = t[k];
-                    for (int i = 0; i < 4; ++i) acc[i] = acc[i] + mulAddPairs(loadFrom<I16x8>(pk + 4 * i), tk);
+                    const I16s<B> tk = IntKernelTable::coefficients<B>(t + k);
+                    for (int i = 0; i < 4; ++i) acc[i] = acc[i] + mulAddPairs(loadFrom<I16s<B>>(pk + Q * i), tk);
                 }
             }
-            unsigned unsure = settle(acc, dst + x);
-            while (unsure) {  // a sum too close to a half: the double loop decides
-                const int i = __builtin_ctz(unsure);
-                unsure &= unsure - 1;
-                floatRow(top, srcStep, dst, x + i, x + i + 1, kernel, ks_, c);
-            }
+            const U8s<B> sure = settle<B>(acc, dst + x);
+            if (allTrue(sure)) continue;
+            // a sum too close to a half: the double loop decides
+            alignas(B) uint8_t settled[L];
+            store(settled, sure);
+            for (int i = 0; i < L; ++i)
+                if (!settled[i]) floatRow(top, srcStep, dst, x + i, x + i + 1, kernel, ks_, c);
         }
     }
 
     // The pmaddwd operands of a tap and the next one: w[i] = (v[i], v[i + c])
     // as two 16-bit halves, v = a (+ b) widened, for rowLen_ samples; a
     // partner beyond the row is 0 (it only meets the 0 that pads an odd
-    // kernel width).
+    // kernel width).  Widened and paired per 16-byte block, stored block by
+    // block in order.
+    template <int B>
     void pairUp(const uint8_t* a, const uint8_t* b, uint32_t* w) const {
         using namespace simd;
-        using U16x8 = Vec<uint16_t, 16>;
+        using U16 = Vec<uint16_t, B>;
+        constexpr int L = U8s<B>::kLanes;
         const ptrdiff_t c = channels_;
-        const auto widened = [&](const uint8_t* p, const uint8_t* q, U16x8& lo, U16x8& hi) {
-            const U8x16 v = load<U8x16>(p);
+        const auto widened = [&](const uint8_t* p, const uint8_t* q, U16& lo, U16& hi) {
+            const U8s<B> v = load<U8s<B>>(p);
             lo = widenLo(v);
             hi = widenHi(v);
             if (q) {
-                const U8x16 u = load<U8x16>(q);
+                const U8s<B> u = load<U8s<B>>(q);
                 lo = lo + widenLo(u);
                 hi = hi + widenHi(u);
             }
         };
         ptrdiff_t i = 0;
-        for (; i + c + 16 <= rowLen_; i += 16) {
-            U16x8 v0, v1, u0, u1;
+        for (; i + c + L <= rowLen_; i += L) {
+            U16 v0, v1, u0, u1;
             widened(a + i, b ? b + i : nullptr, v0, v1);
             widened(a + i + c, b ? b + i + c : nullptr, u0, u1);
-            storeTo(w + i, zipLo(v0, u0));
-            storeTo(w + i + 4, zipHi(v0, u0));
-            storeTo(w + i + 8, zipLo(v1, u1));
-            storeTo(w + i + 12, zipHi(v1, u1));
+            storeBlocks(w + i, 16, bitcast<uint32_t>(zipLo(v0, u0)));
+            storeBlocks(w + i + 4, 16, bitcast<uint32_t>(zipHi(v0, u0)));
+            storeBlocks(w + i + 8, 16, bitcast<uint32_t>(zipLo(v1, u1)));
+            storeBlocks(w + i + 12, 16, bitcast<uint32_t>(zipHi(v1, u1)));
         }
         auto v = [&](ptrdiff_t j) -> uint32_t { return j < rowLen_ ? uint32_t(a[j] + (b ? b[j] : 0)) : 0u; };
         for (; i < rowLen_; ++i) w[i] = v(i) | (v(i + c) << 16);
@@ -575,11 +627,13 @@ private:
         uint16_t* out = base_ + (sourceRow % rows_) * (samples_ + 8);
         const int64_t c = channels_;
         int64_t i = 0;
-        for (; i + c + 16 <= samples_; i += 16) {
-            using namespace simd;
-            const U8x16 a = load<U8x16>(p + i), b = load<U8x16>(p + i + c);
-            storeTo(out + i, zipLo(a, b));
-            storeTo(out + i + 8, zipHi(a, b));
+        using namespace simd;
+        using U8 = Vec<uint8_t>;
+        for (; i + c + U8::kLanes <= samples_; i += U8::kLanes) {
+            const U8 a = load<U8>(p + i), b = load<U8>(p + i + c);
+            // per 16-byte block: the pairs of its first and last 8 samples
+            storeBlocks(out + i, 16, bitcast<uint16_t>(zipLo(a, b)));
+            storeBlocks(out + i + 8, 16, bitcast<uint16_t>(zipHi(a, b)));
         }
         for (; i < samples_; ++i)
             out[i] = static_cast<uint16_t>(p[i] | (i + c < samples_ ? p[i + c] << 8 : 0));
@@ -625,19 +679,24 @@ public:
     bool ok() const { return table_ != nullptr; }
     int absMax() const { return absMax_; }
 
-    // 16-bit sums of 16 output samples starting at sample x.
-    void sums(const uint8_t* top, int srcStep, int x, int channels, I16x8& lo, I16x8& hi) const {
+    // 16-bit sums of a register of output samples starting at sample x,
+    // per 16-byte block: the first 8 samples of each block in lo, the last 8
+    // in hi.
+    template <int B>
+    void sums(const uint8_t* top, int srcStep, int x, int channels, I16s<B>& lo, I16s<B>& hi) const {
         using namespace simd;
-        lo = hi = zero<I16x8>();
+        using U8 = U8s<B>;
+        lo = hi = zero<I16s<B>>();
         for (int r = 0; r < ks_.height; ++r) {
             const uint8_t* p = rowAt(top, srcStep, r) + x;
             const I8x16* t = table_ + r * pairs_;
             for (int k = 0; k < pairs_; ++k) {
                 const int q = 2 * k;
-                const U8x16 a = load<U8x16>(p + q * channels);
-                const U8x16 b = q + 1 < ks_.width ? load<U8x16>(p + (q + 1) * channels) : zero<U8x16>();
-                lo = lo + mulAddPairs(zipLo(a, b), t[k]);
-                hi = hi + mulAddPairs(zipHi(a, b), t[k]);
+                const U8 a = load<U8>(p + q * channels);
+                const U8 b = q + 1 < ks_.width ? load<U8>(p + (q + 1) * channels) : zero<U8>();
+                const auto tk = coefficients<B>(t + k);
+                lo = lo + mulAddPairs(zipLo(a, b), tk);
+                hi = hi + mulAddPairs(zipHi(a, b), tk);
             }
         }
     }
@@ -645,36 +704,47 @@ public:
     // One output row from the pair rows of its source rows (rows[r]: source
     // row r of the neighbourhood), scaled.  P: the number of tap pairs when
     // known at compile time, 0 otherwise.  Kept out of line: inlined into
-    // the caller, its loop lost registers to the caller's values.
-    template <int P, class Scale>
+    // the caller, its loop lost registers to the caller's values.  The sums
+    // are in order: the first half of the register's samples in lo.
+    template <int P, int B, class Scale>
     [[gnu::noinline]] void pairedRow(const uint16_t* const* rows, uint8_t* dst, int samples, int channels,
                    const Scale& scale) const {
         using namespace simd;
+        using U8 = U8s<B>;
+        using I16 = I16s<B>;
+        constexpr int L = U8::kLanes;
         const int pairs = P ? P : pairs_;
-        for (int x0 = 0; x0 < samples; x0 += 16) {
-            const int x = x0 + 16 <= samples ? x0 : samples - 16;  // last block overlaps
-            I16x8 lo = zero<I16x8>(), hi = zero<I16x8>();
+        for (int x0 = 0; x0 < samples; x0 += L) {
+            const int x = x0 + L <= samples ? x0 : samples - L;  // last block overlaps
+            I16 lo = zero<I16>(), hi = zero<I16>();
             for (int r = 0; r < ks_.height; ++r) {
                 const uint16_t* p = rows[r] + x;
                 const I8x16* t = table_ + r * pairs;
                 for (int k = 0; k < pairs; ++k) {
                     const uint16_t* q = p + 2 * k * channels;
-                    lo = lo + mulAddPairs(loadFrom<U8x16>(q), t[k]);
-                    hi = hi + mulAddPairs(loadFrom<U8x16>(q + 8), t[k]);
+                    const auto tk = coefficients<B>(t + k);
+                    lo = lo + mulAddPairs(loadFrom<U8>(q), tk);
+                    hi = hi + mulAddPairs(loadFrom<U8>(q + L / 2), tk);
                 }
             }
-            store(dst + x, scale.apply(lo, hi));
+            store(dst + x, scale.template apply<true>(lo, hi));
         }
     }
-    template <class Scale>
+    template <int B, class Scale>
     void pairedRow(const uint16_t* const* rows, uint8_t* dst, int samples, int channels,
                    const Scale& scale) const {
         switch (pairs_) {
-        case 2: pairedRow<2, Scale>(rows, dst, samples, channels, scale); break;
-        case 3: pairedRow<3, Scale>(rows, dst, samples, channels, scale); break;
-        case 4: pairedRow<4, Scale>(rows, dst, samples, channels, scale); break;
-        default: pairedRow<0, Scale>(rows, dst, samples, channels, scale); break;
+        case 2: pairedRow<2, B, Scale>(rows, dst, samples, channels, scale); break;
+        case 3: pairedRow<3, B, Scale>(rows, dst, samples, channels, scale); break;
+        case 4: pairedRow<4, B, Scale>(rows, dst, samples, channels, scale); break;
+        default: pairedRow<0, B, Scale>(rows, dst, samples, channels, scale); break;
         }
+    }
+
+    // A table entry in every 16-byte block of a register.
+    template <int B>
+    static simd::Vec<int8_t, B> coefficients(const I8x16* entry) {
+        return simd::loadBlocks<simd::Vec<int8_t, B>>(reinterpret_cast<const int8_t*>(entry), 0);
     }
 
 private:
@@ -711,79 +781,96 @@ public:
                 }
                 if (!good) continue;
                 const int c = 1 << (sh - 1 < 14 ? sh - 1 : 14);  // round = c * (round / c)
-                pairConst_ = simd::set1<I16x8>(static_cast<int16_t>(c));
-                mr_ = coefficientPairs(static_cast<int32_t>(m), static_cast<int32_t>(round / c));
+                pairConst_ = static_cast<int16_t>(c);
+                mr_ = static_cast<int32_t>(m);
+                roundOverC_ = static_cast<int32_t>(round / c);
                 shift_ = sh;
                 ok_ = true;
             }
     }
     bool ok() const { return ok_; }
 
-    U8x16 apply(I16x8 lo, I16x8 hi) const {
+    // The bytes of the 16-bit sums lo and hi: per 16-byte block (lo holding
+    // the first 8 samples of each block) or, InOrder, lo holding the first
+    // half of the register's samples.
+    template <bool InOrder, int B>
+    U8s<B> apply(I16s<B> lo, I16s<B> hi) const {
         using namespace simd;
-        const I16x8 z = zero<I16x8>();
-        if (d_.mode == 0) return narrowSat<uint8_t>(lo, hi);
+        using I16 = I16s<B>;
+        const auto bytes = [](I16 a, I16 b) {
+            if constexpr (InOrder) return narrowSatInOrder<uint8_t>(a, b);
+            else return narrowSat<uint8_t>(a, b);
+        };
+        const I16 z = zero<I16>();
+        if (d_.mode == 0) return bytes(lo, hi);
         if (d_.mode == 1) {
-            const I16x8 one = set1<I16x8>(1);
-            const auto sc = [&](I16x8 v) {
+            const I16 one = set1<I16>(1);
+            const auto sc = [&](I16 v) {
                 v = max(v, z);
                 return shr(v, d_.shift) + (shr(v, d_.shift - 1) & one);
             };
-            return narrowSat<uint8_t>(sc(lo), sc(hi));
+            return bytes(sc(lo), sc(hi));
         }
-        const auto sc = [&](I16x8 v) {
+        const I16 pairConst = set1<I16>(pairConst_), mr = coefficientPairs<B>(mr_, roundOverC_);
+        const auto sc = [&](I16 v) {
             if (negate_) v = z - v;
             v = max(v, z);
-            const I32x4 a = shr(mulAddPairs(zipLo(v, pairConst_), mr_), shift_);
-            const I32x4 b = shr(mulAddPairs(zipHi(v, pairConst_), mr_), shift_);
-            return narrowSat<int16_t>(a, b);
+            const I32s<B> a = shr(mulAddPairs(zipLo(v, pairConst), mr), shift_);
+            const I32s<B> b = shr(mulAddPairs(zipHi(v, pairConst), mr), shift_);
+            return narrowSat<int16_t>(a, b);  // per block: v's order again
         };
-        return narrowSat<uint8_t>(sc(lo), sc(hi));
+        return bytes(sc(lo), sc(hi));
     }
 
 private:
     DivisorScaling d_;
     bool ok_ = false;
     bool negate_ = false;
-    I16x8 pairConst_{}, mr_{};
+    // (v, c) . (m, round / c) = v m + round, one pmaddwd
+    int16_t pairConst_ = 0;
+    int32_t mr_ = 0, roundOverC_ = 0;
     int shift_ = 0;
 };
 #endif
 
 #if ZOR_SIMD >= 2
-// The double loop itself, 8 output samples at a time as four pairs of
-// doubles: each lane performs the scalar loop's operations in its order
-// (exact products, one rounding per addition), so the sums are the same
-// bits.
-template <class T>
+// The double loop itself, one register of 16-bit lanes of output samples
+// at a time as four registers of doubles: each lane performs the scalar
+// loop's operations in its order (exact products, one rounding per
+// addition), so the sums are the same bits.
+template <int B, class T>
 void doubleRow(const T* top, int srcStep, T* dst, int samples, const float* kernel, ImageSize ks,
                int channels) {
     using namespace simd;
+    using D = Ds<B>;
+    constexpr int L = I16s<B>::kLanes;
     const int n = ks.width * ks.height;
-    for (int x0 = 0; x0 < samples; x0 += 8) {
-        const int x = x0 + 8 <= samples ? x0 : samples - 8;  // last block overlaps
-        D2 acc[4];
-        for (D2& a : acc) a = zero<D2>();
+    for (int x0 = 0; x0 < samples; x0 += L) {
+        const int x = x0 + L <= samples ? x0 : samples - L;  // last block overlaps
+        D acc[4];
+        for (D& a : acc) a = zero<D>();
         for (int r = 0; r < ks.height; ++r) {
             const T* p = rowAt(top, srcStep, r) + x;
             const float* k = kernel + n - 1 - r * ks.width;
             for (int q = 0; q < ks.width; ++q) {
-                const D2 c = set1<D2>(static_cast<double>(k[-q]));
-                // the 8 samples as 16-bit lanes, then as two registers of 32-bit ones
+                const D c = set1<D>(static_cast<double>(k[-q]));
+                // the samples as 16-bit lanes in order, then per 16-byte
+                // block (8 samples) as two registers of 32-bit ones
                 const auto v = [&] {
-                    if constexpr (sizeof(T) == 1) return loadWidened<Vec<uint16_t, 16>>(p + q * channels);
-                    else return load<I16x8>(p + q * channels);
+                    if constexpr (sizeof(T) == 1) return loadWidened<Vec<uint16_t, B>>(p + q * channels);
+                    else return load<I16s<B>>(p + q * channels);
                 }();
-                const I32x4 lo = bitcast<int32_t>(widenLo(v)), hi = bitcast<int32_t>(widenHi(v));
+                const I32s<B> lo = bitcast<int32_t>(widenLo(v)), hi = bitcast<int32_t>(widenHi(v));
                 acc[0] = acc[0] + toDoubleLo(lo) * c;
                 acc[1] = acc[1] + toDoubleHi(lo) * c;
                 acc[2] = acc[2] + toDoubleLo(hi) * c;
                 acc[3] = acc[3] + toDoubleHi(hi) * c;
             }
         }
-        alignas(16) double sums[8];
-        for (int i = 0; i < 4; ++i) storeAligned(sums + 2 * i, acc[i]);
-        for (int i = 0; i < 8; ++i) {
+        // block b of acc[i] holds samples 8 b + 2 i and 8 b + 2 i + 1
+        alignas(B) double sums[L];
+        for (int i = 0; i < 4; ++i) storeBlocks(sums + 2 * i, 8, acc[i]);
+        for (int i = 0; i < L; ++i) {
             if constexpr (sizeof(T) == 1)
                 dst[x + i] = roundSum8u(sums[i]);
             else
