@@ -55,6 +55,7 @@ struct GatherPlan {
 };
 
 constexpr int kMaxWindows = 4;
+
 // Blocks per register of the columns pass, for an arithmetic whose wide
 // pass gains up to registers of `bytes` bytes.  A wide register assembles
 // its blocks with a load each, which gains where a block has at most three
