@@ -423,17 +423,21 @@ template <class A, int Windows, int Bytes>
     using L = typename A::template Lanes<Bytes>;
     using B = simd::Vec<uint8_t, Bytes>;
     constexpr int blockLanes = 16 / int(sizeof(typename A::Inter)), group = Bytes / 16;
-    const int32_t* base = g.base + b;
+    const typename A::Inter* at[group];  // the blocks' first windows
+    for (int j = 0; j < group; ++j) at[j] = in + g.base[b + j];
     B masks[Windows];
     for (int w = 0; w < Windows; ++w) masks[w] = simd::load<B>(g.masks + planEntry(b, w, Windows, group));
+    // The register's weights, a register per tap.
+    const auto* weights = reinterpret_cast<const typename A::Weight*>(g.weights + planEntry(b, 0, taps, group));
     L acc;
     for (int k = 0; k < taps; ++k) {
-        const typename A::Inter* q = in + k * channels;
-        B v = simd::shuffleBytes(simd::bitcast<uint8_t>(simd::loadBlocksAt<L>(q, base)), masks[0]);
+        const typename A::Inter* q[group];
+        for (int j = 0; j < group; ++j) q[j] = at[j] + k * channels;
+        B v = simd::shuffleBytes(simd::bitcast<uint8_t>(simd::loadBlocksAt<L>(q, 0)), masks[0]);
         for (int w = 1; w < Windows; ++w)
-            v = v | simd::shuffleBytes(simd::bitcast<uint8_t>(simd::loadBlocksAt<L>(q + w * blockLanes, base)), masks[w]);
+            v = v | simd::shuffleBytes(simd::bitcast<uint8_t>(simd::loadBlocksAt<L>(q, w * blockLanes)), masks[w]);
         const L x = simd::bitcast<typename L::Lane>(v);
-        const L wk = simd::load<L>(reinterpret_cast<const typename A::Weight*>(g.weights + planEntry(b, k, taps, group)));
+        const L wk = simd::load<L>(weights + k * L::kLanes);
         acc = k ? A::next(acc, x, wk) : A::first(x, wk);
     }
     return acc;
