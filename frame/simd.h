@@ -334,6 +334,8 @@ struct Isa<16> {
     template <class T>
     static R<T> loadBlocks(const T* p, ptrdiff_t) { return load<T>(p); }
     template <class T>
+    static R<T> loadBlocksAt(const T* const* blocks, ptrdiff_t offset) { return load<T>(blocks[0] + offset); }
+    template <class T>
     static void storeBlocks(T* p, ptrdiff_t, R<T> v) { store<T>(p, v); }
     template <class T, class F>
     static void eachBlock(R<T> v, int first, F&& f) { f(first, v); }
@@ -1193,6 +1195,11 @@ struct Halves {
     static R<T> loadBlocks(const T* p, ptrdiff_t blockStride) {
         return join<T>(H::template loadBlocks<T>(p, blockStride),
                        H::template loadBlocks<T>(p + blockStride * (kHalf / 16), blockStride));
+    }
+    template <class T>
+    static R<T> loadBlocksAt(const T* const* blocks, ptrdiff_t offset) {
+        return join<T>(H::template loadBlocksAt<T>(blocks, offset),
+                       H::template loadBlocksAt<T>(blocks + kHalf / 16, offset));
     }
     template <class T>
     static void storeBlocks(T* p, ptrdiff_t blockStride, R<T> v) {
@@ -2331,6 +2338,13 @@ inline V loadHalf(const typename V::Lane* p) {
 template <class V>
 inline V loadBlocks(const typename V::Lane* p, ptrdiff_t blockStride) {
     return {Isa<V::kBytes>::template loadBlocks<typename V::Lane>(p, blockStride)};
+}
+// Lane block b (16 bytes) from blocks[b] + offset lanes: blocks gathered
+// from unrelated places (one 16-byte load each).  At 16 bytes this is
+// load(blocks[0] + offset).
+template <class V>
+inline V loadBlocksAt(const typename V::Lane* const* blocks, ptrdiff_t offset) {
+    return {Isa<V::kBytes>::template loadBlocksAt<typename V::Lane>(blocks, offset)};
 }
 // Lane block b to p + b * blockStride lanes.
 template <class T, int B>

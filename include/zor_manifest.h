@@ -639,19 +639,19 @@ ZOR_FN(ZOR_GENERIC, Status, zoriGetSpatialMoment_64f, (const MomentState* pState
  * in both directions are written; super-sampling averages a footprint of
  * 1 / factor around the sample, as the shifted resize does.  Checks: pDst
  * null first, then the engine's; nothing to write: 0. */
-ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C1R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C3R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_SSE2UP, Status, zoriResize_8u_C4R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C1R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C3R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_ALL,    Status, zoriResize_16u_C4R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C1R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C3R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
-ZOR_FN(ZOR_ALL,    Status, zoriResize_32f_C4R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriResize_8u_C1R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriResize_8u_C3R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriResize_8u_C4R,  (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_WIDE,    Status, zoriResize_16u_C1R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_WIDE,    Status, zoriResize_16u_C3R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_WIDE,    Status, zoriResize_16u_C4R, (const uint16_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint16_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_WIDE,    Status, zoriResize_32f_C1R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_WIDE,    Status, zoriResize_32f_C3R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
+ZOR_FN(ZOR_WIDE,    Status, zoriResize_32f_C4R, (const float* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, float* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, int interpolation))
 ZOR_FN(ZOR_GENERIC, Status, zoriGetResizeFract, (ImageSize srcSize, ImageRect srcRoi, double xFactor, double yFactor, double* pXFr, double* pYFr, int interpolation))
-ZOR_FN(ZOR_SSE2UP, Status, zoriResizeShift_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFr, double yFr, double xShift, double yShift, int interpolation))
-ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C1R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
-ZOR_FN(ZOR_SSE2UP, Status, zoriResizeCenter_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriResizeShift_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFr, double yFr, double xShift, double yShift, int interpolation))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriResizeCenter_8u_C1R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriResizeCenter_8u_C3R, (const uint8_t* pSrc, ImageSize srcSize, int srcStep, ImageRect srcRoi, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, double xFactor, double yFactor, double xCenter, double yCenter, int interpolation))
 
 /* ---- image/geometry/rotate ----
  * Rotation by an angle in degrees: the source point (x, y) (image

@@ -657,6 +657,12 @@ const std::vector<Workload>& workloads() {
         {"zoriResize_8u_C3R super 1920x1080>160x90", resize<uint8_t, &Api::zoriResize_8u_C3R>(noise<3>, 160, 90, InterSuper)},
         {"zoriResize_8u_C3R nearest 1920x1080>1280x720", resize<uint8_t, &Api::zoriResize_8u_C3R>(noise<3>, 1280, 720, InterNearest)},
         {"zoriResize_8u_C3R linear 1920x1080>2880x1620", resize<uint8_t, &Api::zoriResize_8u_C3R>(noise<3>, 2880, 1620, InterLinear)},
+        {"zoriResize_8u_C1R linear 1920x1080>1280x720", resize<uint8_t, &Api::zoriResize_8u_C1R>(gray, 1280, 720, InterLinear)},
+        {"zoriResize_8u_C4R linear 1920x1080>1280x720", resize<uint8_t, &Api::zoriResize_8u_C4R>(noise<4>, 1280, 720, InterLinear)},
+        {"zoriResize_16u_C3R linear 1920x1080>1280x720", resize<uint16_t, &Api::zoriResize_16u_C3R>(rgb16, 1280, 720, InterLinear)},
+        {"zoriResize_16u_C3R cubic 1920x1080>1280x720", resize<uint16_t, &Api::zoriResize_16u_C3R>(rgb16, 1280, 720, InterCubic)},
+        {"zoriResize_32f_C1R cubic 1920x1080>1280x720", resize<float, &Api::zoriResize_32f_C1R>(real, 1280, 720, InterCubic)},
+        {"zoriResize_32f_C1R super 1920x1080>640x360", resize<float, &Api::zoriResize_32f_C1R>(real, 640, 360, InterSuper)},
         // mirror
         {"zoriMirror_8u_C3R axis 1 1920x1080", image(noise<3>, 3, [](Z z, P s, D d, int ds) {
              z.zoriMirror_8u_C3R(s.p, s.step, d, ds, kRoi, 1); })},

@@ -336,7 +336,7 @@ Status separable(const T* src, ImageSize srcSize, int srcStep, T* dst, int dstSt
         mem::alignedFree(tables);
         return StatusNoMemory;
     }
-    if (windows) fillGatherPlan(plan, xt, C, dw, lanes, windows);
+    if (windows) fillGatherPlan(plan, xt, C, dw, lanes, windows, A::kWideGatherBytes);
     std::memset(inter, 0, size_t(interLen) * sizeof(I));
 
     I* computed = inter + ptrdiff_t(computedLo - xt.lo) * C;

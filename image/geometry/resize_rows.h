@@ -21,9 +21,11 @@
 // Tables of narrow footprints (the columns of the first two) are uniform;
 // others give each destination pixel its own tap count.
 //
-// In the SSSE3 variant the columns pass gathers the taps of blocks of one
-// register's worth of destination elements with byte shuffles from 16-byte
-// windows of the intermediate row (GatherPlan), computed once per call.
+// From the SSSE3 variant on the columns pass gathers the taps of 16-byte
+// blocks of destination elements with byte shuffles from 16-byte windows of
+// the intermediate row (GatherPlan), computed once per call; a wider
+// register takes several consecutive blocks at once, each block's windows
+// loaded from its own place.
 #pragma once
 
 #include <cstddef>
@@ -38,17 +40,35 @@ namespace zor { namespace ZOR_NS { namespace {
 
 // ---- the gather plan ---------------------------------------------------------
 
-// Blocks of `lanes` destination elements whose tap-0 values lie within
-// `windows` consecutive registers of the intermediate row starting at base.
+// Blocks of `lanes` destination elements (16 bytes of the intermediate
+// type) whose tap-0 values lie within `windows` consecutive 16-byte windows
+// of the intermediate row starting at base.  Masks and weights are laid out
+// by groups of `group` blocks (one register): group, then window (or tap),
+// then block.
 struct GatherPlan {
-    int blocks = 0;           // whole blocks; the elements after them go the scalar way
+    int blocks = 0;           // whole groups of blocks; the elements after them go the scalar way
     int windows = 0;          // 0: no plan
+    int group = 1;            // blocks per register
     int32_t* base = nullptr;  // per block: intermediate element of the first window
     uint8_t* masks = nullptr; // per block and window: 16 shuffle indices
     uint8_t* weights = nullptr;  // per block and tap: the lanes' weights (16 bytes)
 };
 
 constexpr int kMaxWindows = 4;
+
+// Blocks per register of the columns pass, for an arithmetic whose wide
+// pass gains up to registers of `bytes` bytes.  A wide register assembles
+// its blocks with a load each, which gains where a block has at most three
+// taps; more taps, or four loads per register of 16-bit lanes, cost more
+// than the wider arithmetic saves.
+constexpr int groupOf(int bytes) { return (ZOR_WIDTH < bytes ? ZOR_WIDTH : bytes) / 16; }
+inline int gatherGroup(int taps, int bytes) { return taps <= 3 ? groupOf(bytes) : 1; }
+
+// Where block b's 16 bytes for window (or tap) w lie in the plan's masks
+// (or weights) with n windows (or taps) per block.
+inline size_t planEntry(int b, int w, int n, int group) {
+    return ((size_t(b / group) * n + w) * group + b % group) * 16;
+}
 
 // Intermediate element read by tap 0 of destination element e.
 template <class W>
@@ -76,10 +96,12 @@ int gatherWindows(const AxisTable<W>& x, int channels, int width, int lanes) {
 
 // Fills a plan sized for `windows` (weights: the table's, lane by lane).
 template <class W>
-void fillGatherPlan(GatherPlan& g, const AxisTable<W>& x, int channels, int width, int lanes, int windows) {
+void fillGatherPlan(GatherPlan& g, const AxisTable<W>& x, int channels, int width, int lanes, int windows,
+                    int wideBytes) {
     const int laneBytes = 16 / lanes;
     g.windows = windows;
-    g.blocks = int(ptrdiff_t(width) * channels / lanes);
+    g.group = gatherGroup(x.taps, wideBytes);
+    g.blocks = int(ptrdiff_t(width) * channels / lanes / g.group * g.group);
     for (int b = 0; b < g.blocks; ++b) {
         ptrdiff_t base = tapZero(x, channels, ptrdiff_t(b) * lanes);
         for (int l = 1; l < lanes; ++l) {
@@ -88,7 +110,7 @@ void fillGatherPlan(GatherPlan& g, const AxisTable<W>& x, int channels, int widt
         }
         g.base[b] = int32_t(base);
         for (int w = 0; w < windows; ++w) {
-            uint8_t* m = g.masks + (size_t(b) * windows + w) * 16;
+            uint8_t* m = g.masks + planEntry(b, w, windows, g.group);
             for (int l = 0; l < lanes; ++l) {
                 const ptrdiff_t at = tapZero(x, channels, ptrdiff_t(b) * lanes + l) - base - ptrdiff_t(w) * lanes;
                 for (int j = 0; j < laneBytes; ++j)
@@ -96,7 +118,7 @@ void fillGatherPlan(GatherPlan& g, const AxisTable<W>& x, int channels, int widt
             }
         }
         for (int k = 0; k < x.taps; ++k) {
-            W* lw = reinterpret_cast<W*>(g.weights + (size_t(b) * x.taps + k) * 16);
+            W* lw = reinterpret_cast<W*>(g.weights + planEntry(b, k, x.taps, g.group));
             for (int l = 0; l < lanes; ++l) lw[l] = x.weights(int((ptrdiff_t(b) * lanes + l) / channels))[k];
         }
     }
@@ -123,13 +145,16 @@ struct FixedPoint {
     using Inter = int16_t;  // levels in 1/64
     template <class T>
     static constexpr bool kGathers = true;
+    static constexpr int kWideGatherBytes = 32;
     static Weight weight(double w) { return fixedWeight(w); }
 
     static void rows(const uint8_t* const* rows, const int16_t* w, int n, ptrdiff_t len, int16_t* out) {
         ptrdiff_t e = 0;
 #if ZOR_SIMD >= 2
-        using B = simd::Vec<uint8_t>;
-        using H = simd::Vec<int16_t>;
+        // 16-byte registers at every width: the pass waits on the source
+        // rows, and wider registers measured no faster (slower at 64 bytes).
+        using B = simd::Vec<uint8_t, 16>;
+        using H = simd::Vec<int16_t, 16>;
         H wv[kGatherTaps];
         for (int k = 0; k < n; ++k) wv[k] = simd::set1<H>(w[k]);
         withTaps(n, [&](auto count) {
@@ -160,18 +185,23 @@ struct FixedPoint {
         return T(acc < 0 ? 0 : acc > 255 ? 255 : acc);
     }
 #if ZOR_SIMD >= 4
-    using Lanes = simd::Vec<int16_t>;
-    static Lanes first(Lanes v, Lanes w) { return simd::mulHiRound(v, w); }
-    static Lanes next(Lanes acc, Lanes v, Lanes w) { return acc + simd::mulHiRound(v, w); }
-    static Lanes levels(Lanes acc) { return simd::shr<5>(acc + simd::set1<Lanes>(16)); }
-    // Two blocks of results, then a lone last one.
-    template <class T>
-    static void store2(T* out, Lanes a, Lanes b) {
-        simd::store(out, simd::narrowSat<uint8_t>(levels(a), levels(b)));
+    // The columns pass in registers of B bytes.
+    template <int B>
+    using Lanes = simd::Vec<int16_t, B>;
+    template <class V>
+    static V first(V v, V w) { return simd::mulHiRound(v, w); }
+    template <class V>
+    static V next(V acc, V v, V w) { return acc + simd::mulHiRound(v, w); }
+    template <class V>
+    static V levels(V acc) { return simd::shr<5>(acc + simd::set1<V>(16)); }
+    // Two registers of results, then a lone last one.
+    template <class T, class V>
+    static void store2(T* out, V a, V b) {
+        simd::store(out, simd::narrowSatInOrder<uint8_t>(levels(a), levels(b)));
     }
-    template <class T>
-    static void store1(T* out, Lanes a) {
-        simd::storeHalf(out, simd::narrowSat<uint8_t>(levels(a), levels(a)));
+    template <class T, class V>
+    static void store1(T* out, V a) {
+        simd::storeHalf(out, simd::narrowSatInOrder<uint8_t>(levels(a), levels(a)));
     }
 #endif
 };
@@ -198,6 +228,7 @@ struct FloatPoint {
     using Inter = float;
     template <class T>
     static constexpr bool kGathers = !std::is_same_v<T, uint8_t>;
+    static constexpr int kWideGatherBytes = 64;
     static Weight weight(double w) { return toFloat(w); }
 
     template <class T>
@@ -249,22 +280,22 @@ struct FloatPoint {
         }
     }
 #if ZOR_SIMD >= 1
-    using Lanes = simd::Vec<float>;
+    using Row = simd::Vec<float>;
     // Two registers of source elements as floats.
-    static void lanes(const float* p, Lanes& a, Lanes& b) {
-        a = simd::load<Lanes>(p);
-        b = simd::load<Lanes>(p + Lanes::kLanes);
+    static void lanes(const float* p, Row& a, Row& b) {
+        a = simd::load<Row>(p);
+        b = simd::load<Row>(p + Row::kLanes);
     }
 #  if ZOR_SIMD >= 2
-    static void lanes(const uint16_t* p, Lanes& a, Lanes& b) {
+    static void lanes(const uint16_t* p, Row& a, Row& b) {
         const auto v = simd::load<simd::Vec<uint16_t>>(p);
-        a = simd::toFloat(simd::bitcast<int32_t>(simd::widenLo(v)));
-        b = simd::toFloat(simd::bitcast<int32_t>(simd::widenHi(v)));
+        a = simd::toFloat(simd::bitcast<int32_t>(simd::widenLoInOrder(v)));
+        b = simd::toFloat(simd::bitcast<int32_t>(simd::widenHiInOrder(v)));
     }
-    static void lanes(const uint8_t* p, Lanes& a, Lanes& b) {
-        const auto v = simd::widenLo(simd::loadHalf<simd::Vec<uint8_t>>(p));
-        a = simd::toFloat(simd::bitcast<int32_t>(simd::widenLo(v)));
-        b = simd::toFloat(simd::bitcast<int32_t>(simd::widenHi(v)));
+    static void lanes(const uint8_t* p, Row& a, Row& b) {
+        const auto v = simd::loadWidened<simd::Vec<uint16_t>>(p);
+        a = simd::toFloat(simd::bitcast<int32_t>(simd::widenLoInOrder(v)));
+        b = simd::toFloat(simd::bitcast<int32_t>(simd::widenHiInOrder(v)));
     }
 #  endif
 #endif
@@ -275,25 +306,30 @@ struct FloatPoint {
         return resultOf<T>(acc);
     }
 #if ZOR_SIMD >= 4
-    static Lanes first(Lanes v, Lanes w) { return v * w; }
-    static Lanes next(Lanes acc, Lanes v, Lanes w) { return acc + v * w; }
-    static simd::Vec<int32_t> levels(Lanes acc) {
-        const Lanes v = simd::min(simd::max(acc, simd::zero<Lanes>()), simd::set1<Lanes>(65535.0f));
-        return simd::toInt32Trunc(v + simd::set1<Lanes>(0.5f));
+    template <int B>
+    using Lanes = simd::Vec<float, B>;
+    template <class V>
+    static V first(V v, V w) { return v * w; }
+    template <class V>
+    static V next(V acc, V v, V w) { return acc + v * w; }
+    template <class V>
+    static auto levels(V acc) {
+        const V v = simd::min(simd::max(acc, simd::zero<V>()), simd::set1<V>(65535.0f));
+        return simd::toInt32Trunc(v + simd::set1<V>(0.5f));
     }
-    template <class T>
-    static void store2(T* out, Lanes a, Lanes b) {
+    template <class T, class V>
+    static void store2(T* out, V a, V b) {
         if constexpr (std::is_same_v<T, float>) {
             simd::store(out, a);
-            simd::store(out + Lanes::kLanes, b);
+            simd::store(out + V::kLanes, b);
         } else {
-            simd::store(out, simd::narrowSat<uint16_t>(levels(a), levels(b)));
+            simd::store(out, simd::narrowSatInOrder<uint16_t>(levels(a), levels(b)));
         }
     }
-    template <class T>
-    static void store1(T* out, Lanes a) {
+    template <class T, class V>
+    static void store1(T* out, V a) {
         if constexpr (std::is_same_v<T, float>) simd::store(out, a);
-        else simd::storeHalf(out, simd::narrowSat<uint16_t>(levels(a), levels(a)));
+        else simd::storeHalf(out, simd::narrowSatInOrder<uint16_t>(levels(a), levels(a)));
     }
 #endif
 };
@@ -305,14 +341,16 @@ struct DoublePoint {
     using Inter = double;
     template <class T>
     static constexpr bool kGathers = false;
+    static constexpr int kWideGatherBytes = 16;
     static Weight weight(double w) { return w; }
 
     template <class T>
     static void rows(const T* const* rows, const double* w, int n, ptrdiff_t len, double* out) {
         ptrdiff_t e = 0;
 #if ZOR_SIMD >= 2
-        // One source row at a time over blocks of 8 elements (the same sums).
-        using D = simd::Vec<double>;
+        // One source row at a time over blocks of 8 elements (the same sums),
+        // in 16-byte registers at every width.
+        using D = simd::Vec<double, 16>;
         static_assert(D::kLanes == 2, "blocks of 8 elements in 4 registers");
         const ptrdiff_t whole = len / 8 * 8;
         for (int k = 0; k < n; ++k) {
@@ -342,18 +380,18 @@ struct DoublePoint {
     }
 #if ZOR_SIMD >= 2
     // Eight source elements as doubles.
-    static void lanes(const float* p, simd::Vec<double> (&v)[4]) {
+    static void lanes(const float* p, simd::Vec<double, 16> (&v)[4]) {
         for (int h = 0; h < 2; ++h) {
-            const auto f = simd::load<simd::Vec<float>>(p + 4 * h);
+            const auto f = simd::load<simd::Vec<float, 16>>(p + 4 * h);
             v[2 * h] = simd::widenLo(f);
             v[2 * h + 1] = simd::widenHi(f);
         }
     }
     template <class U>
-    static void lanes(const U* p, simd::Vec<double> (&v)[4]) {
-        simd::Vec<uint16_t> u;
-        if constexpr (sizeof(U) == 1) u = simd::widenLo(simd::loadHalf<simd::Vec<uint8_t>>(p));
-        else u = simd::load<simd::Vec<uint16_t>>(p);
+    static void lanes(const U* p, simd::Vec<double, 16> (&v)[4]) {
+        simd::Vec<uint16_t, 16> u;
+        if constexpr (sizeof(U) == 1) u = simd::widenLo(simd::loadHalf<simd::Vec<uint8_t, 16>>(p));
+        else u = simd::load<simd::Vec<uint16_t, 16>>(p);
         const auto lo = simd::bitcast<int32_t>(simd::widenLo(u)), hi = simd::bitcast<int32_t>(simd::widenHi(u));
         v[0] = simd::toDoubleLo(lo);
         v[1] = simd::toDoubleHi(lo);
@@ -376,46 +414,59 @@ void columnsScalar(const typename A::Inter* in, const AxisTable<typename A::Weig
 }
 
 #if ZOR_SIMD >= 4
-// Block b: per tap, its lanes shuffled out of the windows, weighted and
-// summed.  (A call per block would cost as much as the block.)
-template <class A, int Windows>
-[[gnu::always_inline]] inline typename A::Lanes gatheredBlock(const typename A::Inter* in, const GatherPlan& g, int b, int taps,
-                                       int channels) {
-    using L = typename A::Lanes;
-    using B = simd::Vec<uint8_t>;
-    const typename A::Inter* p = in + g.base[b];
+// The register of blocks from block b on (Bytes / 16 of them): per tap,
+// its lanes shuffled out of the windows, weighted and summed.  (A call per
+// register would cost as much as the register.)
+template <class A, int Windows, int Bytes>
+[[gnu::always_inline]] inline auto gatheredBlock(const typename A::Inter* in, const GatherPlan& g, int b, int taps,
+                                                 int channels) {
+    using L = typename A::template Lanes<Bytes>;
+    using B = simd::Vec<uint8_t, Bytes>;
+    constexpr int blockLanes = 16 / int(sizeof(typename A::Inter)), group = Bytes / 16;
+    const typename A::Inter* at[group];  // the blocks' first windows
+    for (int j = 0; j < group; ++j) at[j] = in + g.base[b + j];
     B masks[Windows];
-    for (int w = 0; w < Windows; ++w) masks[w] = simd::load<B>(g.masks + (size_t(b) * Windows + w) * 16);
-    const auto* weights = reinterpret_cast<const typename A::Weight*>(g.weights + size_t(b) * taps * 16);
+    for (int w = 0; w < Windows; ++w) masks[w] = simd::load<B>(g.masks + planEntry(b, w, Windows, group));
+    // The register's weights, a register per tap.
+    const auto* weights = reinterpret_cast<const typename A::Weight*>(g.weights + planEntry(b, 0, taps, group));
     L acc;
     for (int k = 0; k < taps; ++k) {
-        const typename A::Inter* q = p + k * channels;
-        B v = simd::shuffleBytes(simd::loadFrom<B>(q), masks[0]);
-        for (int w = 1; w < Windows; ++w) v = v | simd::shuffleBytes(simd::loadFrom<B>(q + w * L::kLanes), masks[w]);
-        const L x = simd::bitcast<typename L::Lane>(v), wk = simd::load<L>(weights + k * L::kLanes);
+        const typename A::Inter* q[group];
+        for (int j = 0; j < group; ++j) q[j] = at[j] + k * channels;
+        B v = simd::shuffleBytes(simd::bitcast<uint8_t>(simd::loadBlocksAt<L>(q, 0)), masks[0]);
+        for (int w = 1; w < Windows; ++w)
+            v = v | simd::shuffleBytes(simd::bitcast<uint8_t>(simd::loadBlocksAt<L>(q, w * blockLanes)), masks[w]);
+        const L x = simd::bitcast<typename L::Lane>(v);
+        const L wk = simd::load<L>(weights + k * L::kLanes);
         acc = k ? A::next(acc, x, wk) : A::first(x, wk);
     }
     return acc;
 }
 
-// Whole blocks, two at a time.  Taps is the tap count where it is a
-// constant (else 0: taps).
-template <class A, int Windows, int Taps, class T>
+// Whole registers of blocks, two at a time.  Taps is the tap count where it
+// is a constant (else 0: taps).
+template <class A, int Windows, int Bytes, int Taps, class T>
 void columnsGathered(const typename A::Inter* in, const GatherPlan& plan, int taps, int channels, T* out) {
-    constexpr int n = A::Lanes::kLanes;
+    constexpr int blockLanes = 16 / int(sizeof(typename A::Inter)), group = Bytes / 16;
     const GatherPlan g = plan;  // a copy the stores to out cannot alias
     const int m = Taps ? Taps : taps;
     int b = 0;
-    for (; b + 2 <= g.blocks; b += 2) {
-        const auto first = gatheredBlock<A, Windows>(in, g, b, m, channels);
-        A::template store2<T>(out + ptrdiff_t(b) * n, first, gatheredBlock<A, Windows>(in, g, b + 1, m, channels));
+    for (; b + 2 * group <= g.blocks; b += 2 * group) {
+        const auto first = gatheredBlock<A, Windows, Bytes>(in, g, b, m, channels);
+        A::template store2<T>(out + ptrdiff_t(b) * blockLanes, first,
+                              gatheredBlock<A, Windows, Bytes>(in, g, b + group, m, channels));
     }
-    if (b < g.blocks) A::template store1<T>(out + ptrdiff_t(b) * n, gatheredBlock<A, Windows>(in, g, b, m, channels));
+    if (b < g.blocks)
+        A::template store1<T>(out + ptrdiff_t(b) * blockLanes, gatheredBlock<A, Windows, Bytes>(in, g, b, m, channels));
 }
 
 template <class A, int Windows, class T>
 void columnsGathered(const typename A::Inter* in, const GatherPlan& g, int taps, int channels, T* out) {
-    withTaps(taps, [&](auto count) { columnsGathered<A, Windows, decltype(count)::value>(in, g, taps, channels, out); });
+    withTaps(taps, [&](auto count) {
+        constexpr int n = decltype(count)::value, group = groupOf(A::kWideGatherBytes);
+        if (group > 1 && g.group == group) columnsGathered<A, Windows, 16 * group, n>(in, g, taps, channels, out);
+        else columnsGathered<A, Windows, 16, n>(in, g, taps, channels, out);
+    });
 }
 #endif
 
@@ -446,11 +497,13 @@ void columns(const typename A::Inter* in, const AxisTable<typename A::Weight>& x
 inline void average2x2(const uint8_t* r0, const uint8_t* r1, uint8_t* out, int width) {
     int i = 0;
 #if ZOR_SIMD >= 2
-    using B = simd::Vec<uint8_t>;
-    using U = simd::Vec<uint16_t>;
+    // 16-byte registers at every width: bound by memory, and wider ones
+    // measured slower.
+    using B = simd::Vec<uint8_t, 16>;
+    using U = simd::Vec<uint16_t, 16>;
     const auto pairs = [](B v) {
 #  if ZOR_SIMD >= 4
-        return simd::bitcast<uint16_t>(simd::mulAddPairs(v, simd::set1<simd::Vec<int8_t>>(1)));
+        return simd::bitcast<uint16_t>(simd::mulAddPairs(v, simd::set1<simd::Vec<int8_t, 16>>(1)));
 #  else
         const U u = simd::bitcast<uint16_t>(v);
         return (u & simd::set1<U>(0xFF)) + simd::shr<8>(u);
