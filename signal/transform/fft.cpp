@@ -296,19 +296,16 @@ inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, 
     M::put(oi + p3, d02i + d13r);
 }
 
-// The radix-4 butterflies WideV::kLanes lanes at a time.  The twiddles of four
-// consecutive k fill one 24-float chunk, so a wide register takes its
-// 16-byte pieces from successive chunks.
+// The radix-4 butterflies WideV::kLanes lanes at a time: the twiddle table
+// keeps each of its six rows contiguous, so a wide register loads them whole.
 #if ZOR_SIMD >= 1
 void radix4Wide(const float* ir, const float* ii, float* orr, float* oi, int n, int L, const float* tw) {
     using U = WideV;
-    for (int base = 0; base < n; base += 4 * L) {
-        const float* t = tw;
-        for (int k = 0; k < L; k += U::kLanes, t += 6 * U::kLanes)
-            butterfly4(ir, ii, orr, oi, base + k, L, loadBlocks<U>(t, 24), loadBlocks<U>(t + 4, 24),
-                       loadBlocks<U>(t + 8, 24), loadBlocks<U>(t + 12, 24), loadBlocks<U>(t + 16, 24),
-                       loadBlocks<U>(t + 20, 24));
-    }
+    for (int base = 0; base < n; base += 4 * L)
+        for (int k = 0; k < L; k += U::kLanes)
+            butterfly4(ir, ii, orr, oi, base + k, L, load<U>(tw + k), load<U>(tw + L + k),
+                       load<U>(tw + 2 * L + k), load<U>(tw + 3 * L + k), load<U>(tw + 4 * L + k),
+                       load<U>(tw + 5 * L + k));
 }
 
 // Sub-transforms of four points: one twiddle chunk serves every group of
@@ -323,8 +320,10 @@ void radix4FourWide(const float* ir, const float* ii, float* orr, float* oi, int
 }
 #endif
 
-// Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds, per
-// four k, the lanes of w^k, w^2k, w^3k (re then im), w = exp(-2 pi i / 4L).
+// Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds six
+// rows of L values, k = 0 .. L-1: the real then the imaginary parts of w^k,
+// w^2k, w^3k, w = exp(-2 pi i / 4L).  (For L = 4 that is one 24-float chunk
+// of four lanes per row.)
 void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, int L,
                 const float* tw) {
 #if ZOR_SIMD >= 1
@@ -343,12 +342,11 @@ void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, 
         if (L >= WideV::kLanes) return radix4Wide(ir, ii, orr, oi, n, L, tw);
     }
 #endif
-    for (int base = 0; base < n; base += 4 * L) {
-        const float* t = tw;
-        for (int k = 0; k < L; k += 4, t += 24)
-            butterfly4(ir, ii, orr, oi, base + k, L, load<V>(t), load<V>(t + 4), load<V>(t + 8), load<V>(t + 12),
-                       load<V>(t + 16), load<V>(t + 20));
-    }
+    for (int base = 0; base < n; base += 4 * L)
+        for (int k = 0; k < L; k += 4)
+            butterfly4(ir, ii, orr, oi, base + k, L, load<V>(tw + k), load<V>(tw + L + k),
+                       load<V>(tw + 2 * L + k), load<V>(tw + 3 * L + k), load<V>(tw + 4 * L + k),
+                       load<V>(tw + 5 * L + k));
 }
 
 void scaleArray(float* p, int n, float s) {
@@ -378,14 +376,14 @@ void fillPassTables(float* tw, int m) {
         tw += 8;
     }
     for (int64_t L = (m & 1) ? 8 : 4; L * 4 <= (int64_t(1) << m); L *= 4) {
-        for (int64_t k = 0; k < L; k += 4, tw += 24)
-            for (int j = 1; j <= 3; ++j)
-                for (int l = 0; l < 4; ++l) {
-                    float c, s;
-                    unitRoot(j * (k + l), 4 * L, c, s);
-                    tw[(j - 1) * 8 + l] = c;
-                    tw[(j - 1) * 8 + 4 + l] = -s;
-                }
+        for (int64_t k = 0; k < L; ++k)
+            for (int j = 1; j <= 3; ++j) {
+                float c, s;
+                unitRoot(j * k, 4 * L, c, s);
+                tw[(2 * j - 2) * L + k] = c;
+                tw[(2 * j - 1) * L + k] = -s;
+            }
+        tw += 6 * L;
     }
 }
 
