@@ -549,7 +549,9 @@ void runComplex(const FftSpec* s, const In& in, float* wr, float* wi, float* dr,
     }
     while (4 * L <= n) {
 #if ZOR_SIMD >= 1
-        if constexpr (WideV::kLanes > 4) {
+        // (Where the 32 registers of the widest column hold the sixteen
+        // points; with 16 registers the spills cost what the pairing saves.)
+        if constexpr (WideV::kLanes >= 16) {
             if (L >= WideV::kLanes && 16 * L <= n) {
                 const bool last = 16 * L == n;
                 radix16Wide(wr, wi, last ? dr : wr, last ? di : wi, n, L, tw, tw + 6 * L);
