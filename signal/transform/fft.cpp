@@ -201,24 +201,26 @@ inline void storeTransforms(float* w, const int32_t* rev, int b4, U y) {
 }
 
 // The 4-point transforms of the subsequences c, c+1, ... (one per lane of
-// U): y[k] gets the real parts of output k, then yi the imaginary ones.
-// Each half needs only one difference from the other, which keeps the
+// U): y[k] gets the real parts of output k (Imag false) or the imaginary
+// ones.  Each half needs only one difference from the other, which keeps the
 // working set within eight registers (the 32-bit build has no more).
-template <class U, class In>
-inline void fourPointRe(const In& in, int c, int q, U (&y)[4]) {
-    const U d13i = in.template im<U>(c + q) - in.template im<U>(c + 3 * q);
-    const U g0 = in.template re<U>(c), g1 = in.template re<U>(c + q);
-    const U g2 = in.template re<U>(c + 2 * q), g3 = in.template re<U>(c + 3 * q);
+template <bool Imag, class U, class In>
+inline void fourPoint(const In& in, int c, int q, U (&y)[4]) {
+    const auto own = [&](int i) {
+        if constexpr (Imag) return in.template im<U>(i);
+        else return in.template re<U>(i);
+    };
+    const auto other = [&](int i) {
+        if constexpr (Imag) return in.template re<U>(i);
+        else return in.template im<U>(i);
+    };
+    const U d13 = other(c + q) - other(c + 3 * q);
+    const U g0 = own(c), g1 = own(c + q), g2 = own(c + 2 * q), g3 = own(c + 3 * q);
     const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
-    y[0] = s02 + s13, y[1] = d02 + d13i, y[2] = s02 - s13, y[3] = d02 - d13i;  // y1 = d02 - i d13
-}
-template <class U, class In>
-inline void fourPointIm(const In& in, int c, int q, U (&y)[4]) {
-    const U d13r = in.template re<U>(c + q) - in.template re<U>(c + 3 * q);
-    const U g0 = in.template im<U>(c), g1 = in.template im<U>(c + q);
-    const U g2 = in.template im<U>(c + 2 * q), g3 = in.template im<U>(c + 3 * q);
-    const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
-    y[0] = s02 + s13, y[1] = d02 - d13r, y[2] = s02 - s13, y[3] = d02 + d13r;
+    y[0] = s02 + s13, y[2] = s02 - s13;
+    // y1 = d02 - i d13, y3 = d02 + i d13
+    if constexpr (Imag) y[1] = d02 - d13, y[3] = d02 + d13;
+    else y[1] = d02 + d13, y[3] = d02 - d13;
 }
 
 // Bit-reversed gather fused with the 4-point transforms: the transform of
@@ -229,10 +231,10 @@ void firstPass(const In& in, float* wr, float* wi, int n, const int32_t* rev) {
     const int q = n >> 2;
     for (int c = 0; c < q; c += U::kLanes) {
         U y[4];
-        fourPointRe(in, c, q, y);
+        fourPoint<false>(in, c, q, y);
         transpose4(y[0], y[1], y[2], y[3]);
         for (int k = 0; k < 4; ++k) storeTransforms(wr, rev, c + k, y[k]);
-        fourPointIm(in, c, q, y);
+        fourPoint<true>(in, c, q, y);
         transpose4(y[0], y[1], y[2], y[3]);
         for (int k = 0; k < 4; ++k) storeTransforms(wi, rev, c + k, y[k]);
     }
@@ -252,8 +254,8 @@ void firstTwoPasses(const In& in, float* wr, float* wi, int n, const int32_t* re
     for (int c = 0; c < e; c += U::kLanes) {
         U yr[4][4], yi[4][4];  // [t][k]
         for (int t = 0; t < 4; ++t) {
-            fourPointRe(in, c + t * e, q, yr[t]);
-            fourPointIm(in, c + t * e, q, yi[t]);
+            fourPoint<false>(in, c + t * e, q, yr[t]);
+            fourPoint<true>(in, c + t * e, q, yi[t]);
         }
         U zr[16], zi[16];  // output 4j + k
         for (int k = 0; k < 4; ++k) {
