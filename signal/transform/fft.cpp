@@ -11,7 +11,9 @@
 //
 // The butterflies are written once over a four-lane vector type: SSE
 // registers from variant 1 up, a plain four-float record in the generic
-// variant.
+// variant.  The wide columns run the same float operations per output in
+// fewer sweeps over memory: the first pass and the L = 4 pass as one, and
+// (with 32 registers) the radix-4 passes two at a time.
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/memory.h"
