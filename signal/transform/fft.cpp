@@ -600,6 +600,18 @@ bool overlaps(const float* a, const float* b, int64_t n) {
     return a < b + n && b < a + n;
 }
 
+// Whether the passes may sweep p as work memory: in the wide columns a
+// register that straddles two cache lines costs both per load and store,
+// so a destination not aligned to the register gets the aligned work
+// arrays (only the last pass then writes it).
+bool wholeLines(const float* p) {
+#if ZOR_SIMD >= 1
+    if constexpr (WideV::kLanes > 4) return (reinterpret_cast<uintptr_t>(p) & (sizeof(WideV) - 1)) == 0;
+#endif
+    (void)p;
+    return true;
+}
+
 Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const float* si, float* dr,
                       float* di, uint8_t* pBuffer) {
     const int order = s->order;
@@ -626,8 +638,8 @@ Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const floa
         runComplex(s, in, w, w + n, dr, di);
         mem::alignedFree(own);
     } else if (overlaps(sr, dr, n) || overlaps(sr, di, n) || overlaps(si, dr, n) ||
-               overlaps(si, di, n)) {
-        alignas(16) float w[2 << kSmallOrder];
+               overlaps(si, di, n) || !wholeLines(dr) || !wholeLines(di)) {
+        alignas(64) float w[2 << kSmallOrder];
         runComplex(s, in, w, w + n, dr, di);
     } else {
         runComplex(s, in, dr, di, dr, di);
