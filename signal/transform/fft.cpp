@@ -169,6 +169,7 @@ inline void cmul(U ar, U ai, U wr, U wi, U& rr, U& ri) {
 
 // ---- passes -----------------------------------------------------------------
 
+
 // Input lanes c, c+1, ... of four streams q apart: lane l is element c + l
 // of the subsequences x[b], x[b + q], x[b + 2q], x[b + 3q].
 struct SplitInput {
@@ -376,16 +377,21 @@ inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, 
     radix4(in, out, w1r, w1i, w2r, w2i, w3r, w3i);
 }
 
-// The radix-4 butterflies WideV::kLanes lanes at a time: the twiddle table
-// keeps each of its six rows contiguous, so a wide register loads them whole.
+// Row r (w1r, w1i, w2r, w2i, w3r, w3i) of a pass's twiddles for k, k+1, ...
+// (k a multiple of 4): the table keeps four k per 24-float chunk, so a wide
+// register takes its 16-byte pieces from successive chunks.
 #if ZOR_SIMD >= 1
+inline WideV twiddleRow(const float* tw, int r, int k) { return loadBlocks<WideV>(tw + 6 * k + 4 * r, 24); }
+
+// The radix-4 butterflies WideV::kLanes lanes at a time.
 void radix4Wide(const float* ir, const float* ii, float* orr, float* oi, int n, int L, const float* tw) {
     using U = WideV;
-    for (int base = 0; base < n; base += 4 * L)
-        for (int k = 0; k < L; k += U::kLanes)
-            butterfly4(ir, ii, orr, oi, base + k, L, load<U>(tw + k), load<U>(tw + L + k),
-                       load<U>(tw + 2 * L + k), load<U>(tw + 3 * L + k), load<U>(tw + 4 * L + k),
-                       load<U>(tw + 5 * L + k));
+    for (int k = 0; k < L; k += U::kLanes) {  // each k's twiddles serve every base
+        const U w1r = twiddleRow(tw, 0, k), w1i = twiddleRow(tw, 1, k), w2r = twiddleRow(tw, 2, k);
+        const U w2i = twiddleRow(tw, 3, k), w3r = twiddleRow(tw, 4, k), w3i = twiddleRow(tw, 5, k);
+        for (int base = 0; base < n; base += 4 * L)
+            butterfly4(ir, ii, orr, oi, base + k, L, w1r, w1i, w2r, w2i, w3r, w3i);
+    }
 }
 
 // Two radix-4 passes in one (L and 4L, 16L <= n): the sixteen points
@@ -395,11 +401,16 @@ void radix4Wide(const float* ir, const float* ii, float* orr, float* oi, int n, 
 void radix16Wide(const float* ir, const float* ii, float* orr, float* oi, int n, int L, const float* tw1,
                  const float* tw2) {
     using U = WideV;
-    const auto row = [](const float* tw, int L, int r, int k) { return load<U>(tw + r * L + k); };
     // quarter res of a butterfly sits at offset (bit-reversed) slot[res]
     static constexpr int kSlot[4] = {0, 2, 1, 3};
-    for (int base = 0; base < n; base += 16 * L)
-        for (int k = 0; k < L; k += U::kLanes) {
+    for (int k = 0; k < L; k += U::kLanes) {
+        // the twiddles of k, gathered once for every base
+        U w1[6], w2[4][6];
+        for (int r = 0; r < 6; ++r) {
+            w1[r] = twiddleRow(tw1, r, k);
+            for (int q = 0; q < 4; ++q) w2[q][r] = twiddleRow(tw2, r, k + L * q);
+        }
+        for (int base = 0; base < n; base += 16 * L) {
             const int p = base + k;
             U yr[4][4], yi[4][4];  // [j][q]: after the first pass, point p + L q + 4L j
             for (int j = 0; j < 4; ++j) {
@@ -415,8 +426,7 @@ void radix16Wide(const float* ir, const float* ii, float* orr, float* oi, int n,
                     void re(int q, U v) { r[q] = v; }
                     void im(int q, U v) { i[q] = v; }
                 } out{yr[j], yi[j]};
-                radix4(x, out, row(tw1, L, 0, k), row(tw1, L, 1, k), row(tw1, L, 2, k), row(tw1, L, 3, k),
-                       row(tw1, L, 4, k), row(tw1, L, 5, k));
+                radix4(x, out, w1[0], w1[1], w1[2], w1[3], w1[4], w1[5]);
             }
             for (int q = 0; q < 4; ++q) {
                 struct {
@@ -432,11 +442,11 @@ void radix16Wide(const float* ir, const float* ii, float* orr, float* oi, int n,
                     void re(int j, U v) { store(r + at + 4 * L * j, v); }
                     void im(int j, U v) { store(i + at + 4 * L * j, v); }
                 } out{orr, oi, p + L * q, L};
-                const int k2 = k + L * q, L2 = 4 * L;
-                radix4(x, out, row(tw2, L2, 0, k2), row(tw2, L2, 1, k2), row(tw2, L2, 2, k2),
-                       row(tw2, L2, 3, k2), row(tw2, L2, 4, k2), row(tw2, L2, 5, k2));
+                const U* w = w2[q];
+                radix4(x, out, w[0], w[1], w[2], w[3], w[4], w[5]);
             }
         }
+    }
 }
 
 // Sub-transforms of four points: one twiddle chunk serves every group of
@@ -451,10 +461,8 @@ void radix4FourWide(const float* ir, const float* ii, float* orr, float* oi, int
 }
 #endif
 
-// Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds six
-// rows of L values, k = 0 .. L-1: the real then the imaginary parts of w^k,
-// w^2k, w^3k, w = exp(-2 pi i / 4L).  (For L = 4 that is one 24-float chunk
-// of four lanes per row.)
+// Radix 4 over sub-transforms of length L (a multiple of 4).  tw holds, per
+// four k, the lanes of w^k, w^2k, w^3k (re then im), w = exp(-2 pi i / 4L).
 void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, int L,
                 const float* tw) {
 #if ZOR_SIMD >= 1
@@ -473,11 +481,12 @@ void radix4Pass(const float* ir, const float* ii, float* orr, float* oi, int n, 
         if (L >= WideV::kLanes) return radix4Wide(ir, ii, orr, oi, n, L, tw);
     }
 #endif
-    for (int base = 0; base < n; base += 4 * L)
-        for (int k = 0; k < L; k += 4)
-            butterfly4(ir, ii, orr, oi, base + k, L, load<V>(tw + k), load<V>(tw + L + k),
-                       load<V>(tw + 2 * L + k), load<V>(tw + 3 * L + k), load<V>(tw + 4 * L + k),
-                       load<V>(tw + 5 * L + k));
+    for (int base = 0; base < n; base += 4 * L) {
+        const float* t = tw;
+        for (int k = 0; k < L; k += 4, t += 24)
+            butterfly4(ir, ii, orr, oi, base + k, L, load<V>(t), load<V>(t + 4), load<V>(t + 8), load<V>(t + 12),
+                       load<V>(t + 16), load<V>(t + 20));
+    }
 }
 
 void scaleArray(float* p, int n, float s) {
@@ -507,14 +516,14 @@ void fillPassTables(float* tw, int m) {
         tw += 8;
     }
     for (int64_t L = (m & 1) ? 8 : 4; L * 4 <= (int64_t(1) << m); L *= 4) {
-        for (int64_t k = 0; k < L; ++k)
-            for (int j = 1; j <= 3; ++j) {
-                float c, s;
-                unitRoot(j * k, 4 * L, c, s);
-                tw[(2 * j - 2) * L + k] = c;
-                tw[(2 * j - 1) * L + k] = -s;
-            }
-        tw += 6 * L;
+        for (int64_t k = 0; k < L; k += 4, tw += 24)
+            for (int j = 1; j <= 3; ++j)
+                for (int l = 0; l < 4; ++l) {
+                    float c, s;
+                    unitRoot(j * (k + l), 4 * L, c, s);
+                    tw[(j - 1) * 8 + l] = c;
+                    tw[(j - 1) * 8 + 4 + l] = -s;
+                }
     }
 }
 
@@ -556,7 +565,7 @@ void runComplex(const FftSpec* s, const In& in, float* wr, float* wi, float* dr,
         // (Where the 32 registers of the widest column hold the sixteen
         // points; with 16 registers the spills cost what the pairing saves.)
         if constexpr (WideV::kLanes >= 16) {
-            if (L >= WideV::kLanes && 16 * L <= n) {
+            if (L >= WideV::kLanes && 64 * L <= n) {  // twiddles gathered for four groups or more
                 const bool last = 16 * L == n;
                 radix16Wide(wr, wi, last ? dr : wr, last ? di : wi, n, L, tw, tw + 6 * L);
                 tw += 30 * L;
