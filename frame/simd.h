@@ -1019,6 +1019,10 @@ struct Isa<16> {
         }
 #  endif
     }
+    // The 16-byte blocks of a, b, c, d transposed (see transposeBlocks4):
+    // one block per register leaves them as they are.
+    template <class T>
+    static void transposeBlocks4(R<T>&, R<T>&, R<T>&, R<T>&) {}
     // About 12 bits of 1/a (rcpps).
     static __m128 recipApprox(__m128 a) { return _mm_rcp_ps(a); }
 
@@ -1483,6 +1487,24 @@ struct Isa<32> : Halves<32> {
             c = _mm256_unpacklo_epi64(t1, t3), d = _mm256_unpackhi_epi64(t1, t3);
         }
     }
+    // The 16-byte blocks of a, b and of c, d as 2 x 2 squares, transposed.
+    template <class T>
+    static void transposeBlocks4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        const auto swap = [](R<T>& x, R<T>& y) {
+            if constexpr (isF<T>) {
+                const __m256 l = _mm256_permute2f128_ps(x, y, 0x20), h = _mm256_permute2f128_ps(x, y, 0x31);
+                x = l, y = h;
+            } else if constexpr (isD<T>) {
+                const __m256d l = _mm256_permute2f128_pd(x, y, 0x20), h = _mm256_permute2f128_pd(x, y, 0x31);
+                x = l, y = h;
+            } else {
+                const __m256i l = _mm256_permute2x128_si256(x, y, 0x20), h = _mm256_permute2x128_si256(x, y, 0x31);
+                x = l, y = h;
+            }
+        };
+        swap(a, b);
+        swap(c, d);
+    }
     // Lane order over the whole register: the even and odd lanes of the run
     // a, b.
     static void deinterleave(__m256 a, __m256 b, __m256& even, __m256& odd) {
@@ -1912,6 +1934,22 @@ struct Isa<64> : Halves<64> {
             a = _mm512_unpacklo_epi64(t0, t2), b = _mm512_unpackhi_epi64(t0, t2);
             c = _mm512_unpacklo_epi64(t1, t3), d = _mm512_unpackhi_epi64(t1, t3);
         }
+    }
+    // The 16-byte blocks of a, b, c, d as a 4 x 4 square, transposed.
+    template <class T>
+    static void transposeBlocks4(R<T>& a, R<T>& b, R<T>& c, R<T>& d) {
+        const auto pick = [](R<T> x, R<T> y, auto imm) -> R<T> {
+            constexpr int k = decltype(imm)::value;
+            if constexpr (isF<T>) return _mm512_shuffle_f32x4(x, y, k);
+            else if constexpr (isD<T>) return _mm512_shuffle_f64x2(x, y, k);
+            else return _mm512_shuffle_i32x4(x, y, k);
+        };
+        using Lo = std::integral_constant<int, 0x44>;  // x0 x1 y0 y1
+        using Hi = std::integral_constant<int, 0xEE>;  // x2 x3 y2 y3
+        using Even = std::integral_constant<int, 0x88>;  // x0 x2 y0 y2
+        using Odd = std::integral_constant<int, 0xDD>;  // x1 x3 y1 y3
+        const R<T> t0 = pick(a, b, Lo{}), t1 = pick(a, b, Hi{}), t2 = pick(c, d, Lo{}), t3 = pick(c, d, Hi{});
+        a = pick(t0, t2, Even{}), b = pick(t0, t2, Odd{}), c = pick(t1, t3, Even{}), d = pick(t1, t3, Odd{});
     }
     // Lane order over the whole register: the even and odd lanes of the run
     // a, b.
@@ -2494,6 +2532,15 @@ inline Vec<T, B> concatOdd(Vec<T, B> a, Vec<T, B> b) { return {Isa<B>::template 
 template <class T, int B>
 inline void transpose4(Vec<T, B>& a, Vec<T, B>& b, Vec<T, B>& c, Vec<T, B>& d) {
     Isa<B>::template transpose4<T>(a.raw, b.raw, c.raw, d.raw);
+}
+// The 16-byte blocks of a, b, c, d (n = kBytes / 16 per register) as the
+// rows of squares of n registers, each square transposed: afterwards
+// register r holds block r % n of the registers n (r / n) .. n (r / n) + n - 1
+// of before, in that order.  With n = 4 that is one 4 x 4 square; with 2,
+// the pairs a, b and c, d; with 1 nothing moves.
+template <class T, int B>
+inline void transposeBlocks4(Vec<T, B>& a, Vec<T, B>& b, Vec<T, B>& c, Vec<T, B>& d) {
+    Isa<B>::template transposeBlocks4<T>(a.raw, b.raw, c.raw, d.raw);
 }
 // An estimate of 1/a with a relative error below 1.5 * 2^-12.
 template <int B>

@@ -11,7 +11,9 @@
 //
 // The butterflies are written once over a four-lane vector type: SSE
 // registers from variant 1 up, a plain four-float record in the generic
-// variant.
+// variant.  The wide columns run the same float operations per output in
+// fewer sweeps over memory: the first pass and the L = 4 pass as one, and
+// (with 32 registers) the radix-4 passes two at a time.
 #include "frame/variant.h"
 #include "frame/status.h"
 #include "frame/memory.h"
@@ -167,6 +169,7 @@ inline void cmul(U ar, U ai, U wr, U wi, U& rr, U& ri) {
 
 // ---- passes -----------------------------------------------------------------
 
+
 // Input lanes c, c+1, ... of four streams q apart: lane l is element c + l
 // of the subsequences x[b], x[b + q], x[b + 2q], x[b + 3q].
 struct SplitInput {
@@ -200,42 +203,101 @@ inline void storeTransforms(float* w, const int32_t* rev, int b4, U y) {
     store(w + 4 * rev[b4], y);
 }
 
+// The 4-point transforms of the subsequences c, c+1, ... (one per lane of
+// U): y[k] gets the real parts of output k (Imag false) or the imaginary
+// ones.  Each half needs only one difference from the other, which keeps the
+// working set within eight registers (the 32-bit build has no more).
+template <bool Imag, class U, class In>
+inline void fourPoint(const In& in, int c, int q, U (&y)[4]) {
+    const auto own = [&](int i) {
+        if constexpr (Imag) return in.template im<U>(i);
+        else return in.template re<U>(i);
+    };
+    const auto other = [&](int i) {
+        if constexpr (Imag) return in.template re<U>(i);
+        else return in.template im<U>(i);
+    };
+    const U d13 = other(c + q) - other(c + 3 * q);
+    const U g0 = own(c), g1 = own(c + q), g2 = own(c + 2 * q), g3 = own(c + 3 * q);
+    const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
+    y[0] = s02 + s13, y[2] = s02 - s13;
+    // y1 = d02 - i d13, y3 = d02 + i d13
+    if constexpr (Imag) y[1] = d02 - d13, y[3] = d02 + d13;
+    else y[1] = d02 + d13, y[3] = d02 - d13;
+}
+
 // Bit-reversed gather fused with the 4-point transforms: the transform of
 // subsequence b lands at 4 * rev[b] of the work arrays, U::kLanes
-// subsequences at a time.  The real parts are done first, then the
-// imaginary ones: each half needs only one difference from the other, which
-// keeps the working set within eight registers (the 32-bit build has no
-// more).
+// subsequences at a time, the real parts first.
 template <class U, class In>
 void firstPass(const In& in, float* wr, float* wi, int n, const int32_t* rev) {
     const int q = n >> 2;
     for (int c = 0; c < q; c += U::kLanes) {
-        {
-            const U d13i = in.template im<U>(c + q) - in.template im<U>(c + 3 * q);
-            const U g0 = in.template re<U>(c), g1 = in.template re<U>(c + q);
-            const U g2 = in.template re<U>(c + 2 * q), g3 = in.template re<U>(c + 3 * q);
-            const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
-            U y0 = s02 + s13, y1 = d02 + d13i, y2 = s02 - s13, y3 = d02 - d13i;  // y1 = d02 - i d13
-            transpose4(y0, y1, y2, y3);
-            storeTransforms(wr, rev, c, y0);
-            storeTransforms(wr, rev, c + 1, y1);
-            storeTransforms(wr, rev, c + 2, y2);
-            storeTransforms(wr, rev, c + 3, y3);
+        U y[4];
+        fourPoint<false>(in, c, q, y);
+        transpose4(y[0], y[1], y[2], y[3]);
+        for (int k = 0; k < 4; ++k) storeTransforms(wr, rev, c + k, y[k]);
+        fourPoint<true>(in, c, q, y);
+        transpose4(y[0], y[1], y[2], y[3]);
+        for (int k = 0; k < 4; ++k) storeTransforms(wi, rev, c + k, y[k]);
+    }
+}
+
+#if ZOR_SIMD >= 1
+// The first pass and the radix-4 pass over its 4-point transforms (L = 4)
+// in one, for the wide registers: lanes run over b0 < n/16, and the
+// sixteen points b0 + u n/16 stay in registers.  Their four subsequences
+// b0 + t n/16 give the 4-point transforms (quarter t of the 16-point one),
+// the butterflies combine them per output k with the L = 4 twiddles tw, and
+// a transpose turns the sixteen outputs of each lane into the rows of the
+// 16-point sub-transform at 4 * rev[b0].
+template <class U, class In>
+void firstTwoPasses(const In& in, float* wr, float* wi, int n, const int32_t* rev, const float* tw) {
+    const int q = n >> 2, e = n >> 4;
+    for (int c = 0; c < e; c += U::kLanes) {
+        U yr[4][4], yi[4][4];  // [t][k]
+        for (int t = 0; t < 4; ++t) {
+            fourPoint<false>(in, c + t * e, q, yr[t]);
+            fourPoint<true>(in, c + t * e, q, yi[t]);
         }
-        {
-            const U d13r = in.template re<U>(c + q) - in.template re<U>(c + 3 * q);
-            const U g0 = in.template im<U>(c), g1 = in.template im<U>(c + q);
-            const U g2 = in.template im<U>(c + 2 * q), g3 = in.template im<U>(c + 3 * q);
-            const U s02 = g0 + g2, d02 = g0 - g2, s13 = g1 + g3;
-            U y0 = s02 + s13, y1 = d02 - d13r, y2 = s02 - s13, y3 = d02 + d13r;
-            transpose4(y0, y1, y2, y3);
-            storeTransforms(wi, rev, c, y0);
-            storeTransforms(wi, rev, c + 1, y1);
-            storeTransforms(wi, rev, c + 2, y2);
-            storeTransforms(wi, rev, c + 3, y3);
+        U zr[16], zi[16];  // output 4j + k
+        for (int k = 0; k < 4; ++k) {
+            struct {
+                const U (*r)[4];
+                const U (*i)[4];
+                int k;
+                U re(int t) const { return r[t][k]; }
+                U im(int t) const { return i[t][k]; }
+            } x{yr, yi, k};
+            struct {
+                U *r, *i;
+                int k;
+                void re(int j, U v) { r[4 * j + k] = v; }
+                void im(int j, U v) { i[4 * j + k] = v; }
+            } out{zr, zi, k};
+            radix4(x, out, set1<U>(tw[k]), set1<U>(tw[4 + k]), set1<U>(tw[8 + k]), set1<U>(tw[12 + k]),
+                   set1<U>(tw[16 + k]), set1<U>(tw[20 + k]));
+        }
+        // Per lane l of a block: transpose4 gathers output blocks 4j .. 4j+3
+        // of b0 = c + 4b + l into block b of register 4j + l, and
+        // transposeBlocks4 over j collects them into rows of the b0.
+        constexpr int kBlocks = U::kLanes / 4;
+        for (int j = 0; j < 4; ++j) {
+            transpose4(zr[4 * j], zr[4 * j + 1], zr[4 * j + 2], zr[4 * j + 3]);
+            transpose4(zi[4 * j], zi[4 * j + 1], zi[4 * j + 2], zi[4 * j + 3]);
+        }
+        for (int l = 0; l < 4; ++l) {
+            transposeBlocks4(zr[l], zr[4 + l], zr[8 + l], zr[12 + l]);
+            transposeBlocks4(zi[l], zi[4 + l], zi[8 + l], zi[12 + l]);
+            for (int r = 0; r < 4; ++r) {
+                const int at = 4 * rev[c + 4 * (r % kBlocks) + l] + 4 * kBlocks * (r / kBlocks);
+                store(wr + at, zr[4 * r + l]);
+                store(wi + at, zi[4 * r + l]);
+            }
         }
     }
 }
+#endif
 
 // Radix 2 over pairs of 4-point transforms; tw = cos[4], sin[4] of -2 pi k / 8.
 void radix2Pass(const float* ir, const float* ii, float* orr, float* oi, int n, const float* tw) {
@@ -267,47 +329,123 @@ struct LanesAt {
     }
 };
 
-// One radix-4 butterfly on the lanes of U from p0 on, of the four quarters
+// One radix-4 butterfly over the four quarters of a sub-transform pair:
+// x.re(j), x.im(j) read quarter j (residue j of the combined transform),
+// out.re(j, v), out.im(j, v) take output quarter j.  The order of the steps
+// keeps at most eight vectors live: t1 and t3 are combined at once, then
+// the real outputs leave before the imaginary inputs come in.
+template <class U, class Quarters, class Out>
+inline void radix4(const Quarters& x, Out& out, U w1r, U w1i, U w2r, U w2i, U w3r, U w3i) {
+    U t1r, t1i, t3r, t3i, t2r, t2i;
+    cmul(x.re(1), x.im(1), w1r, w1i, t1r, t1i);
+    cmul(x.re(3), x.im(3), w3r, w3i, t3r, t3i);
+    const U s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
+    cmul(x.re(2), x.im(2), w2r, w2i, t2r, t2i);
+    const U a0r = x.re(0), a0i = x.im(0);
+    const U s02r = a0r + t2r, d02r = a0r - t2r;
+    out.re(0, s02r + s13r);
+    out.re(2, s02r - s13r);
+    out.re(1, d02r + d13i);
+    out.re(3, d02r - d13i);
+    const U s02i = a0i + t2i, d02i = a0i - t2i;
+    out.im(0, s02i + s13i);
+    out.im(2, s02i - s13i);
+    out.im(1, d02i - d13r);
+    out.im(3, d02i + d13r);
+}
+
+// The radix-4 butterfly on the lanes of U from p0 on, of the four quarters
 // L apart.  In bit-reversed order the sub-transform of the odd quarter
-// (residue 1) sits at offset 2L and that of residue 2 at offset L.  The
-// order of the steps keeps at most eight vectors live: t1 and t3 are
-// combined at once, then the real outputs leave before the imaginary inputs
-// come in.
+// (residue 1) sits at offset 2L and that of residue 2 at offset L.
 template <class U, int Stride = 4>
 inline void butterfly4(const float* ir, const float* ii, float* orr, float* oi, int p0, int L,
                        U w1r, U w1i, U w2r, U w2i, U w3r, U w3i) {
     using M = LanesAt<U, Stride>;
-    const int p1 = p0 + L, p2 = p1 + L, p3 = p2 + L;
-    U t1r, t1i, t3r, t3i, t2r, t2i;
-    cmul(M::get(ir + p2), M::get(ii + p2), w1r, w1i, t1r, t1i);
-    cmul(M::get(ir + p3), M::get(ii + p3), w3r, w3i, t3r, t3i);
-    const U s13r = t1r + t3r, s13i = t1i + t3i, d13r = t1r - t3r, d13i = t1i - t3i;
-    cmul(M::get(ir + p1), M::get(ii + p1), w2r, w2i, t2r, t2i);
-    const U a0r = M::get(ir + p0), a0i = M::get(ii + p0);
-    const U s02r = a0r + t2r, d02r = a0r - t2r;
-    M::put(orr + p0, s02r + s13r);
-    M::put(orr + p2, s02r - s13r);
-    M::put(orr + p1, d02r + d13i);
-    M::put(orr + p3, d02r - d13i);
-    const U s02i = a0i + t2i, d02i = a0i - t2i;
-    M::put(oi + p0, s02i + s13i);
-    M::put(oi + p2, s02i - s13i);
-    M::put(oi + p1, d02i - d13r);
-    M::put(oi + p3, d02i + d13r);
+    struct {
+        const float *r, *i;
+        int p0, L;
+        int at(int j) const { return p0 + (j == 1 ? 2 * L : j == 2 ? L : j * L); }
+        U re(int j) const { return M::get(r + at(j)); }
+        U im(int j) const { return M::get(i + at(j)); }
+    } in{ir, ii, p0, L};
+    struct {
+        float *r, *i;
+        int p0, L;
+        void re(int j, U v) { M::put(r + p0 + j * L, v); }
+        void im(int j, U v) { M::put(i + p0 + j * L, v); }
+    } out{orr, oi, p0, L};
+    radix4(in, out, w1r, w1i, w2r, w2i, w3r, w3i);
 }
 
-// The radix-4 butterflies WideV::kLanes lanes at a time.  The twiddles of four
-// consecutive k fill one 24-float chunk, so a wide register takes its
-// 16-byte pieces from successive chunks.
+// Row r (w1r, w1i, w2r, w2i, w3r, w3i) of a pass's twiddles for k, k+1, ...
+// (k a multiple of 4): the table keeps four k per 24-float chunk, so a wide
+// register takes its 16-byte pieces from successive chunks.
 #if ZOR_SIMD >= 1
+inline WideV twiddleRow(const float* tw, int r, int k) { return loadBlocks<WideV>(tw + 6 * k + 4 * r, 24); }
+
+// The radix-4 butterflies WideV::kLanes lanes at a time.
 void radix4Wide(const float* ir, const float* ii, float* orr, float* oi, int n, int L, const float* tw) {
     using U = WideV;
-    for (int base = 0; base < n; base += 4 * L) {
-        const float* t = tw;
-        for (int k = 0; k < L; k += U::kLanes, t += 6 * U::kLanes)
-            butterfly4(ir, ii, orr, oi, base + k, L, loadBlocks<U>(t, 24), loadBlocks<U>(t + 4, 24),
-                       loadBlocks<U>(t + 8, 24), loadBlocks<U>(t + 12, 24), loadBlocks<U>(t + 16, 24),
-                       loadBlocks<U>(t + 20, 24));
+    for (int k = 0; k < L; k += U::kLanes) {  // each k's twiddles serve every base
+        const U w1r = twiddleRow(tw, 0, k), w1i = twiddleRow(tw, 1, k), w2r = twiddleRow(tw, 2, k);
+        const U w2i = twiddleRow(tw, 3, k), w3r = twiddleRow(tw, 4, k), w3i = twiddleRow(tw, 5, k);
+        for (int base = 0; base < n; base += 4 * L)
+            butterfly4(ir, ii, orr, oi, base + k, L, w1r, w1i, w2r, w2i, w3r, w3i);
+    }
+}
+
+// Two radix-4 passes in one (L and 4L, 16L <= n): the sixteen points
+// base + k + L j1 + 4L j (j1, j = 0 .. 3) depend on one another only, so
+// they stay in registers between the passes, lanes over k.  tw1 and tw2 are
+// the two passes' tables.
+void radix16Wide(const float* ir, const float* ii, float* orr, float* oi, int n, int L, const float* tw1,
+                 const float* tw2) {
+    using U = WideV;
+    // quarter res of a butterfly sits at offset (bit-reversed) slot[res]
+    static constexpr int kSlot[4] = {0, 2, 1, 3};
+    for (int k = 0; k < L; k += U::kLanes) {
+        // the twiddles of k, gathered once for every base
+        U w1[6], w2[4][6];
+        for (int r = 0; r < 6; ++r) {
+            w1[r] = twiddleRow(tw1, r, k);
+            for (int q = 0; q < 4; ++q) w2[q][r] = twiddleRow(tw2, r, k + L * q);
+        }
+        for (int base = 0; base < n; base += 16 * L) {
+            const int p = base + k;
+            U yr[4][4], yi[4][4];  // [j][q]: after the first pass, point p + L q + 4L j
+            for (int j = 0; j < 4; ++j) {
+                struct {
+                    const float *r, *i;
+                    int at;
+                    int L;
+                    U re(int res) const { return load<U>(r + at + kSlot[res] * L); }
+                    U im(int res) const { return load<U>(i + at + kSlot[res] * L); }
+                } x{ir, ii, p + 4 * L * j, L};
+                struct {
+                    U *r, *i;
+                    void re(int q, U v) { r[q] = v; }
+                    void im(int q, U v) { i[q] = v; }
+                } out{yr[j], yi[j]};
+                radix4(x, out, w1[0], w1[1], w1[2], w1[3], w1[4], w1[5]);
+            }
+            for (int q = 0; q < 4; ++q) {
+                struct {
+                    const U (*r)[4];
+                    const U (*i)[4];
+                    int q;
+                    U re(int res) const { return r[kSlot[res]][q]; }
+                    U im(int res) const { return i[kSlot[res]][q]; }
+                } x{yr, yi, q};
+                struct {
+                    float *r, *i;
+                    int at, L;
+                    void re(int j, U v) { store(r + at + 4 * L * j, v); }
+                    void im(int j, U v) { store(i + at + 4 * L * j, v); }
+                } out{orr, oi, p + L * q, L};
+                const U* w = w2[q];
+                radix4(x, out, w[0], w[1], w[2], w[3], w[4], w[5]);
+            }
+        }
     }
 }
 
@@ -401,24 +539,45 @@ template <class In>
 void runComplex(const FftSpec* s, const In& in, float* wr, float* wi, float* dr, float* di) {
     const int m = s->cOrder;
     const int n = 1 << m;
+    const float* tw = s->passTw;
+    int L = 4;
 #if ZOR_SIMD >= 1
     if constexpr (WideV::kLanes > 4 && std::is_same_v<In, SplitInput>) {
-        if (n >= 4 * WideV::kLanes) firstPass<WideV>(in, wr, wi, n, s->bitReverse);
-        else firstPass<V>(in, wr, wi, n, s->bitReverse);
+        if (!(m & 1) && n >= 16 * WideV::kLanes) {
+            firstTwoPasses<WideV>(in, wr, wi, n, s->bitReverse, tw);
+            tw += 24;
+            L = 16;
+        } else if (n >= 4 * WideV::kLanes) {
+            firstPass<WideV>(in, wr, wi, n, s->bitReverse);
+        } else {
+            firstPass<V>(in, wr, wi, n, s->bitReverse);
+        }
     } else
 #endif
     firstPass<V>(in, wr, wi, n, s->bitReverse);
-    const float* tw = s->passTw;
-    int L = 4;
     if (m & 1) {
         radix2Pass(wr, wi, wr, wi, n, tw);
         tw += 8;
         L = 8;
     }
-    for (; 4 * L <= n; L *= 4) {
+    while (4 * L <= n) {
+#if ZOR_SIMD >= 1
+        // (Where the 32 registers of the widest column hold the sixteen
+        // points; with 16 registers the spills cost what the pairing saves.)
+        if constexpr (WideV::kLanes >= 16) {
+            if (L >= WideV::kLanes && 64 * L <= n) {  // twiddles gathered for four groups or more
+                const bool last = 16 * L == n;
+                radix16Wide(wr, wi, last ? dr : wr, last ? di : wi, n, L, tw, tw + 6 * L);
+                tw += 30 * L;
+                L *= 16;
+                continue;
+            }
+        }
+#endif
         const bool last = 4 * L == n;
         radix4Pass(wr, wi, last ? dr : wr, last ? di : wi, n, L, tw);
         tw += 6 * L;
+        L *= 4;
     }
 }
 
@@ -450,6 +609,18 @@ bool overlaps(const float* a, const float* b, int64_t n) {
     return a < b + n && b < a + n;
 }
 
+// Whether the passes may sweep p as work memory: in the wide columns a
+// register that straddles two cache lines costs both per load and store,
+// so a destination not aligned to the register gets the aligned work
+// arrays (only the last pass then writes it).
+bool wholeLines(const float* p) {
+#if ZOR_SIMD >= 1
+    if constexpr (WideV::kLanes > 4) return (reinterpret_cast<uintptr_t>(p) & (sizeof(WideV) - 1)) == 0;
+#endif
+    (void)p;
+    return true;
+}
+
 Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const float* si, float* dr,
                       float* di, uint8_t* pBuffer) {
     const int order = s->order;
@@ -476,8 +647,8 @@ Status forwardComplex(const FftSpec* s, bool scaled, const float* sr, const floa
         runComplex(s, in, w, w + n, dr, di);
         mem::alignedFree(own);
     } else if (overlaps(sr, dr, n) || overlaps(sr, di, n) || overlaps(si, dr, n) ||
-               overlaps(si, di, n)) {
-        alignas(16) float w[2 << kSmallOrder];
+               overlaps(si, di, n) || !wholeLines(dr) || !wholeLines(di)) {
+        alignas(64) float w[2 << kSmallOrder];
         runComplex(s, in, w, w + n, dr, di);
     } else {
         runComplex(s, in, dr, di, dr, di);
