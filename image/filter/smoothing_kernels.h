@@ -123,15 +123,26 @@ void columnMap(T* col, ptrdiff_t n, const uint8_t* const (&rows)[R], Op op) {
 
 // ---- along the rows ------------------------------------------------------------------
 
-// h[i] = c[i] + c[i + stride] + ... (taps lanes), i < n.
+// h[i] = c[i] + c[i + stride] + ... (taps lanes), i < n.  The common
+// counts are constants of the loop: a run-time count is one more live
+// register, which on 32-bit x86 put the loop's own pointer on the stack.
 template <class T>
 void windowSums(const T* c, T* h, ptrdiff_t n, int taps, int stride) {
-    forLanes<T>(0, n, [&](auto w, ptrdiff_t i) {
-        using W = decltype(w);
-        W acc = simd::load<W>(c + i);
-        for (int k = 1; k < taps; ++k) acc = W(acc + simd::load<W>(c + i + ptrdiff_t(k) * stride));
-        simd::store(h + i, acc);
-    });
+    const auto sums = [&](auto count) {
+        const int m = count ? int(count) : taps;
+        forLanes<T>(0, n, [&](auto w, ptrdiff_t i) {
+            using W = decltype(w);
+            W acc = simd::load<W>(c + i);
+            for (int k = 1; k < m; ++k) acc = W(acc + simd::load<W>(c + i + ptrdiff_t(k) * stride));
+            simd::store(h + i, acc);
+        });
+    };
+    switch (taps) {
+    case 3: sums(std::integral_constant<int, 3>()); break;
+    case 5: sums(std::integral_constant<int, 5>()); break;
+    case 7: sums(std::integral_constant<int, 7>()); break;
+    default: sums(std::integral_constant<int, 0>()); break;
+    }
 }
 
 // The same in time independent of taps.  Up to a step of lanes directly;
