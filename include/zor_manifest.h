@@ -843,19 +843,19 @@ ZOR_FN(ZOR_GENERIC, Status, zoriGetPerspectiveTransform,
  * ConvFull_8u_C1R: the same sum in exact integers, dst = floor(sum /
  *   divisor + 1/2) saturated to 0 .. 255 (so a negative divisor gives 0
  *   everywhere); divisor 0: StatusBadDivisor. */
-ZOR_FN(ZOR_SSE2UP, Status, zoriFilterBox_8u_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriFilterBox_8u_C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
         ImagePoint anchor))
-ZOR_FN(ZOR_SSE2UP, Status, zoriFilterBox_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriFilterBox_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, ImageSize maskSize,
         ImagePoint anchor))
-ZOR_FN(ZOR_SSE2UP, Status, zoriFilterGauss_8u_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriFilterGauss_8u_C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
-ZOR_FN(ZOR_SSE2UP, Status, zoriFilterGauss_8u_C3R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriFilterGauss_8u_C3R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
-ZOR_FN(ZOR_SSE2UP, Status, zoriFilterLowpass_8u_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriFilterLowpass_8u_C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
-ZOR_FN(ZOR_SSE2UP, Status, zoriFilterHipass_8u_C1R,
+ZOR_FN(ZOR_SSE2UP_WIDE, Status, zoriFilterHipass_8u_C1R,
        (const uint8_t* pSrc, int srcStep, uint8_t* pDst, int dstStep, ImageSize dstRoiSize, int mask))
 ZOR_FN(ZOR_GENERIC, Status, zoriFilterWienerGetBufferSize,
        (ImageSize dstRoiSize, ImageSize maskSize, int channels, int* pBufferSize))

@@ -54,8 +54,8 @@ inline void storeBytes(uint8_t* d, ptrdiff_t n, F f) {
     ptrdiff_t i = 0;
 #if ZOR_SIMD >= 2
     for (; i + Bytes::kLanes <= n; i += Bytes::kLanes)
-        simd::store(d + i, simd::narrowSat<uint8_t>(simd::bitcast<int16_t>(f(Words{}, i)),
-                                                    simd::bitcast<int16_t>(f(Words{}, i + Words::kLanes))));
+        simd::store(d + i, simd::narrowSatInOrder<uint8_t>(simd::bitcast<int16_t>(f(Words{}, i)),
+                                                           simd::bitcast<int16_t>(f(Words{}, i + Words::kLanes))));
 #endif
     for (; i < n; ++i) d[i] = saturate<uint8_t>(int(f(uint16_t{}, i)));
 }
@@ -64,7 +64,7 @@ inline void storeBytes(uint8_t* d, ptrdiff_t n, F f) {
 template <class W>
 inline W loadBytesAs(const uint8_t* p) {
 #if ZOR_SIMD >= 2
-    if constexpr (!std::is_arithmetic_v<W>) return simd::widenLo(simd::loadHalf<Bytes>(p));
+    if constexpr (!std::is_arithmetic_v<W>) return simd::widenLoInOrder(simd::loadHalf<Bytes>(p));
     else
 #endif
         return W(*p);
@@ -78,16 +78,16 @@ inline W loadBytesAs(const uint8_t* p) {
 template <int P, class U>
 inline void widenBytes(Bytes b, simd::Vec<U>* out) {
     if constexpr (sizeof(U) == 2) {
-        out[0] = simd::widenLo(b);
-        out[1] = simd::widenHi(b);
+        out[0] = simd::widenLoInOrder(b);
+        out[1] = simd::widenHiInOrder(b);
         if constexpr (P == 2) out[0] = out[0] * out[0], out[1] = out[1] * out[1];
     } else {
         using H = std::conditional_t<sizeof(U) == 4, uint16_t, uint32_t>;
         simd::Vec<H> half[sizeof(H)];
         widenBytes<P>(b, half);
         for (size_t k = 0; k < sizeof(H); ++k) {
-            out[2 * k] = simd::widenLo(half[k]);
-            out[2 * k + 1] = simd::widenHi(half[k]);
+            out[2 * k] = simd::widenLoInOrder(half[k]);
+            out[2 * k + 1] = simd::widenHiInOrder(half[k]);
         }
     }
 }
