@@ -57,6 +57,7 @@ TEST_P(Cepstral, PreemphasisAndPadding) {
 // coefficient.  The SIMD sums take one to four pairs of coefficients at once
 // (an odd count leaves half a pair): counts for each.
 TEST_P(Cepstral, DctLifter) {
+    const double pi = 3.141592653589793;
     struct { int n, ceps; } const sizes[] = {{26, 13}, {6, 6}, {3, 1}, {40, 19}, {9, 4}};
     for (const auto& sz : sizes) {
         void* d = nullptr;
@@ -66,8 +67,8 @@ TEST_P(Cepstral, DctLifter) {
         EXPECT_TRUE(z().zorsDCTLifterFree_32f(d) == StatusOk && out[sz.ceps] == 7.0f);
         zor::DoublePrecisionScope fpu;
         for (int i = 1; i <= sz.ceps; ++i) {
-            volatile double acc = 0, lifter = float((1 + double(11.0f) * std::sin(i * M_PI / 22)) * 0.75);
-            for (int j = 1; j <= sz.n; ++j) acc = acc + double(float(std::cos((j - 0.5) * i * M_PI / sz.n))) * c[j - 1];
+            volatile double acc = 0, lifter = float((1 + double(11.0f) * std::sin(i * pi / 22)) * 0.75);
+            for (int j = 1; j <= sz.n; ++j) acc = acc + double(float(std::cos((j - 0.5) * i * pi / sz.n))) * c[j - 1];
             EXPECT_EQ(out[i - 1], float(acc * lifter)) << sz.n << " " << i;
         }
     }
