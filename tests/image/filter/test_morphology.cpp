@@ -36,7 +36,8 @@ template <class T, class F>
                 const T p = at(x - a.x + k % m.width, y - a.y + k / m.width);
                 if (mask[k] && (first || (max ? p > v : p < v))) v = p, first = 0;
             }
-            if (std::memcmp(img.at(x, y), &v, sizeof v) != 0) return ::testing::AssertionFailure() << w << "x" << h << " at " << x << "," << y;
+            if (std::memcmp(img.at(x, y), &v, sizeof v) != 0)
+                return ::testing::AssertionFailure() << w << "x" << h << " at " << x << "," << y;
         }
     return ::testing::AssertionSuccess();
 }
