@@ -1,9 +1,9 @@
 // Canny: buffer size, magnitudes and thresholds, direction classes and their
 // tie rules, hysteresis, clearing of whole rows, check order.
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
-#include <limits>
 #include <random>
 #include <vector>
 
@@ -19,10 +19,7 @@ struct Grad {
     int w, h;
     std::vector<int16_t> dx, dy;
     Grad(int w, int h) : w(w), h(h), dx(size_t(w) * h), dy(size_t(w) * h) {}
-    void set(int x, int y, int gx, int gy) {
-        dx[size_t(y) * w + x] = int16_t(gx);
-        dy[size_t(y) * w + x] = int16_t(gy);
-    }
+    void set(int x, int y, int gx, int gy) { dx[size_t(y) * w + x] = int16_t(gx), dy[size_t(y) * w + x] = int16_t(gy); }
 };
 
 // Straightforward detector: magnitudes, suppression, then growth by a
@@ -60,27 +57,23 @@ std::vector<uint8_t> reference(const Grad& g, float low, float high) {
 // Runs the detector with guarded inputs, a buffer of exactly the reported
 // size, and a destination whose rows are wider than the ROI.
 std::vector<uint8_t> run(const zt::Api& z, const Grad& g, float low, float high, int extra = 3) {
-    const int w = g.w, h = g.h;
+    const int w = g.w, h = g.h, step = w + extra;
     zt::GuardedImage<int16_t> dx(w, h, 0, 2), dy(w, h, 0, 0, zt::Guard::Before);
-    for (int y = 0; y < h; ++y)
-        for (int x = 0; x < w; ++x) {
-            *dx.at(x, y) = g.dx[size_t(y) * w + x];
-            *dy.at(x, y) = g.dy[size_t(y) * w + x];
-        }
+    dx.fill([&](int x, int y) { return g.dx[size_t(y) * w + x]; });
+    dy.fill([&](int x, int y) { return g.dy[size_t(y) * w + x]; });
     int size = 0;
     EXPECT_EQ(zt::api(0).zoriCannyGetSize({w, h}, &size), StatusOk);
-    zt::GuardedBuffer buf(size_t(size), w % 2 ? zt::Guard::After : zt::Guard::Before);
+    // the destination: exactly height * step bytes, the last row's padding is cleared too
+    zt::GuardedBuffer buf(size_t(size), w % 2 ? zt::Guard::After : zt::Guard::Before), dst(size_t(h) * size_t(step));
     std::memset(buf.data(), 0xCD, buf.size());
-    // exactly height * step bytes: the last row's padding is cleared too
-    const int step = w + extra;
-    zt::GuardedBuffer dst(size_t(h) * size_t(step));
     std::memset(dst.data(), 0x5A, dst.size());
     EXPECT_EQ(z.zoriCanny_16s8u_C1R(dx.roi(), dx.step(), dy.roi(), dy.step(), dst.data(), step, {w, h}, low, high,
                                     buf.data()), StatusOk);
-    for (int y = 0; y < h; ++y)
-        for (int x = w; x < step; ++x) EXPECT_EQ(dst.data()[size_t(y) * step + x], 0) << x << "," << y;
     std::vector<uint8_t> out(size_t(w) * h);
-    for (int y = 0; y < h; ++y) std::memcpy(&out[size_t(y) * w], dst.data() + size_t(y) * step, size_t(w));
+    for (int y = 0; y < h; ++y) {
+        std::memcpy(&out[size_t(y) * w], dst.data() + size_t(y) * step, size_t(w));
+        for (int x = w; x < step; ++x) EXPECT_EQ(dst.data()[size_t(y) * step + x], 0) << x << "," << y;
+    }
     return out;
 }
 
@@ -93,15 +86,13 @@ TEST_P(Canny, RandomGradientsMatchReference) {
     static const float extremeLows[] = {0.0f, 1.0f, 65534.0f, 65535.0f, 65536.0f, 40000.0f};
     for (int trial = 0; trial < 18; ++trial) {
         const bool extreme = trial >= 12;
-        const int w = 1 + int(rng() % 45), h = 1 + int(rng() % 20);
-        const int range = trial % 3 == 0 ? 3 : trial % 3 == 1 ? 60 : 32768;
-        const auto value = [&] { return extreme ? extremes[rng() % 8] : int(rng() % (2 * range)) - range; };
+        const int w = 1 + int(rng() % 45), h = 1 + int(rng() % 20), range = trial % 3 == 0 ? 3 : trial % 3 == 1 ? 60 : 32768;
+        const auto value = [&] { return int16_t(extreme ? extremes[rng() % 8] : int(rng() % (2 * range)) - range); };
         Grad g(w, h);
-        for (int y = 0; y < h; ++y)
-            for (int x = 0; x < w; ++x) g.set(x, y, value(), value());
+        for (size_t i = 0; i < g.dx.size(); ++i) g.dx[i] = value(), g.dy[i] = value();
         const float low = extreme ? extremeLows[trial - 12] : trial % 3 == 2 ? 3000.0f : float(rng() % 20) + 0.7f;
-        for (const float high : {low * 2.5f, low, low + 0.5f, 65535.0f, 65535.5f, 65536.0f, 1e30f}) {
-            if (high < low) continue;
+        for (float high : {low * 2.5f, low, low + 0.5f, 65535.0f, 65535.5f, 65536.0f, 1e30f}) {
+            high = std::max(high, low);
             ASSERT_EQ(run(z(), g, low, high), reference(g, low, high)) << trial << " " << low << " " << high;
         }
     }
@@ -109,40 +100,30 @@ TEST_P(Canny, RandomGradientsMatchReference) {
 
 // Smooth random pictures give long, connected edges: growth runs across many
 // rows, also upwards, and through rows far above the one being suppressed.
+// Every other picture has the one magnitude of 65536 in its last row: the
+// vector variants give up there and everything is redone another way, with
+// the same result.
 TEST_P(Canny, TallPicturesMatchReference) {
     std::mt19937 rng(7 + variant());
     for (int trial = 0; trial < 6; ++trial) {
         const int w = 8 + int(rng() % 60), h = 30 + int(rng() % 70);
-        std::vector<double> f(size_t(w + 2) * (h + 2));
-        for (int b = 0; b < 12; ++b) {  // a few blobs
-            const double cx = rng() % (w + 2), cy = rng() % (h + 2), r = 3 + rng() % 15, a = int(rng() % 200) - 100;
-            for (int y = 0; y < h + 2; ++y)
-                for (int x = 0; x < w + 2; ++x)
-                    f[size_t(y) * (w + 2) + x] += a * std::exp(-((x - cx) * (x - cx) + (y - cy) * (y - cy)) / (r * r));
-        }
+        std::uniform_real_distribution<double> u(0.02, 0.3);
+        const double fx = u(rng), fy = u(rng), fz = u(rng), px = 20 * u(rng), py = 20 * u(rng);
+        const auto f = [&](int x, int y) {  // waves under a slow envelope
+            return 150 * std::sin(x * fx + px) * std::sin(y * fy + py) * std::sin((x + 2 * y) * fz / 8 + px);
+        };
         Grad g(w, h);
-        auto F = [&](int x, int y) { return f[size_t(y + 1) * (w + 2) + size_t(x + 1)]; };
         for (int y = 0; y < h; ++y)
-            for (int x = 0; x < w; ++x)
-                g.set(x, y, int(8 * (F(x + 1, y) - F(x - 1, y))) + int(rng() % 5) - 2,
-                      int(8 * (F(x, y + 1) - F(x, y - 1))) + int(rng() % 5) - 2);
-        for (const float low : {1.0f, 20.0f, 60.5f}) {
-            const float high = low * (trial % 2 ? 2.0f : 6.0f);
+            for (int x = 0; x < w; ++x) {
+                const int nx = int(rng() % 5) - 2, ny = int(rng() % 5) - 2;  // a little noise
+                g.set(x, y, int(8 * (f(x + 1, y) - f(x - 1, y))) + nx, int(8 * (f(x, y + 1) - f(x, y - 1))) + ny);
+            }
+        if (trial % 2) g.set(int(rng() % w), h - 1, -32768, -32768);
+        for (const float low : {0.0f, 1.0f, 20.0f, 60.5f}) {
+            const float high = std::max(low, 1.0f) * (trial % 3 ? 2.0f : 6.0f);
             ASSERT_EQ(run(z(), g, low, high), reference(g, low, high)) << trial << " " << low;
         }
     }
-}
-
-// Ordinary edges over many rows, and the largest magnitude only in the
-// last row: everything before it is redone another way, same result.
-TEST_P(Canny, LargestMagnitudeInTheLastRow) {
-    std::mt19937 rng(99 + variant());
-    Grad g(40, 50);
-    for (int y = 0; y < g.h; ++y)
-        for (int x = 0; x < g.w; ++x) g.set(x, y, (x * 7 + y * 3) % 11 == 0 ? 300 : int(rng() % 40), int(rng() % 90));
-    g.set(17, 49, -32768, -32768);
-    for (const float low : {0.0f, 30.0f})
-        ASSERT_EQ(run(z(), g, low, 200), reference(g, low, 200)) << low;
 }
 
 // Gradients on both sides of the direction class borders, ay < tan 22.5 ax
@@ -157,18 +138,15 @@ TEST_P(Canny, DirectionClassBorders) {
     for (int image = 0; image < 4; ++image) {
         const int cols = 41, rows = 20;
         Grad g(3 * cols, 3 * rows);
-        for (int j = 0; j < rows; ++j)
-            for (int i = 0; i < cols; ++i) {
-                const int k = j * cols + i, x = 3 * i, y = 3 * j;
-                const bool vertical = k % 2;
-                int ax = vertical ? 1 + int(rng() % 13500) : 1 + int(rng() % 32768);
-                if (k < 16) ax = vertical ? 1 + k / 2 : 32768 - k / 2;  // the ends of the ranges
-                const int ay = vertical ? above67(ax) - int(k / 2 % 2) : below22(ax) + int(k / 2 % 2);
-                const int sx = rng() % 2 ? 1 : -1, sy = rng() % 2 ? 1 : -1;
-                g.set(x, y, ax == 32768 ? -32768 : sx * ax, sy * ay);
-                if (vertical) g.set(x, y + 1, 32767, 32767);
-                else g.set(x + 1, y, 32767, 32767);
-            }
+        for (int k = 0; k < cols * rows; ++k) {
+            const int x = 3 * (k % cols), y = 3 * (k / cols), vertical = k % 2;
+            // the first ones at the ends of the ranges
+            const int ax = k < 16 ? (vertical ? 1 + k / 2 : 32768 - k / 2) : 1 + int(rng() % (vertical ? 13500 : 32768));
+            const int ay = vertical ? above67(ax) - int(k / 2 % 2) : below22(ax) + int(k / 2 % 2);
+            const int sx = rng() % 2 ? 1 : -1, sy = rng() % 2 ? 1 : -1;
+            g.set(x, y, ax == 32768 ? -32768 : sx * ax, sy * ay);
+            g.set(x + 1 - vertical, y + vertical, 32767, 32767);
+        }
         ASSERT_EQ(run(z(), g, 1, 2), reference(g, 1, 2)) << image;
     }
 }
@@ -177,27 +155,23 @@ TEST_P(Canny, DirectionClassBorders) {
 // thresholds (0 <= low <= high, no NaN); on failure nothing is written.
 TEST_P(Canny, ChecksAndSizes) {
     const auto& z = this->z();
-    const struct { ImageSize roi; int size; } sizes[] = {{{3, 2}, 5 * 5 * 4 + 16 * 3 + 160},
-                                                          {{65532, 1}, 5 * 65534 * 3 + 16 * 65532 + 160},
-                                                          {{65533, 1}, 9 * 65535 * 3 + 16 * 65533 + 160},
-                                                          {{1, 65533}, 9 * 65535 * 3 + 16 + 160}};
+    const struct { ImageSize roi; int size; } sizes[] = {
+        {{3, 2}, 5 * 5 * 4 + 16 * 3 + 160}, {{65532, 1}, 5 * 65534 * 3 + 16 * 65532 + 160},
+        {{65533, 1}, 9 * 65535 * 3 + 16 * 65533 + 160}, {{1, 65533}, 9 * 65535 * 3 + 16 + 160}};
     int n = 0;
-    for (const auto& c : sizes) {
-        ASSERT_EQ(z.zoriCannyGetSize(c.roi, &n), StatusOk);
-        EXPECT_EQ(n, c.size);
-    }
+    for (const auto& c : sizes)
+        EXPECT_TRUE(z.zoriCannyGetSize(c.roi, &n) == StatusOk && n == c.size) << c.roi.width << "x" << c.roi.height << ": " << n;
     zt::expectChecks(z.zoriCannyGetSize, {ImageSize{3, 2}, &n}, {zt::watch(&n, sizeof n)}, zt::eachNull(), zt::badRoi<0>(),
                      zt::bad(StatusNullPointer, zt::arg<0>(ImageSize{0, 1}), zt::arg<1>(nullptr)));
     int16_t dx[64] = {}, dy[64] = {};
     uint8_t d[64], buf[2048];
     std::memset(d, 7, sizeof d);
-    const float nan = std::numeric_limits<float>::quiet_NaN();
     zt::expectChecks(z.zoriCanny_16s8u_C1R, {dx, 8, dy, 8, d, 4, ImageSize{4, 2}, 5.0f, 5.0f, buf}, {zt::watch(d, sizeof d)},
                      zt::eachNull(), zt::badRoi<6>(), zt::bad(StatusBadStep, zt::arg<1>(7)), zt::bad(StatusBadStep, zt::arg<3>(7)),
                      zt::bad(StatusBadStep, zt::arg<5>(3)), zt::bad(StatusNotEvenStep, zt::arg<1>(9)),
                      zt::bad(StatusNotEvenStep, zt::arg<3>(11)), zt::bad(StatusBadArgument, zt::arg<7>(-1.0f)),
-                     zt::bad(StatusBadArgument, zt::arg<7>(6.0f)), zt::bad(StatusBadArgument, zt::arg<7>(nan)),
-                     zt::bad(StatusBadArgument, zt::arg<8>(nan)),
+                     zt::bad(StatusBadArgument, zt::arg<7>(6.0f)), zt::bad(StatusBadArgument, zt::arg<7>(NAN)),
+                     zt::bad(StatusBadArgument, zt::arg<8>(NAN)),
                      zt::bad(StatusNullPointer, zt::arg<9>(nullptr), zt::arg<6>(ImageSize{0, 0})),
                      zt::bad(StatusBadSize, zt::arg<6>(ImageSize{0, 2}), zt::arg<7>(-1.0f)),
                      zt::bad(StatusBadStep, zt::arg<1>(7), zt::arg<3>(0), zt::arg<5>(0), zt::arg<7>(-1.0f)),
@@ -209,11 +183,9 @@ TEST_P(Canny, WideCoordinates) {
     // a padded width of 65535 switches the stack to 32-bit coordinates
     Grad g(65533, 1);
     for (int x = 0; x < g.w; x += 7) g.set(x, 0, x % 3 ? 40 : 200, 0);
-    g.set(65532, 0, 200, 0);
-    g.set(65531, 0, 20, 20);
+    g.set(65532, 0, 200, 0), g.set(65531, 0, 20, 20);
     const auto e = run(z(), g, 10, 100, 0);
-    EXPECT_EQ(e, reference(g, 10, 100));
-    EXPECT_EQ(e[65532], 255);
+    EXPECT_TRUE(e == reference(g, 10, 100) && e[65532] == 255);
 }
 
 }  // namespace

@@ -1,6 +1,5 @@
 // Copies, fills, channel layouts, channel order and replicated borders, on
 // every variant, against plain loops written here.
-#include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cstdint>
@@ -15,9 +14,7 @@
 
 namespace {
 
-using zpt::contents;
-using zpt::image;
-using zpt::movesAsExpected;
+using namespace zpt;
 template <class T>
 using Img = zt::GuardedImage<T>;
 
@@ -25,39 +22,38 @@ class Copy : public zt::VariantTest {};
 
 // Every destination pixel (DC elements) takes N elements of its source
 // pixel (SC elements), as bytes (a float assignment on x87 would quiet
-// signalling NaNs); its other elements stay.
-template <class T, int SC, int DC, int N>
-::testing::AssertionResult picks(Status(ZOR_CALL* fn)(const T*, int, T*, int, ImageSize), uint32_t seed) {
-    return movesAsExpected<T, T>(
-        SC, DC, seed, [fn](Img<T>& s, Img<T>& d, ImageSize r) { return fn(s.roi(), s.step(), d.roi(), d.step(), r); },
-        [](const std::vector<T>& s, std::vector<T>& d) {
-            for (size_t p = 0; p < s.size() / SC; ++p) std::memcpy(&d[p * DC], &s[p * SC], N * sizeof(T));
-        });
+// signalling NaNs); its other elements stay.  Each export given in turn.
+template <class T>
+T elementOf(Status(ZOR_CALL*)(const T*, int, T*, int, ImageSize));
+
+template <int SC, int DC, int N, class... Fn>
+::testing::AssertionResult picks(uint32_t seed, Fn... fns) {
+    const auto one = [&](auto fn) {
+        using T = decltype(elementOf(fn));
+        return movesAsExpected<T, T>(
+            SC, DC, seed++, [fn](Img<T>& s, Img<T>& d, ImageSize r) { return fn(s.roi(), s.step(), d.roi(), d.step(), r); },
+            [](const std::vector<T>& s, std::vector<T>& d) {
+                for (size_t p = 0; p < s.size() / SC; ++p) std::memcpy(&d[p * DC], &s[p * SC], N * sizeof(T));
+            });
+    };
+    ::testing::AssertionResult r = ::testing::AssertionSuccess();
+    ((r = r ? one(fns) : r), ...);
+    return r;
 }
 
 TEST_P(Copy, EveryPixelLayout) {
-    EXPECT_TRUE((picks<uint8_t, 1, 1, 1>(z().zoriCopy_8u_C1R, 1)));
-    EXPECT_TRUE((picks<int16_t, 1, 1, 1>(z().zoriCopy_16s_C1R, 2)));
-    EXPECT_TRUE((picks<float, 1, 1, 1>(z().zoriCopy_32f_C1R, 3)));  // random bits: NaNs move unchanged
-    EXPECT_TRUE((picks<uint8_t, 3, 3, 3>(z().zoriCopy_8u_C3R, 4)));
-    EXPECT_TRUE((picks<int16_t, 3, 3, 3>(z().zoriCopy_16s_C3R, 5)));
-    EXPECT_TRUE((picks<float, 3, 3, 3>(z().zoriCopy_32f_C3R, 6)));
-    EXPECT_TRUE((picks<uint8_t, 4, 4, 4>(z().zoriCopy_8u_C4R, 7)));
-    EXPECT_TRUE((picks<int16_t, 4, 4, 4>(z().zoriCopy_16s_C4R, 8)));
-    EXPECT_TRUE((picks<uint8_t, 3, 1, 1>(z().zoriCopy_8u_C3C1R, 11)));
-    EXPECT_TRUE((picks<int16_t, 3, 1, 1>(z().zoriCopy_16s_C3C1R, 12)));
-    EXPECT_TRUE((picks<uint8_t, 4, 1, 1>(z().zoriCopy_8u_C4C1R, 13)));
-    EXPECT_TRUE((picks<int16_t, 4, 1, 1>(z().zoriCopy_16s_C4C1R, 14)));
-    EXPECT_TRUE((picks<uint8_t, 1, 3, 1>(z().zoriCopy_8u_C1C3R, 15)));
-    EXPECT_TRUE((picks<int16_t, 1, 3, 1>(z().zoriCopy_16s_C1C3R, 16)));
-    EXPECT_TRUE((picks<uint8_t, 1, 4, 1>(z().zoriCopy_8u_C1C4R, 17)));
-    EXPECT_TRUE((picks<int16_t, 1, 4, 1>(z().zoriCopy_16s_C1C4R, 18)));
-    EXPECT_TRUE((picks<uint8_t, 3, 4, 3>(z().zoriCopy_8u_C3AC4R, 19)));  // the alpha stays as it was
-    EXPECT_TRUE((picks<int16_t, 3, 4, 3>(z().zoriCopy_16s_C3AC4R, 20)));
-    EXPECT_TRUE((picks<uint8_t, 4, 3, 3>(z().zoriCopy_8u_AC4C3R, 21)));
-    EXPECT_TRUE((picks<int16_t, 4, 3, 3>(z().zoriCopy_16s_AC4C3R, 22)));
+    const zt::Api& a = z();  // random bits: float NaNs move unchanged
+    EXPECT_TRUE((picks<1, 1, 1>(1, a.zoriCopy_8u_C1R, a.zoriCopy_16s_C1R, a.zoriCopy_32f_C1R)));
+    EXPECT_TRUE((picks<3, 3, 3>(4, a.zoriCopy_8u_C3R, a.zoriCopy_16s_C3R, a.zoriCopy_32f_C3R)));
+    EXPECT_TRUE((picks<4, 4, 4>(7, a.zoriCopy_8u_C4R, a.zoriCopy_16s_C4R)));
+    EXPECT_TRUE((picks<3, 1, 1>(11, a.zoriCopy_8u_C3C1R, a.zoriCopy_16s_C3C1R)));
+    EXPECT_TRUE((picks<4, 1, 1>(13, a.zoriCopy_8u_C4C1R, a.zoriCopy_16s_C4C1R)));
+    EXPECT_TRUE((picks<1, 3, 1>(15, a.zoriCopy_8u_C1C3R, a.zoriCopy_16s_C1C3R)));
+    EXPECT_TRUE((picks<1, 4, 1>(17, a.zoriCopy_8u_C1C4R, a.zoriCopy_16s_C1C4R)));
+    EXPECT_TRUE((picks<3, 4, 3>(19, a.zoriCopy_8u_C3AC4R, a.zoriCopy_16s_C3AC4R)));  // the alpha stays as it was
+    EXPECT_TRUE((picks<4, 3, 3>(21, a.zoriCopy_8u_AC4C3R, a.zoriCopy_16s_AC4C3R)));
     EXPECT_TRUE((movesAsExpected<uint8_t, uint8_t>(
-        1, 3, 30, [&](Img<uint8_t>& s, Img<uint8_t>& d, ImageSize r) { return z().zoriDup_8u_C1C3R(s.roi(), s.step(), d.roi(), d.step(), r); },
+        1, 3, 30, [&](Img<uint8_t>& s, Img<uint8_t>& d, ImageSize r) { return a.zoriDup_8u_C1C3R(s.roi(), s.step(), d.roi(), d.step(), r); },
         [](const std::vector<uint8_t>& s, std::vector<uint8_t>& d) {
             for (size_t p = 0; p < s.size(); ++p) d[3 * p] = d[3 * p + 1] = d[3 * p + 2] = s[p];
         })));
@@ -66,9 +62,8 @@ TEST_P(Copy, EveryPixelLayout) {
 // The multi-channel side's pointer picks the channel; pointing at the last
 // one, its row ends one element after it, against the guard page.
 TEST_P(Copy, ChannelChosenByPointer) {
-    const uint8_t src[6] = {1, 2, 3, 4, 5, 6};
-    uint8_t one[2] = {0, 0}, four[8] = {0, 0, 0, 0, 0, 0, 0, 0};
-    const uint8_t expect[8] = {0, 3, 0, 0, 0, 6, 0, 0};
+    const uint8_t src[6] = {1, 2, 3, 4, 5, 6}, expect[8] = {0, 3, 0, 0, 0, 6, 0, 0};
+    uint8_t one[2] = {}, four[8] = {};
     ASSERT_EQ(z().zoriCopy_8u_C3C1R(src + 2, 6, one, 2, {2, 1}), StatusOk);
     ASSERT_EQ(z().zoriCopy_8u_C1C4R(one, 2, four + 1, 8, {2, 1}), StatusOk);
     EXPECT_EQ(0, std::memcmp(four, expect, 8));
@@ -83,10 +78,8 @@ TEST_P(Copy, ChannelChosenByPointer) {
                 for (int x = 0; x < roi.width; ++x) ASSERT_EQ(*d->at(x, y), *s->at(x * sc + sc - 1, y));
         }
     };
-    last(z().zoriCopy_8u_C3C1R, uint8_t(), 3);
-    last(z().zoriCopy_8u_C4C1R, uint8_t(), 4);
-    last(z().zoriCopy_16s_C3C1R, int16_t(), 3);
-    last(z().zoriCopy_16s_C4C1R, int16_t(), 4);
+    last(z().zoriCopy_8u_C3C1R, uint8_t(), 3), last(z().zoriCopy_8u_C4C1R, uint8_t(), 4);
+    last(z().zoriCopy_16s_C3C1R, int16_t(), 3), last(z().zoriCopy_16s_C4C1R, int16_t(), 4);
 }
 
 TEST_P(Copy, MaskedCopyAndSet) {
@@ -150,34 +143,27 @@ TEST_P(Copy, PlanarBothWays) {
 // the channel phase); a float fill keeps a NaN's payload.
 TEST_P(Copy, Fills) {
     const std::vector<ImageSize> sizes = {{1, 1}, {7, 3}, {16, 2}, {33, 3}, {49, 2}, {100, 2}, {1500, 3}, {2001, 2}};
-    const auto fill = [&](auto set, auto value, int seed) {
-        using T = decltype(value);
-        return movesAsExpected<T, T>(
-            1, 1, seed, [&](Img<T>&, Img<T>& d, ImageSize r) { return set(value, d.roi(), d.step(), r); },
-            [&](const std::vector<T>&, std::vector<T>& d) { std::fill(d.begin(), d.end(), value); }, sizes);
-    };
-    EXPECT_TRUE(fill(z().zoriSet_8u_C1R, uint8_t(0xC3), 50));
-    EXPECT_TRUE(fill(z().zoriSet_16s_C1R, int16_t(-12345), 51));
-    EXPECT_TRUE(fill(z().zoriSet_32s_C1R, int32_t(-123456789), 52));
-    EXPECT_TRUE(fill(z().zoriSet_32f_C1R, -0.0f, 53));
-    const auto fill3 = [&](auto set, const auto* value, int seed) {
+    // value: one element, or a pointer to one per channel
+    const auto fill = [&](int c, auto set, auto value, int seed) {
         using T = std::remove_const_t<std::remove_pointer_t<decltype(value)>>;
         return movesAsExpected<T, T>(
-            1, 3, seed, [&](Img<T>&, Img<T>& d, ImageSize r) { return set(value, d.roi(), d.step(), r); },
+            1, c, seed, [&](Img<T>&, Img<T>& d, ImageSize r) { return set(value, d.roi(), d.step(), r); },
             [&](const std::vector<T>&, std::vector<T>& d) {
-                for (size_t i = 0; i < d.size(); ++i) d[i] = value[i % 3];
+                for (size_t i = 0; i < d.size(); ++i)
+                    if constexpr (std::is_pointer_v<decltype(value)>) d[i] = value[i % c]; else d[i] = value;
             }, sizes);
     };
+    EXPECT_TRUE(fill(1, z().zoriSet_8u_C1R, uint8_t(0xC3), 50));
+    EXPECT_TRUE(fill(1, z().zoriSet_16s_C1R, int16_t(-12345), 51));
+    EXPECT_TRUE(fill(1, z().zoriSet_32s_C1R, int32_t(-123456789), 52));
+    EXPECT_TRUE(fill(1, z().zoriSet_32f_C1R, -0.0f, 53));
+    float nan;  // a quiet NaN with a payload: written bit for bit
+    std::memcpy(&nan, "\x45\x23\xC1\x7F", 4);
+    EXPECT_TRUE(fill(1, z().zoriSet_32f_C1R, nan, 56));
     const uint8_t v8[3] = {1, 128, 255};
     const int16_t v16[3] = {-32768, 1, 32767};
-    EXPECT_TRUE(fill3(z().zoriSet_8u_C3R, v8, 54));
-    EXPECT_TRUE(fill3(z().zoriSet_16s_C3R, v16, 55));
-    const uint32_t bits = 0x7FC12345u;
-    float nan;
-    std::memcpy(&nan, &bits, 4);
-    uint32_t out[5] = {};
-    ASSERT_EQ(z().zoriSet_32f_C1R(nan, reinterpret_cast<float*>(out), 20, {5, 1}), StatusOk);
-    for (uint32_t w : out) EXPECT_EQ(w, bits);
+    EXPECT_TRUE(fill(3, z().zoriSet_8u_C3R, v8, 54));
+    EXPECT_TRUE(fill(3, z().zoriSet_16s_C3R, v16, 55));
 }
 
 // Fills above 16 MiB stream from each row's first 16-byte aligned byte on.
@@ -195,28 +181,24 @@ TEST_P(Copy, LargeFills) {
 TEST_P(Copy, SwapChannels) {
     const int orders[][3] = {{2, 1, 0}, {0, 1, 2}, {1, 2, 0}, {2, 0, 1}, {0, 0, 0}, {2, 2, 1}};
     for (const auto& o : orders) {
-        const auto swap = [&](auto fn, auto type, int c) {
+        const auto swap = [&](auto type, int c, auto call) {
             using T = decltype(type);
-            return movesAsExpected<T, T>(
-                c, c, o[0] * 9 + o[1] * 3 + o[2], [&](Img<T>& s, Img<T>& d, ImageSize r) { return fn(s.roi(), s.step(), d.roi(), d.step(), r, o); },
-                [&](const std::vector<T>& s, std::vector<T>& d) {
-                    for (size_t p = 0; p < s.size() / c; ++p)
-                        for (int k = 0; k < 3; ++k) d[p * c + k] = s[p * c + o[k]];
-                });
+            return movesAsExpected<T, T>(c, c, o[0] * 9 + o[1] * 3 + o[2], call, [&](const std::vector<T>& s, std::vector<T>& d) {
+                for (size_t p = 0; p < s.size() / c; ++p)
+                    for (int k = 0; k < 3; ++k) d[p * c + k] = s[p * c + o[k]];
+            });
         };
-        EXPECT_TRUE(swap(z().zoriSwapChannels_8u_C3R, uint8_t(), 3));
-        EXPECT_TRUE(swap(z().zoriSwapChannels_16u_C3R, uint16_t(), 3));
-        EXPECT_TRUE(swap(z().zoriSwapChannels_8u_AC4R, uint8_t(), 4));
-        EXPECT_TRUE(swap(z().zoriSwapChannels_16u_AC4R, uint16_t(), 4));
-        EXPECT_TRUE((movesAsExpected<uint8_t, uint8_t>(
-            3, 3, 64, [&](Img<uint8_t>& s, Img<uint8_t>& d, ImageSize r) {
-                for (int y = 0; y < r.height; ++y) std::memcpy(d.at(0, y), s.at(0, y), 3 * r.width);
-                return z().zoriSwapChannels_8u_C3IR(d.roi(), d.step(), r, o);
-            },
-            [&](const std::vector<uint8_t>& s, std::vector<uint8_t>& d) {
-                for (size_t p = 0; p < s.size(); p += 3)
-                    for (int k = 0; k < 3; ++k) d[p + k] = s[p + o[k]];
-            })));
+        const auto apart = [&](auto fn) {
+            return [fn, &o](auto& s, auto& d, ImageSize r) { return fn(s.roi(), s.step(), d.roi(), d.step(), r, o); };
+        };
+        EXPECT_TRUE(swap(uint8_t(), 3, apart(z().zoriSwapChannels_8u_C3R)));
+        EXPECT_TRUE(swap(uint16_t(), 3, apart(z().zoriSwapChannels_16u_C3R)));
+        EXPECT_TRUE(swap(uint8_t(), 4, apart(z().zoriSwapChannels_8u_AC4R)));
+        EXPECT_TRUE(swap(uint16_t(), 4, apart(z().zoriSwapChannels_16u_AC4R)));
+        EXPECT_TRUE(swap(uint8_t(), 3, [&](Img<uint8_t>& s, Img<uint8_t>& d, ImageSize r) {
+            for (int y = 0; y < r.height; ++y) std::memcpy(d.at(0, y), s.at(0, y), 3 * r.width);
+            return z().zoriSwapChannels_8u_C3IR(d.roi(), d.step(), r, o);
+        }));
     }
 }
 
@@ -254,10 +236,8 @@ TEST_P(Copy, Checks) {
     uint8_t s[64] = {}, d[64] = {};
     const std::vector<zt::Watch> w{zt::watch(d, sizeof d)};
     const uint8_t value[3] = {1, 2, 3};
-    uint8_t* planes[3] = {d, d + 16, d + 32};
-    uint8_t* oneNull[3] = {d, nullptr, d + 32};
-    const uint8_t* in[4] = {s, s + 16, s + 32, s + 48};
-    const uint8_t* inNull[4] = {s, s, s, nullptr};
+    uint8_t *planes[3] = {d, d + 16, d + 32}, *oneNull[3] = {d, nullptr, d + 32};
+    const uint8_t *in[4] = {s, s + 16, s + 32, s + 48}, *inNull[4] = {s, s, s, nullptr};
     const int order[3] = {2, 1, 0}, three[3] = {0, 3, 1}, minus[3] = {-1, 0, 1};
     zt::expectChecks(a.zoriCopy_8u_C1R, {s, 8, d, 8, ImageSize{8, 8}}, w, zt::eachNull(), zt::badRoi<4>(),
                      zt::bad(StatusNullPointer, zt::arg<0>(nullptr), zt::arg<4>(ImageSize{0, 1})));
