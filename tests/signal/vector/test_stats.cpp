@@ -91,6 +91,18 @@ TEST_P(VecStats, PinnedValues) {
     ASSERT_EQ(z.zorsMaxIndx_32f(x.data(), 37, r, at) + z.zorsMaxIndx_32f(x.data() + 3, 34, r + 1, at + 1) +
                   z.zorsMin_32f(x.data() + 6, 31, r + 2) + z.zorsMaxIndx_32f(x.data() + 6, 31, r + 3, nullptr), 0);
     EXPECT_TRUE(at[0] == 5 && bitsOf(r[0]) == 0x80000000u && at[1] == 0 && r[1] != r[1] && r[2] == -1 && !bitsOf(r[3]));
+
+    // Every type's extremes on one picture: the largest at 23 of 41, the smallest at 9.
+    std::vector<double> e(41, 1.0), dm(2);
+    e[23] = 7, e[9] = -5;
+    const std::vector<float> vf(e.begin(), e.end());
+    const std::vector<int16_t> vs(e.begin(), e.end());
+    int16_t sm[2];
+    ASSERT_EQ(z.zorsMax_64f(e.data(), 41, &dm[0]) + z.zorsMaxIndx_64f(e.data(), 41, &dm[1], at) +
+                  z.zorsMax_16s(vs.data(), 41, sm) + z.zorsMaxIndx_16s(vs.data(), 41, sm + 1, at + 1) +
+                  z.zorsMax_32f(vf.data(), 41, r) + z.zorsMin_32f(vf.data(), 41, r + 1), 0);
+    EXPECT_TRUE(dm == std::vector<double>({7, 7}) && sm[0] == 7 && sm[1] == 7 && at[0] == 23 && at[1] == 23 &&
+                r[0] == 7 && r[1] == -5);
 }
 
 // Random data against long double sums: within half a float ulp of the
