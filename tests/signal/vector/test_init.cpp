@@ -50,7 +50,8 @@ void expectEach(Status(ZOR_CALL* fn)(const S*, D*, int, P...), const std::vector
 auto narrowed(int rndMode, int sf) {
     return [=](double src, auto d) {
         using L = std::numeric_limits<decltype(d)>;
-        const double x = src * std::ldexp(1.0, sf < -5000 ? 5000 : -sf), c = std::fmax(-1e10, std::fmin(x, 1e10));
+        volatile double m = std::ldexp(1.0, sf < -5000 ? 5000 : -sf);  // a double: x87 would keep 2^5000
+        const double x = src * m, c = std::fmax(-1e10, std::fmin(x, 1e10));
         const double r = x != x ? L::min() : rndMode == RoundNear ? c - std::remainder(c, 1.0) : std::trunc(c);
         return r >= double(L::max()) ? L::max() : r <= double(L::min()) ? L::min() : decltype(d)(r);
     };
