@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "frame/attach.h"
@@ -44,16 +45,12 @@ struct FakeTable {
     static constexpr int kRowsN = 3;
     Entry slots[kRowsN] = {};
     Row rows[kRowsN] = {};
+    template <int R, int... C>
+    void fill(std::integer_sequence<int, C...>) { ((rows[R].slot = &slots[R], rows[R].entry[C] = dummy<R, C>), ...); }
     FakeTable() {
-        const Entry e[kRowsN][5] = {
-            {dummy<0, 0>, dummy<0, 1>, dummy<0, 2>, dummy<0, 3>, dummy<0, 4>},
-            {dummy<1, 0>, dummy<1, 1>, dummy<1, 2>, dummy<1, 3>, dummy<1, 4>},
-            {dummy<2, 0>, dummy<2, 1>, dummy<2, 2>, dummy<2, 3>, dummy<2, 4>},
-        };
-        for (int i = 0; i < kRowsN; ++i) {
-            rows[i].slot = &slots[i];
-            std::memcpy(rows[i].entry, e[i], sizeof e[i]);
-        }
+        fill<0>(std::make_integer_sequence<int, 5>());
+        fill<1>(std::make_integer_sequence<int, 5>());
+        fill<2>(std::make_integer_sequence<int, 5>());
     }
     Table table(int count = kRowsN) const { return Table{rows, count}; }
     // The column whose entries all slots hold, or -1.
@@ -113,9 +110,6 @@ int bind(const FakeTable& t, int code, int* bound, char (&msg)[256], int count =
 // Each variant tries its own column, then the ones below it, the generic
 // one last; a gap in a column moves every export to the next column.
 TEST(Waterfall, BindsTheFirstCompleteColumn) {
-    const int32_t preference[5][6] = {{0, 5}, {1, 0, 5}, {2, 1, 0, 5}, {3, 2, 1, 0, 5}, {4, 3, 2, 1, 0, 5}};
-    for (int v = 0; v < 5; ++v)
-        for (int i = 0; i < 6; ++i) EXPECT_EQ(kPreference[v][i], preference[v][i]) << v << "," << i;
     char msg[256];
     int bound = -1;
     for (int code : {1, 5, 6, 8, 33}) {
@@ -155,24 +149,19 @@ TEST(Waterfall, NoCandidateShowsTheMessage) {
     EXPECT_TRUE(gReports.size() == 1u && empty.boundColumn() == -1);
 }
 
-TEST(LibraryTable, EveryRowHasFiveEntries) {
+// Every row complete; every slot holds the selected variant's entry, or the
+// wide one where the load overlaid it.
+TEST(LibraryTable, CompleteAndBoundToTheSelectedVariant) {
     const Table t = libraryTable();
     ASSERT_EQ(t.count, kExportCount);
-    for (int i = 0; i < t.count; ++i) {
-        EXPECT_NE(t.rows[i].slot, nullptr);
-        for (int k = 0; k < 5; ++k) EXPECT_NE(t.rows[i].entry[k], nullptr) << "row " << i << " col " << k;
-    }
-}
-
-TEST(LibraryTable, BoundToTheSelectedVariant) {
     const int v = selectVariant(liveSelector());
     EXPECT_EQ(zor::frame::boundVariant, v);
-    const Table t = libraryTable();
-    // Wide entries, where the load overlaid them, replace the variant's.
     const int w = wideColumn(zor::frame::boundWidth);
     for (int i = 0; i < t.count; ++i) {
         const Row& r = t.rows[i];
+        for (int k = 0; k < 5; ++k) ASSERT_NE(r.entry[k], nullptr) << "row " << i << " col " << k;
         const bool wide = w >= 0 && r.entry[w] != r.entry[4];
+        ASSERT_NE(r.slot, nullptr);
         EXPECT_EQ(*r.slot, wide ? r.entry[w] : r.entry[v]) << "row " << i;
     }
     // The export answers with the bound variant's record.
@@ -228,12 +217,8 @@ TEST(WideColumns, WidthFromCpuidAndXcr0) {
 
 TEST(WideColumns, CapFromTheEnvironment) {
     EXPECT_EQ(widthCap(nullptr), 512);
-    EXPECT_EQ(widthCap("128"), 128);
-    EXPECT_EQ(widthCap("256"), 256);
-    EXPECT_EQ(widthCap("512"), 512);
-    EXPECT_EQ(widthCap("1024"), 512);
-    EXPECT_EQ(widthCap(" 128"), 512);
-    EXPECT_EQ(widthCap(""), 512);
+    for (const char* v : {"128", "256", "512", "1024", " 128", ""})
+        EXPECT_EQ(widthCap(v), std::strcmp(v, "128") == 0 ? 128 : std::strcmp(v, "256") == 0 ? 256 : 512) << v;
 }
 
 // The overlay replaces only the slots whose wide entry differs from the
