@@ -98,8 +98,5 @@ TEST(FeatureRecord, Fields) {
     EXPECT_EQ(features(f.maxExt(0x80000000u).r).has64Bit, 0u);
 }
 
-TEST(ProcessorType, LiveReaderAgreesWithTheRecords) {
-    const CpuidRecords r = readCpuid();
-    ASSERT_TRUE(r.available);
-    EXPECT_EQ(processorType(), processorType(r));
-}
+// The 32-bit probe (toggling the identification flag) finds cpuid.
+TEST(ProcessorType, LiveCpuidIsAvailable) { EXPECT_TRUE(readCpuid().available); }
