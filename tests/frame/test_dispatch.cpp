@@ -25,12 +25,8 @@ int fakeType() { return gCodes[gCalls++ % 2]; }
 Regs fakeLeaf1() { return gLeaf1; }
 
 int select(int first, int second, uint32_t edx = 0, uint32_t ecx = 0) {
-    gCodes[0] = first;
-    gCodes[1] = second;
-    gCalls = 0;
-    gLeaf1 = Regs{};
-    gLeaf1.edx = edx;
-    gLeaf1.ecx = ecx;
+    gCodes[0] = first, gCodes[1] = second, gCalls = 0;
+    gLeaf1 = Regs{0, 0, ecx, edx};
     return selectVariant(Selector{fakeType, fakeLeaf1});
 }
 
@@ -195,18 +191,15 @@ TEST(WideColumns, WidthFromCpuidAndXcr0) {
                           {kAvx, kAvx512 & ~(1u << 16), 0xE7, 256}, {kAvx, kAvx512 & ~(1u << 17), 0xE7, 256},
                           {kAvx, kAvx512 & ~(1u << 30), 0xE7, 256}, {kAvx, kAvx512 & ~(1u << 31), 0xE7, 256},
                           {0, 0, 0, 128}};
-    for (const Case& c : cases) {
-        Regs l1, l7;
-        l1.ecx = c.l1ecx;
-        l7.ebx = c.l7ebx;
-        EXPECT_EQ(zor::cpu::usableWidth(l1, l7, c.xcr0), c.width) << std::hex << c.l1ecx << " " << c.l7ebx << " " << c.xcr0;
-    }
+    for (const Case& c : cases)
+        EXPECT_EQ(zor::cpu::usableWidth(Regs{0, 0, c.l1ecx, 0}, Regs{0, c.l7ebx, 0, 0}, c.xcr0), c.width)
+            << std::hex << c.l1ecx << " " << c.l7ebx << " " << c.xcr0;
 }
 
 TEST(WideColumns, CapFromTheEnvironment) {
-    EXPECT_EQ(widthCap(nullptr), 512);
-    for (const char* v : {"128", "256", "512", "1024", " 128", ""})
-        EXPECT_EQ(widthCap(v), std::strcmp(v, "128") == 0 ? 128 : std::strcmp(v, "256") == 0 ? 256 : 512) << v;
+    const std::pair<const char*, int> cases[] = {{nullptr, 512}, {"128", 128},  {"256", 256}, {"512", 512},
+                                                 {"1024", 512},  {" 128", 512}, {"", 512}};
+    for (const auto& c : cases) EXPECT_EQ(widthCap(c.first), c.second) << (c.first ? c.first : "unset");
 }
 
 // The overlay replaces only the slots whose wide entry differs from the

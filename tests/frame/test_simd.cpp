@@ -146,7 +146,7 @@ void WideningAndNarrowingKeepTheirLaneOrder() {
         widens<int8_t>(rng), widens<uint8_t>(rng), widens<int16_t>(rng), widens<uint16_t>(rng);
         widens<int32_t>(rng), widens<float>(rng);
         narrows<int8_t, int16_t>(rng), narrows<uint8_t, int16_t>(rng), narrows<int16_t, int32_t>(rng);
-        narrows<uint16_t, int32_t>(rng), narrows<float, double>(rng);
+        narrows<uint16_t, int32_t>(rng), narrows<uint8_t, uint16_t>(rng), narrows<float, double>(rng);
     }
 }
 
