@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
-#include <cstdlib>
+#include <filesystem>
 #include <string>
 
 #include "frame/attach.h"
@@ -12,12 +12,6 @@ using zor::frame::altSuperSampling;
 using zor::frame::probeMarkerFile;
 
 namespace {
-#if defined(_WIN32)
-const char* const kTemp[2] = {"TEMP", "."};  // the variable, and the directory without it
-#else
-const char* const kTemp[2] = {"TMPDIR", "/tmp"};
-#endif
-
 struct FlagRestore {
     int32_t saved = altSuperSampling;
     ~FlagRestore() { altSuperSampling = saved; }
@@ -28,8 +22,7 @@ struct FlagRestore {
 // contents are never read); only the text after the last '.' is replaced.
 TEST(MarkerFile, ExistenceSetsTheFlag) {
     FlagRestore restore;
-    const char* tmp = std::getenv(kTemp[0]);
-    const std::string probe = std::string(tmp ? tmp : kTemp[1]) + "/zor_marker_probe.";
+    const std::string probe = (std::filesystem::temp_directory_path() / "zor_marker_probe.").string();
     std::remove((probe + "xml").c_str());
     altSuperSampling = 1;
     EXPECT_EQ(probeMarkerFile((probe + "dll").c_str()), 0u);
