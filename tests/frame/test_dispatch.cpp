@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "frame/attach.h"
@@ -24,12 +25,8 @@ int fakeType() { return gCodes[gCalls++ % 2]; }
 Regs fakeLeaf1() { return gLeaf1; }
 
 int select(int first, int second, uint32_t edx = 0, uint32_t ecx = 0) {
-    gCodes[0] = first;
-    gCodes[1] = second;
-    gCalls = 0;
-    gLeaf1 = Regs{};
-    gLeaf1.edx = edx;
-    gLeaf1.ecx = ecx;
+    gCodes[0] = first, gCodes[1] = second, gCalls = 0;
+    gLeaf1 = Regs{0, 0, ecx, edx};
     return selectVariant(Selector{fakeType, fakeLeaf1});
 }
 
@@ -44,16 +41,12 @@ struct FakeTable {
     static constexpr int kRowsN = 3;
     Entry slots[kRowsN] = {};
     Row rows[kRowsN] = {};
+    template <int R, int... C>
+    void fill(std::integer_sequence<int, C...>) { ((rows[R].slot = &slots[R], rows[R].entry[C] = dummy<R, C>), ...); }
     FakeTable() {
-        const Entry e[kRowsN][5] = {
-            {dummy<0, 0>, dummy<0, 1>, dummy<0, 2>, dummy<0, 3>, dummy<0, 4>},
-            {dummy<1, 0>, dummy<1, 1>, dummy<1, 2>, dummy<1, 3>, dummy<1, 4>},
-            {dummy<2, 0>, dummy<2, 1>, dummy<2, 2>, dummy<2, 3>, dummy<2, 4>},
-        };
-        for (int i = 0; i < kRowsN; ++i) {
-            rows[i].slot = &slots[i];
-            std::memcpy(rows[i].entry, e[i], sizeof e[i]);
-        }
+        fill<0>(std::make_integer_sequence<int, 5>());
+        fill<1>(std::make_integer_sequence<int, 5>());
+        fill<2>(std::make_integer_sequence<int, 5>());
     }
     Table table(int count = kRowsN) const { return Table{rows, count}; }
     // The column whose entries all slots hold, or -1.
@@ -88,14 +81,10 @@ TEST(SelectVariant, CodeTableThenCpuidFlags) {
     EXPECT_EQ(select(33, 1), 0);
     EXPECT_EQ(gCalls, 2);
     for (int code : {0, 11, 12, 15, 18, 31, 34, 63, 67, 68, -1}) {
-        SCOPED_TRACE(code);
-        EXPECT_EQ(variantForCode(code), -1);
-        EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, kSse3 | kSsse3), 4);
-        EXPECT_EQ(select(code, code, kX87 | kSse | kSse2, kSse3), 3);
-        EXPECT_EQ(select(code, code, kX87, 0), 3);
-        EXPECT_EQ(select(code, code, kSse | kSse2, kSse3), 2);
-        EXPECT_EQ(select(code, code, kSse, 0), 1);
-        EXPECT_EQ(select(code, code, 0, 0), 0);
+        EXPECT_EQ(variantForCode(code), -1) << code;
+        const uint32_t flags[][3] = {{kX87 | kSse | kSse2, kSse3 | kSsse3, 4}, {kX87 | kSse | kSse2, kSse3, 3},
+                                     {kX87, 0, 3}, {kSse | kSse2, kSse3, 2}, {kSse, 0, 1}, {0, 0, 0}};
+        for (const auto& f : flags) EXPECT_EQ(select(code, code, f[0], f[1]), int(f[2])) << code << " " << f[0];
     }
 }
 
@@ -113,9 +102,6 @@ int bind(const FakeTable& t, int code, int* bound, char (&msg)[256], int count =
 // Each variant tries its own column, then the ones below it, the generic
 // one last; a gap in a column moves every export to the next column.
 TEST(Waterfall, BindsTheFirstCompleteColumn) {
-    const int32_t preference[5][6] = {{0, 5}, {1, 0, 5}, {2, 1, 0, 5}, {3, 2, 1, 0, 5}, {4, 3, 2, 1, 0, 5}};
-    for (int v = 0; v < 5; ++v)
-        for (int i = 0; i < 6; ++i) EXPECT_EQ(kPreference[v][i], preference[v][i]) << v << "," << i;
     char msg[256];
     int bound = -1;
     for (int code : {1, 5, 6, 8, 33}) {
@@ -155,31 +141,24 @@ TEST(Waterfall, NoCandidateShowsTheMessage) {
     EXPECT_TRUE(gReports.size() == 1u && empty.boundColumn() == -1);
 }
 
-TEST(LibraryTable, EveryRowHasFiveEntries) {
+// Every row complete; every slot holds the selected variant's entry, or the
+// wide one where the load overlaid it.
+TEST(LibraryTable, CompleteAndBoundToTheSelectedVariant) {
     const Table t = libraryTable();
     ASSERT_EQ(t.count, kExportCount);
-    for (int i = 0; i < t.count; ++i) {
-        EXPECT_NE(t.rows[i].slot, nullptr);
-        for (int k = 0; k < 5; ++k) EXPECT_NE(t.rows[i].entry[k], nullptr) << "row " << i << " col " << k;
-    }
-}
-
-TEST(LibraryTable, BoundToTheSelectedVariant) {
     const int v = selectVariant(liveSelector());
     EXPECT_EQ(zor::frame::boundVariant, v);
-    const Table t = libraryTable();
-    // Wide entries, where the load overlaid them, replace the variant's.
     const int w = wideColumn(zor::frame::boundWidth);
     for (int i = 0; i < t.count; ++i) {
         const Row& r = t.rows[i];
+        for (int k = 0; k < 5; ++k) ASSERT_NE(r.entry[k], nullptr) << "row " << i << " col " << k;
         const bool wide = w >= 0 && r.entry[w] != r.entry[4];
+        ASSERT_NE(r.slot, nullptr);
         EXPECT_EQ(*r.slot, wide ? r.entry[w] : r.entry[v]) << "row " << i;
     }
-    // The export answers with the bound variant's record.
+    // The exports answer with the bound variant's records, of a variant the processor runs.
     static const char* const tags[5] = {"g0", "s1", "s2", "s3", "s4"};
-    EXPECT_STREQ(zorsGetLibVersion()->cpuTag, tags[v]);
-    EXPECT_STREQ(zoriGetLibVersion()->cpuTag, tags[v]);
-    // and the bound variant is one the processor can run.
+    EXPECT_TRUE(!std::strcmp(zorsGetLibVersion()->cpuTag, tags[v]) && !std::strcmp(zoriGetLibVersion()->cpuTag, tags[v]));
     EXPECT_TRUE(zt::variantSupported(v));
 }
 
@@ -201,39 +180,26 @@ TEST(LoadFailureDeathTest, ReportsAndAborts) {
 
 // ---- the wide columns -----------------------------------------------------------
 
+// 256 bits need OSXSAVE, AVX, FMA, AVX2 and the YMM state saved; 512 bits
+// also AVX-512 F, DQ, BW and VL and the ZMM state saved.
 TEST(WideColumns, WidthFromCpuidAndXcr0) {
-    using zor::cpu::usableWidth;
-    Regs l1, l7;
-    l1.ecx = (1u << 27) | (1u << 28) | (1u << 12);  // OSXSAVE, AVX, FMA
-    l7.ebx = 1u << 5;                                 // AVX2
-    EXPECT_EQ(usableWidth(l1, l7, 0x7), 256);
-    EXPECT_EQ(usableWidth(l1, l7, 0x3), 128);  // the system does not save the upper halves
-    Regs noFma = l1;
-    noFma.ecx &= ~(1u << 12);
-    EXPECT_EQ(usableWidth(noFma, l7, 0x7), 128);
-    Regs noOsxsave = l1;
-    noOsxsave.ecx &= ~(1u << 27);
-    EXPECT_EQ(usableWidth(noOsxsave, l7, 0xE7), 128);
-    Regs l7x = l7;
-    l7x.ebx |= (1u << 16) | (1u << 17) | (1u << 30) | (1u << 31);  // F, DQ, BW, VL
-    EXPECT_EQ(usableWidth(l1, l7x, 0xE7), 512);
-    EXPECT_EQ(usableWidth(l1, l7x, 0x27), 256);  // no ZMM state saved
-    for (int missing : {16, 17, 30, 31}) {
-        Regs partial = l7x;
-        partial.ebx &= ~(1u << missing);
-        EXPECT_EQ(usableWidth(l1, partial, 0xE7), 256) << missing;
-    }
-    EXPECT_EQ(usableWidth(Regs{}, Regs{}, 0), 128);
+    constexpr uint32_t kAvx = (1u << 27) | (1u << 28) | (1u << 12), kAvx2 = 1u << 5;  // leaf 1 ecx, leaf 7 ebx
+    constexpr uint32_t kAvx512 = kAvx2 | (1u << 16) | (1u << 17) | (1u << 30) | (1u << 31);
+    struct Case { uint32_t l1ecx, l7ebx; uint64_t xcr0; int width; };
+    const Case cases[] = {{kAvx, kAvx2, 0x7, 256}, {kAvx, kAvx2, 0x3, 128}, {kAvx & ~(1u << 12), kAvx2, 0x7, 128},
+                          {kAvx & ~(1u << 27), kAvx2, 0xE7, 128}, {kAvx, kAvx512, 0xE7, 512}, {kAvx, kAvx512, 0x27, 256},
+                          {kAvx, kAvx512 & ~(1u << 16), 0xE7, 256}, {kAvx, kAvx512 & ~(1u << 17), 0xE7, 256},
+                          {kAvx, kAvx512 & ~(1u << 30), 0xE7, 256}, {kAvx, kAvx512 & ~(1u << 31), 0xE7, 256},
+                          {0, 0, 0, 128}};
+    for (const Case& c : cases)
+        EXPECT_EQ(zor::cpu::usableWidth(Regs{0, 0, c.l1ecx, 0}, Regs{0, c.l7ebx, 0, 0}, c.xcr0), c.width)
+            << std::hex << c.l1ecx << " " << c.l7ebx << " " << c.xcr0;
 }
 
 TEST(WideColumns, CapFromTheEnvironment) {
-    EXPECT_EQ(widthCap(nullptr), 512);
-    EXPECT_EQ(widthCap("128"), 128);
-    EXPECT_EQ(widthCap("256"), 256);
-    EXPECT_EQ(widthCap("512"), 512);
-    EXPECT_EQ(widthCap("1024"), 512);
-    EXPECT_EQ(widthCap(" 128"), 512);
-    EXPECT_EQ(widthCap(""), 512);
+    const std::pair<const char*, int> cases[] = {{nullptr, 512}, {"128", 128},  {"256", 256}, {"512", 512},
+                                                 {"1024", 512},  {" 128", 512}, {"", 512}};
+    for (const auto& c : cases) EXPECT_EQ(widthCap(c.first), c.second) << (c.first ? c.first : "unset");
 }
 
 // The overlay replaces only the slots whose wide entry differs from the

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
+#include <filesystem>
 #include <string>
 
 #include "frame/attach.h"
@@ -11,51 +12,37 @@ using zor::frame::altSuperSampling;
 using zor::frame::probeMarkerFile;
 
 namespace {
-std::string tempDir() {
-#if defined(_WIN32)
-    const char* t = std::getenv("TEMP");
-    return t ? t : ".";
-#else
-    const char* t = std::getenv("TMPDIR");
-    return t ? t : "/tmp";
-#endif
-}
-
 struct FlagRestore {
     int32_t saved = altSuperSampling;
     ~FlagRestore() { altSuperSampling = saved; }
 };
 }  // namespace
 
+// The flag is cleared first and set only when the marker exists (empty: its
+// contents are never read); only the text after the last '.' is replaced.
 TEST(MarkerFile, ExistenceSetsTheFlag) {
     FlagRestore restore;
-    const std::string dir = tempDir() + "/";
-    const std::string marker = dir + "zor_marker_probe.xml";
-    std::remove(marker.c_str());
-
-    EXPECT_EQ(probeMarkerFile((dir + "zor_marker_probe.dll").c_str()), 0u);
+    const std::string probe = (std::filesystem::temp_directory_path() / "zor_marker_probe.").string();
+    std::remove((probe + "xml").c_str());
+    altSuperSampling = 1;
+    EXPECT_EQ(probeMarkerFile((probe + "dll").c_str()), 0u);
     EXPECT_EQ(altSuperSampling, 0);
-
-    std::FILE* f = std::fopen(marker.c_str(), "w");
+    std::FILE* f = std::fopen((probe + "xml").c_str(), "w");
     ASSERT_NE(f, nullptr);
-    std::fclose(f);  // empty: the contents are never read
-    EXPECT_EQ(probeMarkerFile((dir + "zor_marker_probe.dll").c_str()), 0u);
-    EXPECT_EQ(altSuperSampling, 1);
-    // Only the text after the last '.' is replaced.
-    EXPECT_EQ(probeMarkerFile((dir + "zor_marker_probe.so").c_str()), 0u);
-    EXPECT_EQ(altSuperSampling, 1);
-    EXPECT_EQ(probeMarkerFile((dir + "zor_marker_probe.so.5").c_str()), 0u);
-    EXPECT_EQ(altSuperSampling, 0);
-    std::remove(marker.c_str());
+    std::fclose(f);
+    for (const char* ext : {"dll", "so", "so.5"}) {
+        EXPECT_EQ(probeMarkerFile((probe + ext).c_str()), 0u);
+        EXPECT_EQ(altSuperSampling, ext[2] != '.') << ext;  // "so.5" looks for "so.xml"
+    }
+    std::remove((probe + "xml").c_str());
 }
 
+// No '.' after the first character: a failure, and the flag cleared.
 TEST(MarkerFile, PathWithoutAUsableDot) {
     FlagRestore restore;
-    altSuperSampling = 1;
-    EXPECT_EQ(probeMarkerFile("nodot"), 0x80004005u);
-    EXPECT_EQ(altSuperSampling, 0);
-    altSuperSampling = 1;
-    EXPECT_EQ(probeMarkerFile(".xml"), 0x80004005u);  // a '.' at index 0 does not count
-    EXPECT_EQ(altSuperSampling, 0);
-    EXPECT_EQ(probeMarkerFile(nullptr), 0x80004005u);
+    for (const char* path : {"nodot", ".xml", static_cast<const char*>(nullptr)}) {
+        altSuperSampling = 1;
+        EXPECT_EQ(probeMarkerFile(path), 0x80004005u);
+        EXPECT_EQ(altSuperSampling, 0);
+    }
 }
