@@ -70,12 +70,12 @@ TEST_P(MelFBank, ConstructionAndEvaluationFollowTheDefinition) {
         const int n = 1 << order;
         EXPECT_TRUE(h.fftLen == n && n >= c.winLen && n / 2 < c.winLen && h.nFilter == c.nf && h.initialised == 1);
         const std::vector<float> v = zt::randomFloats(n / 2 + 1, c.nf, 10.0f);
-        zt::GuardedBuffer spec(v.size() * sizeof(float));
-        std::memcpy(spec.data(), v.data(), spec.size());
+        zt::GuardedBuffer spectrum(v.size() * sizeof(float));
+        std::memcpy(spectrum.data(), v.data(), spectrum.size());
         std::vector<int> bins;
         const std::vector<float> want = filtered(n, c.fs, c.lo, c.hi, c.nf, c.mode == 1, v.data(), bins);
         std::vector<float> out(c.nf);
-        ASSERT_EQ(z().zorsEvalFBank_32f(spec.as<float>(), out.data(), bank), StatusOk);
+        ASSERT_EQ(z().zorsEvalFBank_32f(spectrum.as<float>(), out.data(), bank), StatusOk);
         EXPECT_EQ(std::vector<int>(h.bins, h.bins + c.nf + 2), bins) << "mode " << c.mode;
         EXPECT_EQ(out, want) << "mode " << c.mode;
         EXPECT_EQ(z().zorsFBankFree_32f(bank), StatusOk);
